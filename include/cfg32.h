@@ -1,0 +1,355 @@
+/**
+ * @file cfg32.h
+ * Reading and changing the configuration file of an LDAP directory server.
+ *
+ * The configuration is one LDIF text file: a tree of entries under "cn=Configuration". The calls
+ * mirror the synchronous LDAP client interface (RFC 1823): make a handle, bind as the administrator
+ * whose DN and password stand in the file itself, search, walk the results.
+ *
+ * Conventions
+ *
+ *  1. Handles. cfg_init() makes one, options name the file, cfg_bind_s() loads the file and
+ *     authenticates, cfg_unbind() releases everything. A handle is "created" until a bind succeeds
+ *     and "bound" from then on; a bound handle is bound once. The calls that need a bound handle
+ *     return CFG_PARAM_ERROR (89) for a null handle and for one that is not bound.
+ *  2. Results. A call that returns int returns 0 for success and else an LDAP result code (RFC
+ *     4511, 4.1.9, and the codes from 81 up that LDAP client interfaces added); cfg_err2string()
+ *     gives its text. A call that returns a pointer returns null for failure. The code stays in
+ *     the handle (cfg_get_errno()) until the next call that resets it.
+ *  3. Reset. Every call that takes a handle first clears the handle's error and frees the texts it
+ *     had handed out, except the option calls and the ones that report the last failure:
+ *     cfg_get_option(), cfg_set_option(), cfg_get_errno(), cfg_get_exterror(), cfg_perror() and
+ *     cfg_dump_exception(). So ask about a failure before anything else.
+ *  4. Memory. Each description says who owns what is returned: results go to cfg_msgfree(), value
+ *     arrays to cfg_value_free(), strings to cfg_memfree(), cursors to cfg_ber_free(). A result
+ *     outlives the handle that it came from. Text returned as const char * is not the caller's.
+ *  5. Passwords that a search decoded are wiped when their result is freed. Copies made by
+ *     cfg_get_values() are the caller's to wipe.
+ *  6. Threads. A handle, its results and their cursors belong to one thread at a time. Handles
+ *     are independent of each other, save for the two process-wide options CFG_OPT_SHOW_SOURCE and
+ *     CFG_OPT_SHOW_STACK.
+ *  7. Locale. cfg_init() calls setlocale(LC_ALL, "") under the server's locale lock: the text of
+ *     the file is read in the character set of the environment.
+ *  8. No C++ exception leaves a call.
+ */
+#ifndef CFG32_H
+#define CFG32_H
+
+#ifdef __cplusplus
+extern "C" {
+#endif
+
+#if defined(__GNUC__)
+#define CFG32_API __attribute__((visibility("default")))
+#else
+#define CFG32_API
+#endif
+
+/** A session with one configuration file. */
+typedef struct CfgHandle CfgHandle;
+
+/** A node of a search result: an entry, one of its attributes, or one of their values. */
+typedef struct CfgMessage CfgMessage;
+
+/** The place that cfg_next_attribute() has reached in an entry. */
+typedef struct CfgCursor CfgCursor;
+
+/** Key material for encoded passwords; made by the server's password routines. */
+struct aes_key_data;
+
+/** The result codes that the library itself sets; others come with the failure reported. */
+enum {
+    CFG_SUCCESS = 0,
+    CFG_NO_SUCH_ATTRIBUTE = 16,
+    CFG_INVALID_CREDENTIALS = 49,
+    CFG_OTHER = 80,
+    CFG_DECODING_ERROR = 84,
+    CFG_AUTH_UNKNOWN = 86,
+    CFG_PARAM_ERROR = 89,
+    CFG_NO_MEMORY = 90
+};
+
+/** @name Options
+ * The argument of cfg_get_option() and the value of cfg_set_option() for each.
+ * @{ */
+/** Boolean, at first on. Kept for the caller; the library does not look at it. */
+#define CFG_OPT_FLAG_A 1000
+/** Boolean, at first off. Kept for the caller; the library does not look at it. */
+#define CFG_OPT_FLAG_B 1001
+/** Boolean, process-wide, off after every cfg_init(): one-line reports begin with the position in
+ * the library's source. */
+#define CFG_OPT_SHOW_SOURCE 1002
+/** Boolean, process-wide, on after every cfg_init(): reports show the causes of a failure. */
+#define CFG_OPT_SHOW_STACK 1003
+/** Boolean, at first off: an entry may be deleted together with its subtree. */
+#define CFG_OPT_DELETE_NON_LEAVES 1004
+/** Text, at first null: the configuration file that the next cfg_bind_s() loads. */
+#define CFG_OPT_CONFIG_FILE 1005
+/** Text, at first null: where the next cfg_bind_s() has the file copied before each change. Null
+ * or empty makes no backup. */
+#define CFG_OPT_BACKUP_FILE 1006
+/** struct aes_key_data *, at first null: key for encoded passwords, used from the next
+ * cfg_bind_s() on. It stays the caller's and must outlive the handle. */
+#define CFG_OPT_KEY_DATA 1007
+
+/** Values for the boolean options of cfg_set_option(); every pointer but null means on. */
+#define CFG_OPT_ON ((const void *)1)
+#define CFG_OPT_OFF ((const void *)0)
+/** @} */
+
+/** The bind method: simple authentication (RFC 4511, 4.2). No other is accepted. */
+#define CFG_AUTH_SIMPLE 0x80
+
+/** @name Search scopes (RFC 4511, 4.5.1.2)
+ * @{ */
+#define CFG_SCOPE_BASE 0     /**< the base entry itself */
+#define CFG_SCOPE_ONELEVEL 1 /**< the entries directly below the base */
+#define CFG_SCOPE_SUBTREE 2  /**< the base and everything below it */
+/** @} */
+
+/* ---------------------------------------------------------------------------------------------
+ * The handle
+ * ------------------------------------------------------------------------------------------- */
+
+/**
+ * Makes a handle with every option at its first value. Opens no file.
+ *
+ * Sets the process's locale from the environment, under the server's locale lock.
+ *
+ * @return the handle, for cfg_unbind(); null when memory is exhausted.
+ */
+CFG32_API CfgHandle *cfg_init(void);
+
+/**
+ * Loads the configuration file and authenticates the caller as its administrator.
+ *
+ * The file is the one of CFG_OPT_CONFIG_FILE or, without one, "/etc/oruslapd.conf" below the
+ * server's installation directory. The administrator's DN and password are the first values of
+ * oru-slapdAdminDN and oru-slapdAdminPW in the entry "cn=Configuration".
+ *
+ * Lines that can't be used (without a ":", or with a value that their attribute does not allow) do
+ * not stop the load: each becomes an attribute oru-slapdInvalidLine of its entry and the file is
+ * rewritten at once, after a backup if CFG_OPT_BACKUP_FILE names one.
+ *
+ * @param handle    a created handle
+ * @param dn        the administrator's DN, or null with a null password for an anonymous bind
+ * @param password  in clear text
+ * @param method    CFG_AUTH_SIMPLE
+ * @return 0;
+ *         34 (Invalid DN syntax) for an entry whose DN can't be parsed;
+ *         49 (Invalid credentials), without a failure report;
+ *         50 (Insufficient access) when a file with unusable lines can't be rewritten;
+ *         65 (Object class violation) for an attribute outside of an entry, save one "version" and
+ *         one "charset" line that can be used;
+ *         80 for a failure of the system (exhausted memory included) or of the library, or when no
+ *         file name is known;
+ *         84 (Decoding error) for a stored password that can't be decoded with the key given;
+ *         86 for another method;
+ *         89 for a null handle;
+ *         90 when memory is exhausted before the file is read;
+ *         91 (Connection error) when the file is missing or can't be opened;
+ *         162 (Unusable input character) for text that is not of the locale's character set.
+ *         After a failure the handle is still created and may be bound again.
+ */
+CFG32_API int cfg_bind_s(CfgHandle *handle, const char *dn, const char *password, int method);
+
+/**
+ * Releases a handle, bound or not, with all it owns. Writes nothing: the file on disk is current
+ * after every call. Results of searches stay valid.
+ *
+ * @return 0; 89 for a null handle. The handle is gone in every case.
+ */
+CFG32_API int cfg_unbind(CfgHandle *handle);
+
+/**
+ * Clears the handle's error and frees its failure report, as the other calls do when they begin.
+ *
+ * @return 0; 89 for a null handle.
+ */
+CFG32_API int cfg_reset(CfgHandle *handle);
+
+/**
+ * Reads an option. Does not reset the handle.
+ *
+ * @param option  CFG_OPT_...; another number returns 0 and writes nothing
+ * @param out     int * for a boolean option (set to 1 or 0); char ** for a text, set to a copy for
+ *                cfg_memfree(), or to null when there is none; struct aes_key_data ** for
+ *                CFG_OPT_KEY_DATA, not a copy
+ * @return 0; 89 for a null handle or a null out.
+ */
+CFG32_API int cfg_get_option(CfgHandle *handle, int option, void *out);
+
+/**
+ * Sets an option. Does not reset the handle and records no failure in it.
+ *
+ * @code
+ * cfg_set_option(handle, CFG_OPT_CONFIG_FILE, "/opt/server/etc/oruslapd.conf");
+ * cfg_set_option(handle, CFG_OPT_DELETE_NON_LEAVES, CFG_OPT_ON);
+ * @endcode
+ *
+ * @param option  CFG_OPT_...; another number returns 0 and changes nothing
+ * @param value   CFG_OPT_ON or CFG_OPT_OFF; a text, which is copied (1 to 4096 bytes; null unsets
+ *                it); or the key, which is not copied
+ * @return 0; 21 (Invalid syntax) for a file name that is empty or too long; 89 for a null handle;
+ *         90 when memory is exhausted. After a failure the option is unchanged.
+ */
+CFG32_API int cfg_set_option(CfgHandle *handle, int option, const void *value);
+
+/* ---------------------------------------------------------------------------------------------
+ * Searching
+ * ------------------------------------------------------------------------------------------- */
+
+/**
+ * Searches the configuration. A file that was changed on disk is read again first.
+ *
+ * @param handle      a bound handle
+ * @param base        DN of the entry to start at (RFC 4514; ";" also separates RDNs, "oid." may
+ *                    precede a numeric type, values may be quoted)
+ * @param scope       CFG_SCOPE_...; any other number searches the base entry only
+ * @param filter      one term: "(attribute=value)" or "(attribute=*)", the parentheses optional;
+ *                    exact match by the attribute's syntax, backslash and two hexadecimal digits
+ *                    for a byte (RFC 4515). An empty text, and null, match every entry that has an
+ *                    objectclass
+ * @param attrs       names of the wanted attributes, ended by null; null means all. Passwords in
+ *                    oru-slapdSslKeyDatabasePW, oru-slapdMasterPW and oru-slapdProxyPw come in
+ *                    clear when they are asked for by name, on an anonymous bind too, and as stored
+ *                    otherwise
+ * @param attrsonly   accepted as in LDAP; the result carries the values either way
+ * @param result      set to the first entry found, for cfg_msgfree(), or to null when there is none
+ * @return 0, also when nothing was found;
+ *         21 for a filter value that the attribute's syntax does not allow;
+ *         32 (No such object) when there is no base entry;
+ *         34 for a malformed DN;
+ *         84 for a password that can't be decoded;
+ *         89 for a handle that is null or not bound, or a null base or result;
+ *         90 when memory is exhausted;
+ *         or what cfg_bind_s() returns when the file has to be read again.
+ */
+CFG32_API int cfg_search_s(CfgHandle *handle, const char *base, int scope, const char *filter,
+                           char **attrs, int attrsonly, CfgMessage **result);
+
+/** Returns the first entry of a result, which is the result itself. */
+CFG32_API CfgMessage *cfg_first_entry(CfgHandle *handle, CfgMessage *result);
+
+/** Returns the entry after this one; null at the end and for a null entry. */
+CFG32_API CfgMessage *cfg_next_entry(CfgHandle *handle, CfgMessage *entry);
+
+/**
+ * Counts the entries from this one to the end of its result.
+ *
+ * @return the number, 0 for null; 89 for a null handle.
+ */
+CFG32_API int cfg_count_entries(CfgHandle *handle, CfgMessage *entry);
+
+/**
+ * Counts the attributes of an entry.
+ *
+ * @return the number, 0 for null; 89 for a null handle.
+ */
+CFG32_API int cfg_count_attributes(CfgHandle *handle, CfgMessage *entry);
+
+/**
+ * Begins a walk over an entry's attributes.
+ *
+ * @code
+ * CfgCursor *cursor;
+ * for (char *name = cfg_first_attribute(handle, entry, &cursor); name;
+ *      name = cfg_next_attribute(handle, entry, cursor)) {
+ *     ...
+ *     cfg_memfree(name);
+ * }
+ * cfg_ber_free(cursor);
+ * @endcode
+ *
+ * @param cursor  set to a new cursor for cfg_ber_free(), also when the entry has no attributes; to
+ *                null after an error
+ * @return the first attribute's name, for cfg_memfree(); null for an entry without attributes
+ *         (error 0), for a null entry or cursor (89), or when memory is exhausted (90).
+ */
+CFG32_API char *cfg_first_attribute(CfgHandle *handle, CfgMessage *entry, CfgCursor **cursor);
+
+/**
+ * Returns the name of the next attribute, for cfg_memfree().
+ *
+ * @param entry   not looked at: the cursor knows its entry
+ * @param cursor  from cfg_first_attribute()
+ * @return null after the last attribute (error 0), for a null cursor (89), or when memory is
+ *         exhausted (90).
+ */
+CFG32_API char *cfg_next_attribute(CfgHandle *handle, CfgMessage *entry, CfgCursor *cursor);
+
+/**
+ * Returns copies of an attribute's values.
+ *
+ * @param attribute  its name, in any case
+ * @return an array ended by null, for cfg_value_free(); null when the attribute has no values
+ *         (error 0) or is not there (16), for a null entry or name (89), or when memory is
+ *         exhausted (90).
+ *         Pass a handle: without one the values can't be counted, and an attribute with fewer than
+ *         89 of them gives null.
+ */
+CFG32_API char **cfg_get_values(CfgHandle *handle, CfgMessage *entry, const char *attribute);
+
+/** Returns the number of strings in an array that ends with null; 0 for null. */
+CFG32_API int cfg_count_values(char **values);
+
+/** Frees an array of cfg_get_values() and its strings. Null is ignored. */
+CFG32_API void cfg_value_free(char **values);
+
+/**
+ * Returns an entry's DN in its canonical form, for cfg_memfree().
+ *
+ * @return null for a node that is not an entry (89), or when memory is exhausted (90).
+ */
+CFG32_API char *cfg_get_dn(CfgHandle *handle, CfgMessage *entry);
+
+/** Frees a result from its first entry on; decoded passwords are wiped. Null is ignored.
+ * @return 0. */
+CFG32_API int cfg_msgfree(CfgMessage *result);
+
+/** Frees a cursor. Null is ignored. */
+CFG32_API void cfg_ber_free(CfgCursor *cursor);
+
+/** Frees a string that a call returned as char *. Null is ignored. */
+CFG32_API void cfg_memfree(void *text);
+
+/* ---------------------------------------------------------------------------------------------
+ * Failures
+ * ------------------------------------------------------------------------------------------- */
+
+/**
+ * Returns the text of a result code (up to 999) or of an extended code (1000 and up).
+ *
+ * @return static text, "Unknown error" for a code without one; never null.
+ */
+CFG32_API const char *cfg_err2string(int code);
+
+/** Returns the result code of the handle's last call; 89 for a null handle. */
+CFG32_API int cfg_get_errno(CfgHandle *handle);
+
+/**
+ * Returns the extended code of the last failure: the library's own finer code (1000 and up) or,
+ * where there is none, the result code.
+ *
+ * @return 0 after a success; 89 for a null handle.
+ */
+CFG32_API int cfg_get_exterror(CfgHandle *handle);
+
+/** Does nothing; it is there for programs that were written against the LDAP interface. */
+CFG32_API void cfg_perror(CfgHandle *handle, const char *prefix);
+
+/**
+ * Returns a report of the last failure: the codes with their texts, the file and line, the entry,
+ * attribute and value, what the attribute allows, and the causes.
+ *
+ * @return several lines, owned by the handle until the next call that resets it; null when the
+ *         last call succeeded, failed without a report (a wrong password, a null argument), or the
+ *         handle is null.
+ */
+CFG32_API const char *cfg_dump_exception(CfgHandle *handle);
+
+#ifdef __cplusplus
+}
+#endif
+
+#endif

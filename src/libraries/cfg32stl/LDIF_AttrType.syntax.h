@@ -1,0 +1,45 @@
+#pragma once
+
+// What the code of the syntaxes shares.
+
+#include <cstddef>
+#include <string>
+
+#include "failure.h"
+
+class LDIF_Value;
+struct _AttrType;
+
+namespace cfg32 {
+
+#define SYNTAX(family, ...) size_t family##Hash(const LDIF_Value& value);
+#include "syntaxes.def"
+#undef SYNTAX
+
+/// Throws a failure that carries the offending text and the value's attribute type.
+[[noreturn]] void refuse(const failure& kind, const LDIF_Value& value, const std::string& text,
+                         const throw_site& site = {});
+
+/// The same with a message that was put together; kind's text is not used.
+[[noreturn]] void refuse_with_message(const failure& kind, const char* message,
+                                      const LDIF_Value& value, const std::string& text,
+                                      const throw_site& site = {});
+
+/// Lengths that a text may have; an upper bound of 0 is none.
+struct length_bounds {
+    long lower;
+    long upper;
+
+    bool allow(size_t length) const {
+        return static_cast<long>(length) >= lower &&
+               (upper == 0 || static_cast<long>(length) <= upper);
+    }
+};
+
+}  // namespace cfg32
+
+/// Throws "Binary representation undefined for syntax: " (92/1008), or "String ..." (92/1009).
+[[noreturn]] void BinarySyntaxNotImplemented(const cfg32::throw_site& site, const char* family,
+                                             const _AttrType* type, const std::string& value);
+[[noreturn]] void StringSyntaxNotImplemented(const cfg32::throw_site& site, const char* family,
+                                             const _AttrType* type, const std::string& value);

@@ -1,0 +1,244 @@
+#include "LDIF_Entry.h"
+
+#include <ostream>
+
+#include "child_index.h"
+#include "failure.h"
+
+using namespace cfg32;
+
+namespace {
+
+constexpr failure illegal_line{80, 1000, "Illegal constructor LDIF_Entry( LDIF_Line::"};
+constexpr failure not_a_child{80, 1000, "["};
+
+/// The line's DN, if the line is one.
+LDIF_DN dn_of(const LDIF_Line& line) {
+    if (line.type != LDIF_Line::dn) {
+        const bool is_attribute = line.type == LDIF_Line::attr;
+        raise(illegal_line,
+              std::string(is_attribute ? "attribute" : line_type_name(line.type)) + " );");
+    }
+    return LDIF_DN(cisString(line.value));
+}
+
+}  // namespace
+
+LDIF_Entry::LDIF_Entry() = default;
+LDIF_Entry::LDIF_Entry(LDIF_Entry&&) noexcept = default;
+
+LDIF_Entry::LDIF_Entry(LDIF_DN dn) : name_("dn"), dn_(dn), relative_dn_(std::move(dn)) {}
+
+LDIF_Entry::LDIF_Entry(const LDIF_Line& line, const LDIF_Comment& comment)
+    : name_(line.attribute), dn_(dn_of(line)), relative_dn_(dn_), comment_(comment) {}
+
+LDIF_Entry::LDIF_Entry(const LDIF_Entry& other)
+    : name_(other.name_),
+      dn_(other.dn_),
+      relative_dn_(other.relative_dn_),
+      comment_(other.comment_),
+      attributes_(other.attributes_),
+      children_(other.children_) {
+    index_children();
+}
+
+LDIF_Entry& LDIF_Entry::operator=(const LDIF_Entry& other) {
+    LDIF_Entry copy(other);
+    return *this = std::move(copy);
+}
+
+LDIF_Entry& LDIF_Entry::operator=(LDIF_Entry&& other) noexcept = default;
+
+LDIF_Entry::~LDIF_Entry() {
+    // The children's children are taken out of them first, so that no destructor recurses down a
+    // deep tree.
+    while (!children_.empty()) {
+        children_.splice(children_.end(), children_.front().children_);
+        children_.pop_front();
+    }
+}
+
+LDIF_Entry& LDIF_Entry::operator+=(const LDIF_Comment& comment) {
+    comment_ += comment;
+    return *this;
+}
+
+LDIF_Entry& LDIF_Entry::operator+=(const LDIF_Attribute& attribute) {
+    attributes_ += attribute;
+    return *this;
+}
+
+LDIF_Entry& LDIF_Entry::operator+=(LDIF_Attribute&& attribute) {
+    attributes_ += std::move(attribute);
+    return *this;
+}
+
+LDIF_Entry& LDIF_Entry::operator+=(LDIF_Entry& child) {
+    list node(1, child);
+    LDIF_Entry& received = place(node);
+    child.relative_dn_ = (node.empty() ? received.children_.back() : node.front()).relative_dn_;
+    return received;
+}
+
+LDIF_Entry& LDIF_Entry::operator+=(LDIF_Entry&& child) {
+    list node;
+    node.push_back(std::move(child));
+    return place(node);
+}
+
+/// Places the one entry of node, whose relative DN is relative to this entry's parent.
+LDIF_Entry& LDIF_Entry::place(list& node) {
+    LDIF_Entry& child = node.front();
+    if (child.relative_dn_ == relative_dn_) {
+        return absorb(child);
+    }
+    if (relative_dn_.intersection(child.relative_dn_) != relative_dn_) {
+        raise(not_a_child,
+              child.relative_dn_.str() + "] is not child of [" + relative_dn_.str() + "]");
+    }
+    return hang(node, relative_dn_.rdns().size());
+}
+
+/// Hangs the entry of node below this one. The first depth RDNs of its relative DN lead here.
+LDIF_Entry& LDIF_Entry::hang(list& node, size_t depth) {
+    LDIF_Entry& child = node.front();
+    LDIF_Entry* parent = this;
+    while (parent->index_) {
+        LDIF_Entry* next = parent->index_->equal_or_ancestor(child.relative_dn_, depth);
+        if (!next) {
+            break;
+        }
+        if (depth + next->relative_dn_.rdns().size() == child.relative_dn_.rdns().size()) {
+            child.relative_dn_.remove_root_side(depth);
+            return next->absorb(child);
+        }
+        depth += next->relative_dn_.rdns().size();
+        parent = next;
+    }
+    child.relative_dn_.remove_root_side(depth);
+    child.take_descendants_from(*parent);
+    parent->append(node, node.begin());
+    return *parent;
+}
+
+/// Merges an entry of the same DN into this one.
+LDIF_Entry& LDIF_Entry::absorb(LDIF_Entry& again) {
+    comment_ += again.comment_;
+    attributes_ += again.attributes_;
+    again.index_.reset();
+    while (!again.children_.empty()) {
+        list node;
+        node.splice(node.end(), again.children_, again.children_.begin());
+        hang(node, 0);
+    }
+    return *this;
+}
+
+/// Takes over the parent's children that belong below this entry, which is to be their sibling.
+void LDIF_Entry::take_descendants_from(LDIF_Entry& parent) {
+    if (!parent.index_) {
+        return;
+    }
+    for (const list::iterator descendant : parent.index_->descendants(relative_dn_)) {
+        list node;
+        parent.index_->erase(descendant);
+        node.splice(node.end(), parent.children_, descendant);
+        hang(node, relative_dn_.rdns().size());
+    }
+}
+
+void LDIF_Entry::append(list& from, list::iterator child) {
+    if (!index_) {
+        index_ = std::make_unique<child_index>();
+    }
+    index_->insert(child);
+    children_.splice(children_.end(), from, child);
+}
+
+void LDIF_Entry::index_children() {
+    if (!children_.empty()) {
+        index_ = std::make_unique<child_index>();
+    }
+    for (auto child = children_.begin(); child != children_.end(); ++child) {
+        index_->insert(child);
+    }
+}
+
+std::string LDIF_Entry::str() const {
+    std::string text;
+    append_to(text);
+    return text;
+}
+
+void LDIF_Entry::append_to(std::string& out) const {
+    comment_.append_to(out);
+    if (!is_root()) {
+        out.append(name_.text()).append(": ").append(dn_.str()).append("\n");
+    }
+    attributes_.append_to(out);
+    if (ends_with_blank_line()) {
+        out += '\n';
+    }
+}
+
+size_t LDIF_Entry::line_count() const {
+    size_t count = comment_.line_count() + (is_root() ? 0 : 1) + (ends_with_blank_line() ? 1 : 0);
+    for (const LDIF_Attribute& attribute : attributes_) {
+        count += attribute.comment().line_count() + attribute.values().size();
+    }
+    return count;
+}
+
+/// An entry does; the root only where the first entry does not bring a blank line itself.
+bool LDIF_Entry::ends_with_blank_line() const {
+    return !is_root() ||
+           (!children_.empty() && !children_.front().comment_.begins_with_blank_line());
+}
+
+LDIF_Entry& LDIF_Entry::clear() { return *this = LDIF_Entry(); }
+
+LDIF_Entry* LDIF_Entry::find(const LDIF_DN& dn) {
+    return const_cast<LDIF_Entry*>(std::as_const(*this).find(dn));
+}
+
+const LDIF_Entry* LDIF_Entry::find(const LDIF_DN& dn) const {
+    if (relative_dn_.intersection(dn) != relative_dn_) {
+        return nullptr;
+    }
+    const LDIF_Entry* entry = this;
+    size_t depth = relative_dn_.rdns().size();
+    while (entry && depth < dn.rdns().size()) {
+        entry = entry->index_ ? entry->index_->equal_or_ancestor(dn, depth) : nullptr;
+        depth += entry ? entry->relative_dn_.rdns().size() : 0;
+    }
+    return entry;
+}
+
+LDIF_Entry LDIF_Entry::header() const {
+    LDIF_Entry copy;
+    copy.name_ = name_;
+    copy.dn_ = dn_;
+    copy.relative_dn_ = relative_dn_;
+    return copy;
+}
+
+namespace {
+
+template <class Printable>
+std::string text_or_nothing(const Printable& printable) {
+    try {
+        return printable.str();
+    } catch (const LDIF_Exception&) {
+        return {};
+    }
+}
+
+}  // namespace
+
+std::string cfg32::shown(const LDIF_DN& dn) { return text_or_nothing(dn); }
+std::string cfg32::shown(const LDIF_Entry& entry) { return text_or_nothing(entry); }
+
+std::ostream& operator<<(std::ostream& out, const LDIF_Entry& top) {
+    for_each_in_preorder(top, [&](const LDIF_Entry& entry) { out << entry.str(); });
+    return out;
+}

@@ -1,0 +1,126 @@
+#pragma once
+
+#include <iosfwd>
+#include <list>
+#include <memory>
+#include <string>
+#include <utility>
+#include <vector>
+
+#include "LDIF_Attribute.h"
+#include "LDIF_Comment.h"
+#include "LDIF_DN.h"
+#include "LDIF_Line.h"
+#include "cisString.h"
+
+namespace cfg32 {
+class child_index;
+}
+
+/// An entry and the tree below it. The root of a whole tree is an entry without name and DN; it
+/// holds the attributes that stand before the first DN line of the file.
+///
+/// An entry's place follows from its DN alone. Its relative DN together with those of its ancestors
+/// is its DN. No two siblings have equal relative DNs and none is an ancestor of another, so an
+/// entry whose parent is missing hangs below its nearest existing ancestor.
+class LDIF_Entry {
+  public:
+    /// In the order they were added. A list: entries stay where they are when siblings go.
+    using list = std::list<LDIF_Entry>;
+
+    LDIF_Entry();
+    explicit LDIF_Entry(LDIF_DN dn);
+    /// From a line of the file, of type dn (80/1000 for another). Throws what parsing a DN throws.
+    LDIF_Entry(const LDIF_Line& line, const LDIF_Comment& comment);
+    LDIF_Entry(const LDIF_Entry& other);
+    LDIF_Entry(LDIF_Entry&& other) noexcept;
+    LDIF_Entry& operator=(const LDIF_Entry& other);
+    LDIF_Entry& operator=(LDIF_Entry&& other) noexcept;
+    virtual ~LDIF_Entry();
+
+    virtual LDIF_Entry& operator+=(const LDIF_Comment& comment);
+    virtual LDIF_Entry& operator+=(const LDIF_Attribute& attribute);
+    /// Places a copy of child and its subtree into the tree below this entry, or merges it into
+    /// the entry that has its DN already; child's relative DN is made relative to where it went.
+    /// Returns the new parent or the entry merged into. Throws 80/1000 when the child's place is
+    /// not below this entry; the tree is then unchanged.
+    virtual LDIF_Entry& operator+=(LDIF_Entry& child);
+    LDIF_Entry& operator+=(LDIF_Attribute&& attribute);
+    /// The same without a copy.
+    LDIF_Entry& operator+=(LDIF_Entry&& child);
+
+    /// The entry in file form, without its children.
+    virtual std::string str() const;
+    void append_to(std::string& out) const;
+
+    /// The lines of its file form.
+    size_t line_count() const;
+
+    /// Empties everything, children included.
+    virtual LDIF_Entry& clear();
+
+    /// The entry of that DN, which is relative to this entry's parent (for the root: a full DN), or
+    /// null.
+    virtual LDIF_Entry* find(const LDIF_DN& dn);
+    const LDIF_Entry* find(const LDIF_DN& dn) const;
+
+    bool is_root() const { return name_.empty(); }
+    const cisString& name() const { return name_; }  ///< of the DN line, as it was written
+    const LDIF_DN& dn() const { return dn_; }
+    const LDIF_DN& relative_dn() const { return relative_dn_; }
+    const LDIF_Comment& comment() const { return comment_; }
+    const LDIF_Attributes& attributes() const { return attributes_; }
+    LDIF_Attributes& attributes() { return attributes_; }
+    const list& children() const { return children_; }
+
+    /// A copy of what names the entry, without comment, attributes and children.
+    LDIF_Entry header() const;
+
+  private:
+    LDIF_Entry& place(list& node);
+    LDIF_Entry& hang(list& node, size_t depth);
+    LDIF_Entry& absorb(LDIF_Entry& again);
+    void take_descendants_from(LDIF_Entry& parent);
+    void append(list& from, list::iterator child);
+    void index_children();
+    bool ends_with_blank_line() const;
+
+    cisString name_;
+    LDIF_DN dn_;
+    LDIF_DN relative_dn_;
+    LDIF_Comment comment_;
+    LDIF_Attributes attributes_;
+    list children_;
+    std::unique_ptr<cfg32::child_index> index_;  // of children_, null when there are none
+};
+
+/// Writes the entry and then everything below it, each entry before its children.
+std::ostream& operator<<(std::ostream& out, const LDIF_Entry& entry);
+
+namespace cfg32 {
+
+// For reports: the text, or "" for a name that can't be printed.
+std::string shown(const LDIF_DN& dn);
+std::string shown(const LDIF_Entry& entry);
+
+/// Calls visit(entry) for the entry and everything below it, each entry before its children. It
+/// doesn't recurse: a tree may be deeper than a stack.
+template <class Visit>
+void for_each_in_preorder(const LDIF_Entry& top, Visit visit) {
+    using position = LDIF_Entry::list::const_iterator;
+    std::vector<std::pair<position, position>> open;
+    const auto enter = [&](const LDIF_Entry& entry) {
+        visit(entry);
+        open.emplace_back(entry.children().begin(), entry.children().end());
+    };
+    enter(top);
+    while (!open.empty()) {
+        if (open.back().first == open.back().second) {
+            open.pop_back();
+        } else {
+            enter(*open.back().first++);
+        }
+    }
+}
+
+}  // namespace cfg32

@@ -1,0 +1,244 @@
+// Loading the configuration file.
+
+#include "LDIF_File.h"
+
+#include <cerrno>
+#include <optional>
+
+#include "LDIF_Attribute.h"
+#include "LDIF_Line.h"
+#include "disk.h"
+#include "failure.h"
+#include "line_source.h"
+
+using namespace cfg32;
+
+namespace {
+
+constexpr failure no_name{91, 1001, "Config filename is NULL!"};
+constexpr failure no_status{91, 1003, "_stat()"};
+constexpr failure not_opened{91, 1004, "ifstream()"};
+constexpr failure not_read{80, 1000, "System error reading file"};
+constexpr failure second_version{19, 1006, "More than 1 \"version\" attribute not allowed"};
+constexpr failure second_charset{19, 1006, "More than 1 \"charset\" attribute not allowed"};
+constexpr failure not_of_root{65, 1007, "\""};
+constexpr failure unknown_line{80, 1000, "Unknown LDIF_Line::Type!"};
+
+constexpr int object_class_violation = 65;
+
+/// One pass over the text of a file, which fills a tree.
+class loader {
+  public:
+    loader(LDIF_Entry& root, LDIF_Comment& pending, aes_key_data* key)
+        : root_(root), pending_(pending), key_(key) {}
+
+    void run(std::string_view text);
+
+    int line_number() const { return line_number_; }
+    bool found_invalid_lines() const { return found_invalid_lines_; }
+    std::string place() const { return open_ ? shown(open_->dn()) : "<root>"; }
+
+  private:
+    void read_line(line_source& source);
+    void dispatch();
+    void end_of_file();
+    void blank_line();
+    void dn_line();
+    void attribute_line();
+    void add_attribute();
+    void add_root_attribute(LDIF_Attribute&& attribute);
+    void require_root_attribute(const char* name, const char* value, bool& seen);
+    void close_entry();
+
+    LDIF_Entry& root_;
+    LDIF_Comment& pending_;  // comment lines that belong to nothing yet
+    aes_key_data* key_;
+    LDIF_Line line_;
+    int line_number_ = 0;
+    std::optional<LDIF_Entry> open_;  // the entry that attribute lines belong to
+    bool version_seen_ = false;
+    bool charset_seen_ = false;
+    bool done_ = false;
+    bool reuse_line_ = false;
+    bool found_invalid_lines_ = false;
+};
+
+void loader::run(std::string_view text) {
+    line_source source(text);
+    while (!done_) {
+        if (!reuse_line_) {
+            read_line(source);
+        }
+        if (!line_.hasSeparator) {
+            line_.changeToInvalidAttr();
+            found_invalid_lines_ = true;
+        }
+        dispatch();
+    }
+}
+
+void loader::read_line(line_source& source) {
+    const int last = line_number_;
+    ++line_number_;  // what a failing read reports
+    line_number_ = line_.next(source, last);
+}
+
+void loader::dispatch() {
+    switch (line_.type) {
+        case LDIF_Line::endOfFile:
+            return end_of_file();
+        case LDIF_Line::blankLine:
+            return blank_line();
+        case LDIF_Line::comment:
+            pending_ += line_;
+            return;
+        case LDIF_Line::dn:
+            return dn_line();
+        case LDIF_Line::attr:
+            return attribute_line();
+        default:
+            raise(unknown_line);
+    }
+}
+
+void loader::end_of_file() {
+    done_ = true;
+    close_entry();
+    pending_.drop_trailing_blank_lines();
+}
+
+void loader::blank_line() {
+    if (open_) {
+        close_entry();
+    } else {
+        pending_ += line_;
+    }
+}
+
+void loader::dn_line() {
+    close_entry();
+    require_root_attribute("charset", "ISO-8859-1", charset_seen_);
+    require_root_attribute("version", "1", version_seen_);
+    reuse_line_ = false;
+    open_.emplace(line_, pending_);
+    pending_.clear();
+}
+
+/// Adds the attribute to the root of a file without it; the comment before the first entry moves
+/// to it.
+void loader::require_root_attribute(const char* name, const char* value, bool& seen) {
+    if (!seen) {
+        LDIF_Attribute attribute(key_, name, value);
+        attribute += pending_;
+        pending_.clear();
+        root_ += std::move(attribute);
+        seen = true;
+    }
+}
+
+/// A line that can't be used is kept as an attribute for such lines. KEPT: the root does not allow
+/// that attribute, so that a bad line above the first entry ends the load.
+void loader::attribute_line() {
+    try {
+        add_attribute();
+    } catch (const LDIF_Exception& e) {
+        // Exhausted memory says nothing about the line.
+        if (e.ldapErr == object_class_violation || e.sysErrno == ENOMEM) {
+            throw;
+        }
+        line_.changeToInvalidAttr();
+        found_invalid_lines_ = true;
+        reuse_line_ = true;
+    }
+}
+
+void loader::add_attribute() {
+    LDIF_Attribute attribute(key_, line_, pending_);
+    pending_.clear();
+    reuse_line_ = false;
+    if (open_) {
+        *open_ += std::move(attribute);
+    } else {
+        add_root_attribute(std::move(attribute));
+    }
+}
+
+void loader::add_root_attribute(LDIF_Attribute&& attribute) {
+    const auto details = [&](LDIF_Exception& e) {
+        e.entryDn = "<root>";
+        e.attribute = attribute.name().text();
+        e.value = attribute.values().begin()->str();
+    };
+    const bool is_version = attribute == "version";
+    if (!is_version && !(attribute == "charset")) {
+        raise_with(not_of_root,
+                   attribute.name().text() + "\" attribute not allowed in <root> object", details);
+    }
+    bool& seen = is_version ? version_seen_ : charset_seen_;
+    if (seen) {
+        raise_with(is_version ? second_version : second_charset, {}, details);
+    }
+    root_ += std::move(attribute);
+    seen = true;
+}
+
+void loader::close_entry() {
+    if (open_) {
+        root_ += std::move(*open_);
+        open_.reset();
+    }
+}
+
+}  // namespace
+
+LDIF_File::LDIF_File(const std::string& fileName, const std::string& backupFileName,
+                     aes_key_data* key)
+    : file_name_(fileName), backup_file_name_(backupFileName), key_(key) {
+    if (file_name_.empty()) {
+        raise_with(no_name, {}, [](LDIF_Exception& e) { e.configFile = "<NULL>"; });
+    }
+    refresh();
+}
+
+bool LDIF_File::is_current(const struct stat& status) const {
+    const bool is_same_file = status.st_dev == status_.st_dev && status.st_ino == status_.st_ino;
+    return is_loaded_ && is_same_file && status.st_mtim.tv_sec == status_.st_mtim.tv_sec &&
+           status.st_mtim.tv_nsec == status_.st_mtim.tv_nsec;
+}
+
+int LDIF_File::refresh() {
+    struct stat status;
+    if (stat(file_name_.c_str(), &status) != 0) {
+        raise_with(no_status, {}, name_file_and_errno(errno));
+    }
+    if (is_current(status)) {
+        return 0;
+    }
+    const file_descriptor file = open_regular_file(file_name_.c_str(), O_RDONLY);
+    if (!file.is_open()) {
+        raise_with(not_opened, {}, name_file_and_errno(errno));
+    }
+    is_loaded_ = false;
+    trailing_comment_.clear();
+    root_.clear();
+    std::string text;
+    loader load(root_, trailing_comment_, key_);
+    const auto body = [&] {
+        if (!read_all(file, static_cast<size_t>(status.st_size), text)) {
+            raise_with(not_read, {}, name_file_and_errno(errno));
+        }
+        load.run(text);
+    };
+    with_boundary([] { return "reading file"; }, body,
+                  [&](LDIF_Exception& e) {
+                      name_file(e);
+                      e.configLine = load.line_number();
+                      e.entryDn = load.place();
+                  });
+    status_ = status;
+    is_loaded_ = true;
+    if (load.found_invalid_lines()) {
+        flush();
+    }
+    return 1;
+}

@@ -1,0 +1,122 @@
+// Writing the configuration file.
+
+#include <grp.h>
+#include <pwd.h>
+#include <sys/stat.h>
+
+#include <algorithm>
+#include <cerrno>
+
+#include "LDIF_File.h"
+#include "cfg32_platform.h"
+#include "disk.h"
+#include "failure.h"
+
+using namespace cfg32;
+
+namespace {
+
+// KEPT: the message names the backup although the status is that of the configuration file.
+constexpr failure no_status_for_backup{91, 1003, "_stat on backup file failed."};
+constexpr failure no_backup{50, 1004, ""};
+constexpr failure not_opened{50, 1004, ""};
+constexpr failure not_written{80, 1000, "System error writing file"};
+constexpr failure no_status{91, 1003, "_stat()"};
+constexpr failure not_a_line{21, 1005, "Text with a line break or a NUL can't be written"};
+
+constexpr size_t name_buffer_size = 2048;
+
+std::string formatted(const char* format, const std::string& file_name) {
+    char message[1024];
+    nuv_snprintf(message, sizeof message, format, file_name.c_str());
+    return message;
+}
+
+/// The name of a file's owner, or null when it is not known.
+const char* owner_name(uid_t owner, char (&buffer)[name_buffer_size]) {
+    passwd record;
+    passwd* found = nullptr;
+    const bool is_known = getpwuid_r(owner, &record, buffer, sizeof buffer, &found) == 0 && found;
+    return is_known ? record.pw_name : nullptr;
+}
+
+const char* group_name(gid_t owner, char (&buffer)[name_buffer_size]) {
+    group record;
+    group* found = nullptr;
+    const bool is_known = getgrgid_r(owner, &record, buffer, sizeof buffer, &found) == 0 && found;
+    return is_known ? record.gr_name : nullptr;
+}
+
+/// True when the text is so many whole lines that each reads back as one.
+bool is_readable(std::string_view text, size_t lines) {
+    return static_cast<size_t>(std::count(text.begin(), text.end(), '\n')) == lines &&
+           text.find('\0') == std::string_view::npos && text.find('\r') == std::string_view::npos;
+}
+
+}  // namespace
+
+void LDIF_File::flush() {
+    const auto details = [&](LDIF_Exception& e) { name_file(e); };
+    const auto body = [&] {
+        // Whatever can fail in memory fails before a file is touched.
+        const std::string content = with_context([&] { return text(); }, details);
+        if (!backup_file_name_.empty()) {
+            back_up();
+        }
+        write(content);
+    };
+    with_system_error([] { return "writing file"; }, body, details);
+}
+
+/// The whole file as text.
+std::string LDIF_File::text() const {
+    std::string out;
+    for_each_in_preorder(root_, [&](const LDIF_Entry& entry) {
+        const size_t begin = out.size();
+        entry.append_to(out);
+        if (!is_readable(std::string_view(out).substr(begin), entry.line_count())) {
+            raise_with(not_a_line, {}, [&](LDIF_Exception& e) { e.entryDn = shown(entry.dn()); });
+        }
+    });
+    trailing_comment_.append_to(out);
+    return out;
+}
+
+void LDIF_File::back_up() const {
+    struct stat status;
+    if (stat(file_name_.c_str(), &status) != 0) {
+        raise_with(no_status_for_backup, {}, name_file_and_errno(errno));
+    }
+    char owner_buffer[name_buffer_size];
+    char group_buffer[name_buffer_size];
+    const char* owner = owner_name(status.st_uid, owner_buffer);
+    const char* group = group_name(status.st_gid, group_buffer);
+    if (!copyFile(file_name_.c_str(), backup_file_name_.c_str(), owner, group, status.st_mode)) {
+        const int error = errno;
+        raise_with(no_backup,
+                   formatted("Unable to backup the configuration file: \"%s\" ", file_name_),
+                   name_file_and_errno(error));
+    }
+}
+
+/// Makes content the file's, in place: links to it, its owner and its mode stay.
+void LDIF_File::write(const std::string& content) {
+    const mode_t mode = is_loaded_ ? status_.st_mode & 07777 : S_IRUSR | S_IWUSR;
+    file_descriptor file = open_regular_file(file_name_.c_str(), O_WRONLY | O_CREAT, mode);
+    if (!file.is_open()) {
+        const int error = errno;
+        raise_with(not_opened, formatted("Unable to open: \"%s\"", file_name_),
+                   name_file_and_errno(error));
+    }
+    if (!overwrite(file, content) || !file.close()) {
+        const int error = errno;
+        is_loaded_ = false;  // the file may be neither the old nor the new one
+        raise_with(not_written, {}, name_file_and_errno(error));
+    }
+    struct stat status;
+    if (stat(file_name_.c_str(), &status) != 0) {
+        raise_with(no_status, {}, name_file_and_errno(errno));
+    }
+    status_ = status;
+    is_loaded_ = true;
+}

@@ -1,0 +1,66 @@
+#pragma once
+
+#include <iosfwd>
+#include <set>
+#include <string>
+#include <vector>
+
+#include "LDIF_Entry.h"
+#include "cisString.h"
+
+/// The filter of a search: one attribute and optionally one value, matched exactly by the
+/// attribute's syntax. At first it matches every entry that has an objectclass.
+class LDIF_Filter {
+  public:
+    LDIF_Filter() = default;
+    LDIF_Filter(const std::string& text) { *this = text; }
+    LDIF_Filter(const LDIF_Filter&) = default;
+    LDIF_Filter& operator=(const LDIF_Filter&) = default;
+    virtual ~LDIF_Filter() = default;
+
+    /// Parses "(attribute=value)", "(attribute=*)" or "(attribute)", the parentheses optional. A
+    /// backslash and two hexadecimal digits are a byte of the value (RFC 4515, 3).
+    LDIF_Filter& operator=(const std::string& text);
+
+    /// Throws what the attribute's syntax throws for the value.
+    virtual bool match(const LDIF_Entry& entry) const;
+
+    const cisString& attribute() const { return attribute_; }
+    const std::string& value() const { return value_; }
+    bool any_value() const { return any_value_; }
+
+  private:
+    cisString attribute_ = "objectclass";
+    std::string value_;
+    bool any_value_ = true;  // the attribute's presence is all that counts
+};
+
+/// The names of the wanted attributes; empty means all.
+using LDIF_AttrFilter = std::set<cisString>;
+
+/// What a search found: copies of the entries, reduced to the wanted attributes.
+class LDIF_Search_Results {
+  public:
+    enum Scope { Base, OneLevel, Subtree };  // the scope numbers of LDAP (RFC 4511, 4.5.1.2)
+
+    LDIF_Search_Results(const Scope& scope, const LDIF_Filter& filter,
+                        const LDIF_AttrFilter& attributes, bool attributesOnly);
+
+    /// Adds what the scope reaches from the base on.
+    LDIF_Search_Results& operator+=(const LDIF_Entry& base) { return addEntry(base, true); }
+    LDIF_Search_Results& addEntry(const LDIF_Entry& entry, const bool& isBase);
+
+    const std::vector<LDIF_Entry>& entries() const { return entries_; }
+    bool attributes_only() const { return attributes_only_; }
+
+  private:
+    void add_match(const LDIF_Entry& entry);
+
+    std::vector<LDIF_Entry> entries_;
+    Scope scope_;
+    LDIF_Filter filter_;
+    LDIF_AttrFilter attributes_;
+    bool attributes_only_;  // only of how the results are printed
+};
+
+std::ostream& operator<<(std::ostream& out, const LDIF_Search_Results& results);

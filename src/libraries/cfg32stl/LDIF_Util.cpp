@@ -1,0 +1,188 @@
+#include "LDIF_Util.h"
+
+#include <cctype>
+#include <cstdlib>
+#include <cwchar>
+#include <cwctype>
+
+#include "failure.h"
+
+const std::string ALPHA = "ABCDEFGHIJKLMNOPQRSTUVWXYZabcdefghijklmnopqrstuvwxyz";
+const std::string DIGIT = "0123456789";
+const std::string hexChar = DIGIT + "ABCDEFabcdef";
+const std::string keyChar = ALPHA + DIGIT + "-";
+const std::string oidChar = DIGIT + ".";
+const std::string special = ",=+<>#;\\\"";
+
+const char* const empty_str = "";
+
+using namespace cfg32;
+
+namespace {
+
+constexpr failure not_multibyte{162, 162, "mbstowcs( "};
+constexpr failure not_representable{163, 163, "wcstombs()"};
+
+constexpr auto invalid = static_cast<size_t>(-1);
+
+template <class Text>
+size_t leading_spaces(const Text& text) {
+    size_t count = 0;
+    while (count < text.size() && is_space(text[count])) {
+        ++count;
+    }
+    return count;
+}
+
+template <class Text>
+size_t length_without_trailing_spaces(const Text& text) {
+    size_t length = text.size();
+    while (length > 0 && is_space(text[length - 1])) {
+        --length;
+    }
+    return length;
+}
+
+}  // namespace
+
+bool w_my_isspace(unsigned int wc) { return iswspace(wc) != 0; }
+
+bool w_isBlank(const std::wstring& text) { return leading_spaces(text) == text.size(); }
+
+bool isBlank(const std::string& text) {
+    return is_plain(text) ? leading_spaces(text) == text.size() : w_isBlank(multibyte2wide(text));
+}
+
+std::wstring& w_stripLeading(std::wstring& text) { return text.erase(0, leading_spaces(text)); }
+
+std::wstring& w_stripTrailing(std::wstring& text) {
+    return text.erase(length_without_trailing_spaces(text));
+}
+
+std::string& stripLeading(std::string& text) {
+    if (is_plain(text)) {
+        return text.erase(0, leading_spaces(text));
+    }
+    std::wstring wide = multibyte2wide(text);
+    return text = wide2multibyte(w_stripLeading(wide));
+}
+
+std::string& stripTrailing(std::string& text) {
+    if (is_plain(text)) {
+        return text.erase(length_without_trailing_spaces(text));
+    }
+    std::wstring wide = multibyte2wide(text);
+    return text = wide2multibyte(w_stripTrailing(wide));
+}
+
+void w_stripCarriageReturn(std::wstring& text) { std::erase(text, L'\r'); }
+
+bool w_hex2byte(std::wstring& text, char& out) {
+    if (text.size() < 2 || hex_digit(text[0]) < 0 || hex_digit(text[1]) < 0) {
+        return false;
+    }
+    out = static_cast<char>(16 * hex_digit(text[0]) + hex_digit(text[1]));
+    text.erase(0, 2);
+    return true;
+}
+
+bool hex2byte(std::string& text, char& out) {
+    std::wstring wide = multibyte2wide(text);
+    if (!w_hex2byte(wide, out)) {
+        return false;
+    }
+    text = wide2multibyte(wide);
+    return true;
+}
+
+std::string& byte2hex(unsigned int b, std::string& out) {
+    const auto digit = [](unsigned int nibble) {
+        return static_cast<char>(nibble < 10 ? '0' + nibble : 'A' + nibble - 10);
+    };
+    out += digit(b >> 4 & 0xF);
+    out += digit(b & 0xF);
+    return out;
+}
+
+std::wstring multibyte2wide(const std::string& text) {
+    const size_t length = mbstowcs(nullptr, text.c_str(), 0);
+    if (length == 0) {
+        return {};
+    }
+    std::wstring wide(length == invalid ? 0 : length, L'\0');
+    if (length == invalid || mbstowcs(wide.data(), text.c_str(), length + 1) != length) {
+        raise_with(not_multibyte, text + " )", [&](LDIF_Exception& e) { e.value = text; });
+    }
+    return wide;
+}
+
+std::string wide2multibyte(const std::wstring& text) {
+    const size_t length = wcstombs(nullptr, text.c_str(), 0);
+    if (length == 0) {
+        return {};
+    }
+    std::string narrow(length == invalid ? 0 : length, '\0');
+    if (length == invalid || wcstombs(narrow.data(), text.c_str(), length + 1) != length) {
+        raise(not_representable);
+    }
+    return narrow;
+}
+
+namespace cfg32 {
+
+bool is_plain(std::string_view text) {
+    // No early exit: a loop without one is done many bytes at a time.
+    bool plain = true;
+    for (const char c : text) {
+        plain &= c > '\0';
+    }
+    return plain;
+}
+
+std::string_view without_leading_space(std::string_view text) {
+    if (is_plain(text)) {
+        return text.substr(leading_spaces(text));
+    }
+    std::string copy(text);
+    return text.substr(text.size() - stripLeading(copy).size());
+}
+
+std::string_view without_trailing_space(std::string_view text) {
+    if (is_plain(text)) {
+        return text.substr(0, length_without_trailing_spaces(text));
+    }
+    std::string copy(text);
+    return text.substr(0, stripTrailing(copy).size());
+}
+
+character first_character(std::string_view text) {
+    if (text.front() >= '\0') {
+        return {text.substr(0, 1), static_cast<wchar_t>(text.front()), true};
+    }
+    wchar_t code = L'\0';
+    mbstate_t state{};
+    const size_t length = mbrtowc(&code, text.data(), text.size(), &state);
+    const bool is_valid = length >= 1 && length <= text.size();
+    return {text.substr(0, is_valid ? length : 1), code, is_valid};
+}
+
+size_t hash_without_case(const char* text, size_t seed) {
+    // FNV-1a. The case is folded by the locale, as strcasecmp does.
+    for (; *text != '\0'; ++text) {
+        const int folded = tolower(static_cast<unsigned char>(*text));
+        seed = (seed ^ static_cast<size_t>(folded)) * 0x100000001b3;
+    }
+    return seed;
+}
+
+int hex_digit(wchar_t c) {
+    if (c >= L'0' && c <= L'9') {
+        return c - L'0';
+    }
+    if (c >= L'A' && c <= L'F') {
+        return c - L'A' + 10;
+    }
+    return c >= L'a' && c <= L'f' ? c - L'a' + 10 : -1;
+}
+
+}  // namespace cfg32

@@ -1,0 +1,94 @@
+#pragma once
+
+// Text helpers. Whitespace is judged on wide characters, so that multibyte text of the current
+// locale is classified right; stored text is narrow. Text that is plain ASCII reads the same in
+// every character set a locale can have here (POSIX, XBD 6.1), so it is never converted.
+
+#include <string>
+#include <string_view>
+
+// Character classes of the DN grammar (RFC 1779; RFC 4514 is its successor).
+extern const std::string ALPHA;
+extern const std::string DIGIT;
+extern const std::string hexChar;  ///< DIGIT, A to F, a to f
+extern const std::string keyChar;  ///< letters, digits, "-"
+extern const std::string oidChar;  ///< digits, "."
+extern const std::string special;  ///< the nine characters that a plain DN value must escape
+
+/// What the C interface returns where a value is absent but a string is expected.
+extern const char* const empty_str;
+
+/// The one whitespace test of the library.
+bool w_my_isspace(unsigned int wc);
+
+/// True when every character is whitespace, also for the empty string.
+bool w_isBlank(const std::wstring& text);
+bool isBlank(const std::string& text);
+
+// These change their argument and return it.
+std::wstring& w_stripLeading(std::wstring& text);
+std::wstring& w_stripTrailing(std::wstring& text);
+std::string& stripLeading(std::string& text);
+std::string& stripTrailing(std::string& text);
+
+/// Removes every carriage return, not only the one before a line's end.
+void w_stripCarriageReturn(std::wstring& text);
+
+/// Takes two hexadecimal digits from the front of text into out. False, with text unchanged, when
+/// it does not begin with two.
+bool w_hex2byte(std::wstring& text, char& out);
+bool hex2byte(std::string& text, char& out);
+
+/// Appends two upper-case hexadecimal digits for the byte b; returns out.
+std::string& byte2hex(unsigned int b, std::string& out);
+
+/// Converts text of the locale's character set, up to its first NUL. Throws LDIF_Exception 162/162
+/// (with the text as its value) when it is not valid there.
+std::wstring multibyte2wide(const std::string& text);
+
+/// Converts back, up to the first NUL. Throws LDIF_Exception 163/163 for a character that the
+/// locale's character set does not have.
+std::string wide2multibyte(const std::wstring& text);
+
+namespace cfg32 {
+
+/// True when text is ASCII without NUL: converting it would change nothing.
+bool is_plain(std::string_view text);
+
+/// True for the ASCII characters but NUL.
+template <class Char>
+constexpr bool is_ascii(Char c) {
+    return static_cast<unsigned long>(c) - 1 < 0x7f;
+}
+
+/// Whitespace test for ASCII characters.
+constexpr bool is_ascii_space(char c) { return c == ' ' || (c >= '\t' && c <= '\r'); }
+
+/// The text without the whitespace at its front, or at its end, as a part of it.
+std::string_view without_leading_space(std::string_view text);
+std::string_view without_trailing_space(std::string_view text);
+
+/// The first character of a text in the locale's character set.
+struct character {
+    std::string_view bytes;  ///< never empty; a byte that begins no valid character stands alone
+    wchar_t code;
+    bool is_valid;
+};
+
+/// text must not be empty.
+character first_character(std::string_view text);
+
+/// A hash that is the same for texts that strcasecmp finds equal; seed continues another hash.
+size_t hash_without_case(const char* text, size_t seed = 0xcbf29ce484222325);
+
+/// The value of a hexadecimal digit, or -1.
+int hex_digit(wchar_t c);
+
+// A text of either width as the grammars need it: the same algorithm reads plain ASCII as it is
+// and everything else in its wide form.
+inline bool is_space(char c) { return is_ascii_space(c); }
+inline bool is_space(wchar_t c) { return w_my_isspace(static_cast<unsigned int>(c)); }
+inline std::string narrowed(std::string_view text) { return std::string(text); }
+inline std::string narrowed(std::wstring_view text) { return wide2multibyte(std::wstring(text)); }
+
+}  // namespace cfg32

@@ -1,0 +1,78 @@
+#include "child_index.h"
+
+#include <algorithm>
+
+namespace cfg32 {
+
+namespace {
+
+/// True when relative begins with the RDNs of dn from `from` to `to`.
+bool begins_with(const LDIF_DN& relative, const LDIF_DN& dn, size_t from, size_t to) {
+    const auto part = dn.rdns().begin();
+    const auto equal = [](const LDIF_RDN& l, const LDIF_RDN& r) { return l == r; };
+    return relative.rdns().size() >= to - from &&
+           std::equal(part + static_cast<ptrdiff_t>(from), part + static_cast<ptrdiff_t>(to),
+                      relative.rdns().begin(), equal);
+}
+
+/// Calls use(hash) with the hash of each root-side part of dn but the whole.
+template <class Use>
+void for_each_ancestor(const LDIF_DN& dn, Use use) {
+    size_t hash = 0;
+    for (size_t i = 0; i + 1 < dn.rdns().size(); ++i) {
+        hash = dn.rdns()[i].hash(hash);
+        use(hash);
+    }
+}
+
+}  // namespace
+
+void child_index::insert(position child) {
+    const LDIF_DN& dn = child->relative_dn();
+    const uint64_t order = next_order_++;
+    by_dn_.emplace(dn.hash(), numbered_child{child, order});
+    for_each_ancestor(dn, [&](size_t hash) { by_ancestor_[{hash, order}] = child; });
+}
+
+void child_index::erase(position child) {
+    const LDIF_DN& dn = child->relative_dn();
+    const auto [first, last] = by_dn_.equal_range(dn.hash());
+    const auto is_child = [&](const auto& entry) { return entry.second.child == child; };
+    const auto found = std::find_if(first, last, is_child);
+    const uint64_t order = found->second.order;
+    by_dn_.erase(found);
+    for_each_ancestor(dn, [&](size_t hash) { by_ancestor_.erase({hash, order}); });
+}
+
+LDIF_Entry* child_index::equal_or_ancestor(const LDIF_DN& dn, size_t from) const {
+    size_t hash = 0;
+    for (size_t to = from + 1; to <= dn.rdns().size(); ++to) {
+        hash = dn.rdns()[to - 1].hash(hash);
+        const auto [first, last] = by_dn_.equal_range(hash);
+        for (auto entry = first; entry != last; ++entry) {
+            const position child = entry->second.child;
+            if (child->relative_dn().rdns().size() == to - from &&
+                begins_with(child->relative_dn(), dn, from, to)) {
+                return &*child;
+            }
+        }
+    }
+    return nullptr;
+}
+
+std::vector<child_index::position> child_index::descendants(const LDIF_DN& dn) const {
+    std::vector<position> found;
+    if (by_ancestor_.empty()) {
+        return found;
+    }
+    const size_t hash = dn.hash();
+    for (auto entry = by_ancestor_.lower_bound({hash, 0});
+         entry != by_ancestor_.end() && entry->first.first == hash; ++entry) {
+        if (begins_with(entry->second->relative_dn(), dn, 0, dn.rdns().size())) {
+            found.push_back(entry->second);
+        }
+    }
+    return found;
+}
+
+}  // namespace cfg32

@@ -1,0 +1,435 @@
+#include "child_index.h"
+
+#include <gmock/gmock.h>
+#include <pthread.h>
+
+#include <algorithm>
+#include <cctype>
+#include <random>
+#include <sstream>
+#include <string>
+#include <utility>
+#include <vector>
+
+using cfg32::child_index;
+using testing::ElementsAre;
+using testing::IsEmpty;
+
+namespace {
+
+LDIF_DN dn_of(const std::string& text) { return LDIF_DN(cisString(text)); }
+
+// An entry's place as its rules say it literally: children are a list that is walked in order, and
+// names are compared part by part.
+
+using steps = std::vector<std::string>;  // a DN's RDNs, root first, in lower case
+
+steps steps_of(const LDIF_DN& dn) {
+    steps all;
+    for (const LDIF_RDN& rdn : dn.rdns()) {
+        std::string text = rdn.str();
+        for (char& c : text) {
+            c = static_cast<char>(tolower(static_cast<unsigned char>(c)));
+        }
+        all.push_back(text);
+    }
+    return all;
+}
+
+steps intersection(const steps& a, const steps& b) {
+    return {a.begin(), std::mismatch(a.begin(), a.end(), b.begin(), b.end()).first};
+}
+
+struct model_entry {
+    steps relative;
+    std::string dn;  // as it is printed; "" for the root
+    std::string comment;
+    std::string values;  // of "sn"
+    std::vector<model_entry> children;
+
+    const model_entry& add(model_entry child) {
+        if (child.relative == relative) {
+            comment += child.comment;
+            values += child.values;
+            for (const model_entry& grandchild : child.children) {
+                place(grandchild);
+            }
+            return *this;
+        }
+        const steps common = intersection(relative, child.relative);
+        EXPECT_EQ(common, relative);
+        child.relative.erase(child.relative.begin(),
+                             child.relative.begin() + static_cast<ptrdiff_t>(common.size()));
+        return place(std::move(child));
+    }
+
+    /// child's name is relative to this entry already.
+    const model_entry& place(model_entry child) {
+        for (size_t i = 0; i < children.size();) {
+            model_entry& c = children[i];
+            const steps common = intersection(c.relative, child.relative);
+            if (c.relative == child.relative || c.relative == common) {
+                return c.add(std::move(child));
+            }
+            if (child.relative == common) {
+                child.add(c);
+                children.erase(children.begin() + static_cast<ptrdiff_t>(i));
+            } else {
+                ++i;
+            }
+        }
+        children.push_back(std::move(child));
+        return *this;
+    }
+
+    const model_entry* find(const steps& dn_steps) const {
+        if (relative == dn_steps) {
+            return this;
+        }
+        const steps common = intersection(relative, dn_steps);
+        if (common != relative) {
+            return nullptr;
+        }
+        const steps rest(dn_steps.begin() + static_cast<ptrdiff_t>(common.size()), dn_steps.end());
+        for (const model_entry& c : children) {
+            if (const model_entry* found = c.find(rest)) {
+                return found;
+            }
+        }
+        return nullptr;
+    }
+
+    std::string str() const {
+        std::string text = comment;
+        if (!dn.empty()) {
+            text += "dn: " + dn + "\n";
+        }
+        for (const char value : values) {
+            text += std::string("sn: ") + value + "\n";
+        }
+        return text + (dn.empty() && children.empty() ? "" : "\n");
+    }
+};
+
+void print(const model_entry& entry, std::string& out) {
+    out += entry.str();
+    for (const model_entry& child : entry.children) {
+        print(child, out);
+    }
+}
+
+/// The relative names and the nesting of a tree, one line for an entry.
+void print_shape(const model_entry& entry, size_t depth, std::string& out) {
+    out.append(depth, ' ');
+    for (const std::string& step : entry.relative) {
+        out += "/" + step;
+    }
+    out += "\n";
+    for (const model_entry& child : entry.children) {
+        print_shape(child, depth + 1, out);
+    }
+}
+
+void print_shape(const LDIF_Entry& entry, size_t depth, std::string& out) {
+    out.append(depth, ' ');
+    for (const std::string& step : steps_of(entry.relative_dn())) {
+        out += "/" + step;
+    }
+    out += "\n";
+    for (const LDIF_Entry& child : entry.children()) {
+        print_shape(child, depth + 1, out);
+    }
+}
+
+template <class Entry>
+std::string shape(const Entry& entry) {
+    std::string text;
+    print_shape(entry, 0, text);
+    return text;
+}
+
+std::string file_text(const LDIF_Entry& entry) {
+    std::ostringstream out;
+    out << entry;
+    return out.str();
+}
+
+std::string file_text(const model_entry& entry) {
+    std::string text;
+    print(entry, text);
+    return text;
+}
+
+class random_names {
+  public:
+    explicit random_names(unsigned seed) : random_(seed) {}
+
+    unsigned below(unsigned count) { return static_cast<unsigned>(random_() % count); }
+
+    std::string rdn() {
+        static const char* const pool[] = {"cn=a", "CN=A", "cn=b", "o=a",       "ou=x",
+                                           "OU=X", "cn=c", "sn=a", "cn=a+sn=b", "SN=B+cn=a"};
+        return pool[below(std::size(pool))];
+    }
+
+    std::string dn(unsigned depth) {
+        std::string text = rdn();
+        while (--depth > 0) {
+            text += "," + rdn();
+        }
+        return text;
+    }
+
+    LDIF_Entry entry(const std::string& text, model_entry& model) {
+        const std::string comment = "# " + std::to_string(++number_);
+        const char value = static_cast<char>('a' + number_ % 26);
+        LDIF_Line line;
+        line.type = LDIF_Line::dn;
+        line.attribute = "dn";
+        line.value = text;
+        LDIF_Line comment_line;
+        comment_line.type = LDIF_Line::comment;
+        comment_line.value = comment;
+        LDIF_Comment comments;
+        comments += comment_line;
+        LDIF_Entry entry(line, comments);
+        model = {steps_of(entry.dn()), entry.dn().str(), comment + "\n", "", {}};
+        // Few are merged more than once; a value that is repeated would be dropped.
+        if (below(26) != 0) {
+            entry += LDIF_Attribute(nullptr, "sn", std::string(1, value));
+            model.values = value;
+        }
+        return entry;
+    }
+
+  private:
+    std::mt19937 random_;
+    unsigned number_ = 0;
+};
+
+/// Drops what LDIF_Values drops, too.
+void drop_repeated_values(model_entry& entry) {
+    std::string kept;
+    for (const char value : entry.values) {
+        if (kept.find(value) == kept.npos) {
+            kept += value;
+        }
+    }
+    entry.values = kept;
+    for (model_entry& child : entry.children) {
+        drop_repeated_values(child);
+    }
+}
+
+/// Runs body on a stack that is too small for a recursion down a deep tree.
+void on_a_small_stack(void (*body)()) {
+    constexpr size_t stack_size = 256 * 1024;
+    pthread_attr_t attributes;
+    ASSERT_EQ(pthread_attr_init(&attributes), 0);
+    ASSERT_EQ(pthread_attr_setstacksize(&attributes, stack_size), 0);
+    pthread_t thread;
+    const auto start = [](void* argument) -> void* {
+        (*static_cast<void (**)()>(argument))();
+        return nullptr;
+    };
+    ASSERT_EQ(pthread_create(&thread, &attributes, start, &body), 0);
+    EXPECT_EQ(pthread_join(thread, nullptr), 0);
+    pthread_attr_destroy(&attributes);
+}
+
+}  // namespace
+
+TEST(child_index, RandomInsertionsBuildTheTreeThatTheWalkOverAllSiblingsBuilds) {
+    random_names names(1);
+    for (int round = 0; round < 150; ++round) {
+        SCOPED_TRACE(round);
+        const unsigned count = 1 + names.below(60);
+        const unsigned depth = 1 + names.below(5);
+        LDIF_Entry root;
+        model_entry expected;
+        for (unsigned i = 0; i < count; ++i) {
+            model_entry model;
+            LDIF_Entry entry = names.entry(names.dn(1 + names.below(depth)), model);
+            const bool is_copied = names.below(2) == 0;
+            const LDIF_Entry& receiver = is_copied ? root += entry : root += std::move(entry);
+            ASSERT_EQ(receiver.dn().str(), expected.add(model).dn);
+            if (names.below(40) == 0) {
+                LDIF_Entry copy(root);
+                root = names.below(2) == 0 ? copy : std::move(copy);
+            }
+        }
+        drop_repeated_values(expected);
+        ASSERT_EQ(shape(root), shape(expected));
+        ASSERT_EQ(file_text(root), file_text(expected));
+        for (unsigned i = 0; i < 100; ++i) {
+            const LDIF_DN wanted = dn_of(names.dn(1 + names.below(depth)));
+            const LDIF_Entry* found = root.find(wanted);
+            const model_entry* model = expected.find(steps_of(wanted));
+            ASSERT_EQ(found != nullptr, model != nullptr) << wanted.str();
+            ASSERT_EQ(found ? found->str() : "", model ? model->str() : "");
+        }
+    }
+}
+
+TEST(child_index, RandomSubtreesArePlacedWhereTheWalkOverAllSiblingsPlacesThem) {
+    random_names names(2);
+    for (int round = 0; round < 150; ++round) {
+        SCOPED_TRACE(round);
+        LDIF_Entry root;
+        model_entry expected;
+        for (unsigned tree = 0; tree < 8; ++tree) {
+            model_entry model_top;
+            const std::string top_name = names.dn(1 + names.below(2));
+            LDIF_Entry top = names.entry(top_name, model_top);
+            for (unsigned i = names.below(6); i > 0; --i) {
+                LDIF_Entry entry(dn_of(names.dn(1 + names.below(2)) + "," + top_name));
+                model_top.add({steps_of(entry.dn()), entry.dn().str(), "", "", {}});
+                top += entry;
+            }
+            root += top;
+            expected.add(model_top);
+        }
+        drop_repeated_values(expected);
+        ASSERT_EQ(shape(root), shape(expected));
+        ASSERT_EQ(file_text(root), file_text(expected));
+    }
+}
+
+TEST(child_index, WideTreeIsBuiltSearchedCopiedAndDestroyed) {
+    constexpr int width = 100000;
+    LDIF_Entry root;
+    root += LDIF_Entry(dn_of("o=wide"));
+    for (int i = 0; i < width; ++i) {
+        root += LDIF_Entry(dn_of("cn=" + std::to_string(i) + ",o=wide"));
+    }
+    ASSERT_EQ(root.children().size(), 1u);
+    const LDIF_Entry& wide = root.children().front();
+    ASSERT_EQ(wide.children().size(), static_cast<size_t>(width));
+    EXPECT_EQ(wide.children().front().relative_dn().str(), "cn=0");
+    EXPECT_EQ(wide.children().back().relative_dn().str(), "cn=99999");
+    EXPECT_EQ(root.find(dn_of("CN=99999,o=wide")), &wide.children().back());
+    EXPECT_EQ(root.find(dn_of("cn=100000,o=wide")), nullptr);
+    const LDIF_Entry copy(root);
+    EXPECT_TRUE(copy.find(dn_of("cn=50000,o=wide")));
+}
+
+TEST(child_index, ManyEntriesMoveUnderAParentThatComesLast) {
+    constexpr int width = 20000;
+    LDIF_Entry root;
+    for (int i = 0; i < width; ++i) {
+        root += LDIF_Entry(dn_of("cn=" + std::to_string(i) + ",ou=later,o=wide"));
+    }
+    root += LDIF_Entry(dn_of("o=wide"));
+    root += LDIF_Entry(dn_of("ou=later,o=wide"));
+    const LDIF_Entry& parent = root.children().front().children().front();
+    ASSERT_EQ(parent.children().size(), static_cast<size_t>(width));
+    EXPECT_EQ(parent.children().back().relative_dn().str(), "cn=19999");
+}
+
+// A tree needs memory for the square of its depth, so the stack is small instead of the tree deep.
+TEST(child_index, DeepTreeIsBuiltPrintedAndDestroyedWithoutRecursion) {
+    on_a_small_stack([] {
+        constexpr size_t depth = 1500;
+        LDIF_Entry root;
+        LDIF_DN dn;
+        cisString step = "cn=x";
+        const LDIF_RDN rdn(step);
+        for (size_t level = 0; level < depth; ++level) {
+            dn += rdn;
+            root += LDIF_Entry(dn);
+        }
+        EXPECT_TRUE(root.find(dn));
+        size_t visited = 0;
+        cfg32::for_each_in_preorder(root, [&](const LDIF_Entry&) { ++visited; });
+        EXPECT_EQ(visited, depth + 1);
+        LDIF_Entry moved(std::move(root));
+        moved.clear();
+        EXPECT_TRUE(moved.children().empty());
+    });
+}
+
+TEST(child_index, DeepTreeThatIsAddedFromItsLeafUpEndsInTheSameChain) {
+    constexpr size_t depth = 300;
+    LDIF_DN dn;
+    cisString step = "cn=x";
+    const LDIF_RDN rdn(step);
+    for (size_t level = 0; level < depth; ++level) {
+        dn += rdn;
+    }
+    const LDIF_DN leaf = dn;
+    LDIF_Entry root;
+    for (; !dn.empty(); dn.remove_leaf()) {
+        root += LDIF_Entry(dn);
+    }
+    const LDIF_Entry* found = root.find(leaf);
+    ASSERT_TRUE(found);
+    EXPECT_EQ(found->relative_dn().str(), "cn=x");
+    EXPECT_EQ(root.children().size(), 1u);
+}
+
+namespace {
+
+/// Entries that are not in a tree, and an index of them.
+struct indexed_entries {
+    LDIF_Entry::list entries;
+    child_index index;
+
+    child_index::position add(const std::string& dn) {
+        entries.emplace_back(dn_of(dn));
+        const auto position = std::prev(entries.end());
+        index.insert(position);
+        return position;
+    }
+
+    std::string nearest(const std::string& dn, size_t from = 0) const {
+        const LDIF_Entry* entry = index.equal_or_ancestor(dn_of(dn), from);
+        return entry ? entry->dn().str() : "none";
+    }
+
+    std::vector<std::string> below(const std::string& dn) const {
+        std::vector<std::string> names;
+        for (const auto position : index.descendants(dn_of(dn))) {
+            names.push_back(position->dn().str());
+        }
+        return names;
+    }
+};
+
+}  // namespace
+
+TEST(child_index, FindsAnEqualChildOrAnAncestor) {
+    indexed_entries children;
+    children.add("o=a");
+    children.add("cn=2,cn=1,o=b");
+    EXPECT_EQ(children.nearest("O=A"), "o=a");
+    EXPECT_EQ(children.nearest("cn=x,cn=y,o=a"), "o=a");
+    EXPECT_EQ(children.nearest("cn=2,cn=1,o=b"), "cn=2, cn=1, o=b");
+    EXPECT_EQ(children.nearest("sn=x,cn=2,CN=1,o=b"), "cn=2, cn=1, o=b");
+    EXPECT_EQ(children.nearest("cn=1,o=b"), "none");
+    EXPECT_EQ(children.nearest("o=b"), "none");
+    EXPECT_EQ(children.nearest("o=c"), "none");
+    EXPECT_EQ(children.nearest("cn=x,o=a,dc=top", 1), "o=a");
+    EXPECT_EQ(children.nearest("o=a", 1), "none");
+}
+
+TEST(child_index, FindsDescendantsInTheOrderTheyWereEntered) {
+    indexed_entries children;
+    children.add("cn=2,o=a");
+    children.add("o=b");
+    children.add("sn=1,cn=1,o=a");
+    children.add("cn=1,O=A");
+    EXPECT_THAT(children.below("o=a"), ElementsAre("cn=2, o=a", "sn=1, cn=1, o=a", "cn=1, O=A"));
+    EXPECT_THAT(children.below("cn=1,o=a"), ElementsAre("sn=1, cn=1, o=a"));
+    EXPECT_THAT(children.below("o=b"), IsEmpty());
+    EXPECT_THAT(children.below("o=c"), IsEmpty());
+}
+
+TEST(child_index, ErasedChildIsFoundNoMore) {
+    indexed_entries children;
+    const auto first = children.add("cn=1,o=a");
+    children.add("cn=2,o=a");
+    children.index.erase(first);
+    EXPECT_EQ(children.nearest("cn=1,o=a"), "none");
+    EXPECT_EQ(children.nearest("cn=2,o=a"), "cn=2, o=a");
+    EXPECT_THAT(children.below("o=a"), ElementsAre("cn=2, o=a"));
+}
