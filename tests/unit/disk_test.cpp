@@ -11,6 +11,7 @@
 #include <string>
 #include <utility>
 
+#include "open_regular.h"
 #include "temporary_folder.h"
 
 using namespace cfg32;
@@ -20,27 +21,31 @@ namespace {
 
 constexpr mode_t owner_only = 0600;
 
+unique_fd opened(const std::string& path, int flags) {
+    struct stat status;
+    return open_regular(path.c_str(), status, flags, owner_only);
+}
+
 struct disk : testing::Test {
     temporary_folder folder;
 
     std::string content(const std::string& path, size_t expected) {
-        const file_descriptor file = open_regular_file(path.c_str(), O_RDONLY);
-        EXPECT_TRUE(file.is_open());
+        const unique_fd file = opened(path, O_RDONLY);
+        EXPECT_TRUE(file);
         std::string text = "what was there before";
-        EXPECT_TRUE(read_all(file, expected, text));
+        EXPECT_TRUE(read_all(file.get(), expected, text));
         return text;
     }
 
     bool write(const std::string& name, const std::string& text) {
-        file_descriptor file =
-            open_regular_file(folder.file(name).c_str(), O_WRONLY | O_CREAT, owner_only);
-        return file.is_open() && overwrite(file, text) && file.close();
+        unique_fd file = opened(folder.file(name), O_WRONLY | O_CREAT);
+        return file && overwrite(file.get(), text) && file.close();
     }
 
     /// errno of an attempt to open the path, 0 when it opens.
     int refusal(const std::string& path, int flags) {
         errno = 0;
-        return open_regular_file(path.c_str(), flags, owner_only).is_open() ? 0 : errno;
+        return opened(path, flags) ? 0 : errno;
     }
 };
 
@@ -57,47 +62,10 @@ void limit_file_size(rlim_t size) {
 
 }  // namespace
 
-TEST_F(disk, DescriptorClosesItsFileAtItsEnd) {
-    int number;
-    {
-        const file_descriptor file(open(folder.write("f", "x").c_str(), O_RDONLY));
-        number = file.number();
-        EXPECT_TRUE(file.is_open());
-        EXPECT_TRUE(is_open_in_system(number));
-    }
-    EXPECT_FALSE(is_open_in_system(number));
-}
-
-TEST_F(disk, MovedDescriptorBelongsToItsNewOwnerOnly) {
-    file_descriptor file(open(folder.write("f", "x").c_str(), O_RDONLY));
-    const int number = file.number();
-    const file_descriptor owner(std::move(file));
-    EXPECT_FALSE(file.is_open());
-    EXPECT_TRUE(file.close());
-    EXPECT_EQ(owner.number(), number);
-    EXPECT_TRUE(is_open_in_system(number));
-}
-
-TEST_F(disk, ClosingTwiceClosesOnce) {
-    file_descriptor file(open(folder.write("f", "x").c_str(), O_RDONLY));
-    EXPECT_TRUE(file.close());
-    EXPECT_FALSE(file.is_open());
-    EXPECT_TRUE(file.close());
-}
-
-TEST_F(disk, ClosingReportsTheSystemsError) {
-    file_descriptor file(dup(open(folder.write("f", "x").c_str(), O_RDONLY)));
-    ::close(file.number());
-    EXPECT_FALSE(file.close());
-    EXPECT_EQ(errno, EBADF);
-}
-
-TEST_F(disk, NothingIsNoOpenFile) { EXPECT_FALSE(file_descriptor().is_open()); }
-
 TEST_F(disk, OpenedFileIsNotInherited) {
-    const file_descriptor file = open_regular_file(folder.write("f", "x").c_str(), O_RDONLY);
-    ASSERT_TRUE(file.is_open());
-    EXPECT_TRUE(fcntl(file.number(), F_GETFD) & FD_CLOEXEC);
+    const unique_fd file = opened(folder.write("f", "x"), O_RDONLY);
+    ASSERT_TRUE(file);
+    EXPECT_TRUE(fcntl(file.get(), F_GETFD) & FD_CLOEXEC);
 }
 
 TEST_F(disk, MissingFileIsRefusedOrMade) {
@@ -137,8 +105,8 @@ TEST_F(disk, SocketIsRefused) {
     const std::string path = folder.file("s");
     ASSERT_LT(path.size(), sizeof address.sun_path);
     path.copy(address.sun_path, path.size());
-    const file_descriptor listener(socket(AF_UNIX, SOCK_STREAM, 0));
-    ASSERT_EQ(bind(listener.number(), reinterpret_cast<sockaddr*>(&address), sizeof address), 0);
+    const unique_fd listener(socket(AF_UNIX, SOCK_STREAM, 0));
+    ASSERT_EQ(bind(listener.get(), reinterpret_cast<sockaddr*>(&address), sizeof address), 0);
     EXPECT_NE(refusal(path, O_RDONLY), 0);
 }
 
@@ -189,9 +157,9 @@ TEST_F(disk, FileWithoutASizeIsRead) {
 }
 
 TEST_F(disk, FailureToReadIsReported) {
-    const file_descriptor file(open(folder.write("f", "x").c_str(), O_WRONLY));
+    const unique_fd file(open(folder.write("f", "x").c_str(), O_WRONLY));
     std::string text;
-    EXPECT_FALSE(read_all(file, 1, text));
+    EXPECT_FALSE(read_all(file.get(), 1, text));
     EXPECT_EQ(errno, EBADF);
 }
 
@@ -214,9 +182,9 @@ TEST_F(disk, TextBecomesTheWholeContent) {
 }
 
 TEST_F(disk, TextStartsAtTheBeginningWhereverTheFileStands) {
-    const file_descriptor file = open_regular_file(folder.write("f", "0123456789").c_str(), O_RDWR);
-    ASSERT_EQ(lseek(file.number(), 5, SEEK_SET), 5);
-    EXPECT_TRUE(overwrite(file, "abc"));
+    const unique_fd file = opened(folder.write("f", "0123456789"), O_RDWR);
+    ASSERT_EQ(lseek(file.get(), 5, SEEK_SET), 5);
+    EXPECT_TRUE(overwrite(file.get(), "abc"));
     EXPECT_EQ(folder.read("f"), "abc");
 }
 
@@ -260,16 +228,16 @@ TEST_F(disk, FileThatMayNotGrowTakesATextThatFits) {
 }
 
 TEST_F(disk, FailureToWriteIsReportedAndChangesNothing) {
-    const file_descriptor file(open(folder.write("f", "before").c_str(), O_RDONLY));
-    EXPECT_FALSE(overwrite(file, "after"));
+    const unique_fd file(open(folder.write("f", "before").c_str(), O_RDONLY));
+    EXPECT_FALSE(overwrite(file.get(), "after"));
     EXPECT_EQ(errno, EBADF);
-    EXPECT_FALSE(overwrite(file, "x"));
+    EXPECT_FALSE(overwrite(file.get(), "x"));
     EXPECT_EQ(folder.read("f"), "before");
 }
 
 TEST_F(disk, FullDeviceIsReported) {
-    const file_descriptor full(open("/dev/full", O_WRONLY));
-    ASSERT_TRUE(full.is_open());
-    EXPECT_FALSE(overwrite(full, "text"));
+    const unique_fd full(open("/dev/full", O_WRONLY));
+    ASSERT_TRUE(full);
+    EXPECT_FALSE(overwrite(full.get(), "text"));
     EXPECT_NE(errno, 0);
 }

@@ -10,6 +10,7 @@
 #include "disk.h"
 #include "failure.h"
 #include "line_source.h"
+#include "open_regular.h"
 
 using namespace cfg32;
 
@@ -214,8 +215,9 @@ int LDIF_File::refresh() {
     if (is_current(status)) {
         return 0;
     }
-    const file_descriptor file = open_regular_file(file_name_.c_str(), O_RDONLY);
-    if (!file.is_open()) {
+    struct stat opened;
+    const unique_fd file = open_regular(file_name_.c_str(), opened);
+    if (!file) {
         raise_with(not_opened, {}, name_file_and_errno(errno));
     }
     is_loaded_ = false;
@@ -224,7 +226,7 @@ int LDIF_File::refresh() {
     std::string text;
     loader load(root_, trailing_comment_, key_);
     const auto body = [&] {
-        if (!read_all(file, static_cast<size_t>(status.st_size), text)) {
+        if (!read_all(file.get(), static_cast<size_t>(opened.st_size), text)) {
             raise_with(not_read, {}, name_file_and_errno(errno));
         }
         load.run(text);

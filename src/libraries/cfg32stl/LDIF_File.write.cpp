@@ -11,6 +11,7 @@
 #include "cfg32_platform.h"
 #include "disk.h"
 #include "failure.h"
+#include "open_regular.h"
 
 using namespace cfg32;
 
@@ -102,18 +103,18 @@ void LDIF_File::back_up() const {
 /// Makes content the file's, in place: links to it, its owner and its mode stay.
 void LDIF_File::write(const std::string& content) {
     const mode_t mode = is_loaded_ ? status_.st_mode & 07777 : S_IRUSR | S_IWUSR;
-    file_descriptor file = open_regular_file(file_name_.c_str(), O_WRONLY | O_CREAT, mode);
-    if (!file.is_open()) {
+    struct stat status;
+    unique_fd file = open_regular(file_name_.c_str(), status, O_WRONLY | O_CREAT, mode);
+    if (!file) {
         const int error = errno;
         raise_with(not_opened, formatted("Unable to open: \"%s\"", file_name_),
                    name_file_and_errno(error));
     }
-    if (!overwrite(file, content) || !file.close()) {
+    if (!overwrite(file.get(), content) || !file.close()) {
         const int error = errno;
         is_loaded_ = false;  // the file may be neither the old nor the new one
         raise_with(not_written, {}, name_file_and_errno(error));
     }
-    struct stat status;
     if (stat(file_name_.c_str(), &status) != 0) {
         raise_with(no_status, {}, name_file_and_errno(errno));
     }

@@ -1,9 +1,13 @@
 #include "disk.h"
 
+#include <fcntl.h>
 #include <sys/resource.h>
 #include <sys/stat.h>
+#include <unistd.h>
 
 #include <cerrno>
+
+#include "retry.h"
 
 namespace cfg32 {
 
@@ -11,21 +15,11 @@ namespace {
 
 constexpr size_t read_ahead = 4096;
 
-/// Calls a system call again for as long as a signal interrupts it.
-template <class Call>
-auto uninterrupted(Call call) {
-    auto result = call();
-    while (result == -1 && errno == EINTR) {
-        result = call();
-    }
-    return result;
-}
-
 bool write_all(int file, std::string_view text) {
     off_t offset = 0;
     while (!text.empty()) {
         const ssize_t written =
-            uninterrupted([&] { return pwrite(file, text.data(), text.size(), offset); });
+            retry_interrupted([&] { return pwrite(file, text.data(), text.size(), offset); });
         if (written == 0) {
             errno = EIO;
         }
@@ -58,7 +52,7 @@ bool reserve(int file, size_t size) {
         return false;
     }
     const off_t missing = static_cast<off_t>(size) - status.st_size;
-    return missing <= 0 || uninterrupted([&] {
+    return missing <= 0 || retry_interrupted([&] {
                                return fallocate(file, FALLOC_FL_KEEP_SIZE, status.st_size, missing);
                            }) == 0 ||
            errno == EOPNOTSUPP || errno == ENOSYS;
@@ -66,29 +60,13 @@ bool reserve(int file, size_t size) {
 
 }  // namespace
 
-file_descriptor open_regular_file(const char* path, int flags, mode_t mode) {
-    // Non-blocking for a FIFO's sake; it means nothing for regular files.
-    file_descriptor file(
-        uninterrupted([&] { return open(path, flags | O_CLOEXEC | O_NONBLOCK | O_NOCTTY, mode); }));
-    struct stat status;
-    if (!file.is_open() || fstat(file.number(), &status) != 0) {
-        return file_descriptor();
-    }
-    if (!S_ISREG(status.st_mode)) {
-        file.close();
-        errno = S_ISDIR(status.st_mode) ? EISDIR : EINVAL;
-        return file_descriptor();
-    }
-    return file;
-}
-
-bool read_all(const file_descriptor& file, size_t expected, std::string& text) {
+bool read_all(int file, size_t expected, std::string& text) {
     size_t length = 0;
     for (;;) {
         // One more than expected, so that the last read finds the end without growing the text.
         text.resize(length < expected ? expected + 1 : length + read_ahead + length / 2);
-        const ssize_t count = uninterrupted(
-            [&] { return read(file.number(), text.data() + length, text.size() - length); });
+        const ssize_t count = retry_interrupted(
+            [&] { return read(file, text.data() + length, text.size() - length); });
         if (count < 0) {
             return false;
         }
@@ -100,10 +78,9 @@ bool read_all(const file_descriptor& file, size_t expected, std::string& text) {
     }
 }
 
-bool overwrite(const file_descriptor& file, std::string_view text) {
-    const int number = file.number();
-    return reserve(number, text.size()) && write_all(number, text) &&
-           ftruncate(number, static_cast<off_t>(text.size())) == 0 && fdatasync(number) == 0;
+bool overwrite(int file, std::string_view text) {
+    return reserve(file, text.size()) && write_all(file, text) &&
+           ftruncate(file, static_cast<off_t>(text.size())) == 0 && fdatasync(file) == 0;
 }
 
 }  // namespace cfg32

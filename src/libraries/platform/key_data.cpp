@@ -45,6 +45,7 @@ aes_key_data* fail(int error) {
 
 }  // namespace cfg32::platform
 
+using namespace cfg32;
 using namespace cfg32::platform;
 
 aes_key_data* aes_key_data_from_bytes(const unsigned char* bytes, size_t size) noexcept {

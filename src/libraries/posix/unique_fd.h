@@ -5,7 +5,7 @@
 #include <cerrno>
 #include <utility>
 
-namespace cfg32::platform {
+namespace cfg32 {
 
 // An owned file descriptor. Closing it on the way out of a failure leaves errno as it was.
 class unique_fd {
@@ -33,4 +33,4 @@ class unique_fd {
     int fd_ = -1;
 };
 
-}  // namespace cfg32::platform
+}  // namespace cfg32

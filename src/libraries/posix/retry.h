@@ -2,7 +2,7 @@
 
 #include <cerrno>
 
-namespace cfg32::platform {
+namespace cfg32 {
 
 // Repeats a system call for as long as a signal interrupts it.
 template <typename Call>
@@ -13,4 +13,4 @@ auto retry_interrupted(Call call) {
     return result;
 }
 
-}  // namespace cfg32::platform
+}  // namespace cfg32

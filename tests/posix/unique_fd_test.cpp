@@ -5,7 +5,7 @@
 
 #include "call_faults.h"
 
-namespace cfg32::platform {
+namespace cfg32 {
 namespace {
 
 bool is_open(int fd) { return ::fcntl(fd, F_GETFD) >= 0; }
@@ -49,4 +49,4 @@ TEST(UniqueFd, AnInterruptedCloseIsAClose) {
 }
 
 }  // namespace
-}  // namespace cfg32::platform
+}  // namespace cfg32

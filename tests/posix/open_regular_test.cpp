@@ -5,7 +5,7 @@
 
 #include "test_directory.h"
 
-namespace cfg32::platform {
+namespace cfg32 {
 namespace {
 
 TEST(OpenRegular, OpensAFileAndTakesItsStatus) {
@@ -50,4 +50,4 @@ TEST(OpenRegular, RefusesWhatIsNoRegularFile) {
 }
 
 }  // namespace
-}  // namespace cfg32::platform
+}  // namespace cfg32
