@@ -10,26 +10,31 @@
  *
  *  1. Handles. cfg_init() makes one, options name the file, cfg_bind_s() loads the file and
  *     authenticates, cfg_unbind() releases everything. A handle is "created" until a bind succeeds
- *     and "bound" from then on; a bound handle is bound once. The calls that need a bound handle
- *     return CFG_PARAM_ERROR (89) for a null handle and for one that is not bound.
+ *     and "bound" from then on; another successful bind replaces what it is bound to, a failed one
+ *     leaves that as it is. The calls that need a bound handle return CFG_PARAM_ERROR (89) for a
+ *     null handle and for one that is not bound.
  *  2. Results. A call that returns int returns 0 for success and else an LDAP result code (RFC
- *     4511, 4.1.9, and the codes from 81 up that LDAP client interfaces added); cfg_err2string()
- *     gives its text. A call that returns a pointer returns null for failure. The code stays in
- *     the handle (cfg_get_errno()) until the next call that resets it.
- *  3. Reset. Every call that takes a handle first clears the handle's error and frees the texts it
- *     had handed out, except the option calls and the ones that report the last failure:
+ *     4511, 4.1.9, and the codes from 81 up that LDAP client interfaces added), save for the ones
+ *     that count; cfg_err2string() gives a code's text. A call that returns a pointer returns null
+ *     for failure. The code stays in the handle (cfg_get_errno()) until the next call that resets
+ *     it.
+ *  3. Reset. Every call that takes a handle first clears the handle's error and frees the report
+ *     of the last failure, except the option calls and the ones that tell of that failure:
  *     cfg_get_option(), cfg_set_option(), cfg_get_errno(), cfg_get_exterror(), cfg_perror() and
  *     cfg_dump_exception(). So ask about a failure before anything else.
  *  4. Memory. Each description says who owns what is returned: results go to cfg_msgfree(), value
  *     arrays to cfg_value_free(), strings to cfg_memfree(), cursors to cfg_ber_free(). A result
  *     outlives the handle that it came from. Text returned as const char * is not the caller's.
- *  5. Passwords that a search decoded are wiped when their result is freed. Copies made by
- *     cfg_get_values() are the caller's to wipe.
+ *     Arguments stay the caller's and are not kept, save for the key of CFG_OPT_KEY_DATA.
+ *  5. Secrets. Passwords that a search decoded are wiped when their result is freed. Copies made by
+ *     cfg_get_values() are the caller's to wipe. The report of a failure holds the value that was
+ *     refused, which may be a password: don't log it where others read.
  *  6. Threads. A handle, its results and their cursors belong to one thread at a time. Handles
  *     are independent of each other, save for the two process-wide options CFG_OPT_SHOW_SOURCE and
  *     CFG_OPT_SHOW_STACK.
  *  7. Locale. cfg_init() calls setlocale(LC_ALL, "") under the server's locale lock: the text of
- *     the file is read in the character set of the environment.
+ *     the file is read in the character set of the environment. As setlocale() changes the whole
+ *     process, make handles while no other thread is in a call of this library.
  *  8. No C++ exception leaves a call.
  */
 #ifndef CFG32_H
@@ -39,10 +44,18 @@
 extern "C" {
 #endif
 
+/** Marks a call that the library exports. */
 #if defined(__GNUC__)
 #define CFG32_API __attribute__((visibility("default")))
 #else
 #define CFG32_API
+#endif
+
+/** Tells C++ callers that a call throws nothing. */
+#if defined(__cplusplus) && __cplusplus >= 201103L
+#define CFG32_NOEXCEPT noexcept
+#else
+#define CFG32_NOEXCEPT
 #endif
 
 /** A session with one configuration file. */
@@ -57,16 +70,16 @@ typedef struct CfgCursor CfgCursor;
 /** Key material for encoded passwords; made by the server's password routines. */
 struct aes_key_data;
 
-/** The result codes that the library itself sets; others come with the failure reported. */
+/** The result codes that callers most often ask for; cfg_err2string() knows all of them. */
 enum {
-    CFG_SUCCESS = 0,
-    CFG_NO_SUCH_ATTRIBUTE = 16,
-    CFG_INVALID_CREDENTIALS = 49,
-    CFG_OTHER = 80,
-    CFG_DECODING_ERROR = 84,
-    CFG_AUTH_UNKNOWN = 86,
-    CFG_PARAM_ERROR = 89,
-    CFG_NO_MEMORY = 90
+    CFG_SUCCESS = 0,              /**< done */
+    CFG_NO_SUCH_ATTRIBUTE = 16,   /**< the entry has no attribute of that name */
+    CFG_INVALID_CREDENTIALS = 49, /**< not the administrator's DN and password */
+    CFG_OTHER = 80,               /**< a failure of the system or of the library */
+    CFG_DECODING_ERROR = 84,      /**< a stored password can't be decoded */
+    CFG_AUTH_UNKNOWN = 86,        /**< a bind method other than CFG_AUTH_SIMPLE */
+    CFG_PARAM_ERROR = 89,         /**< a null argument, or a handle that is not bound */
+    CFG_NO_MEMORY = 90            /**< memory is exhausted */
 };
 
 /** @name Options
@@ -76,20 +89,22 @@ enum {
 #define CFG_OPT_FLAG_A 1000
 /** Boolean, at first off. Kept for the caller; the library does not look at it. */
 #define CFG_OPT_FLAG_B 1001
-/** Boolean, process-wide, off after every cfg_init(): one-line reports begin with the position in
- * the library's source. */
+/** Boolean, process-wide, off after every cfg_init(): the library's one-line reports begin with the
+ * position in its source. cfg_dump_exception() shows that position always. */
 #define CFG_OPT_SHOW_SOURCE 1002
 /** Boolean, process-wide, on after every cfg_init(): reports show the causes of a failure. */
 #define CFG_OPT_SHOW_STACK 1003
 /** Boolean, at first off: an entry may be deleted together with its subtree. */
 #define CFG_OPT_DELETE_NON_LEAVES 1004
-/** Text, at first null: the configuration file that the next cfg_bind_s() loads. */
+/** Text, at first null: the configuration file that the next cfg_bind_s() loads. A bound handle
+ * keeps the file it has, but while this is null its calls return 89. */
 #define CFG_OPT_CONFIG_FILE 1005
 /** Text, at first null: where the next cfg_bind_s() has the file copied before each change. Null
- * or empty makes no backup. */
+ * makes no backup. */
 #define CFG_OPT_BACKUP_FILE 1006
-/** struct aes_key_data *, at first null: key for encoded passwords, used from the next
- * cfg_bind_s() on. It stays the caller's and must outlive the handle. */
+/** struct aes_key_data *, at first null: key for encoded passwords. The next cfg_bind_s() loads the
+ * file with it, and searches decode with it at once. It stays the caller's and must outlive the
+ * handle. */
 #define CFG_OPT_KEY_DATA 1007
 
 /** Values for the boolean options of cfg_set_option(); every pointer but null means on. */
@@ -118,14 +133,15 @@ enum {
  *
  * @return the handle, for cfg_unbind(); null when memory is exhausted.
  */
-CFG32_API CfgHandle *cfg_init(void);
+CFG32_API CfgHandle *cfg_init(void) CFG32_NOEXCEPT;
 
 /**
  * Loads the configuration file and authenticates the caller as its administrator.
  *
  * The file is the one of CFG_OPT_CONFIG_FILE or, without one, "/etc/oruslapd.conf" below the
  * server's installation directory. The administrator's DN and password are the first values of
- * oru-slapdAdminDN and oru-slapdAdminPW in the entry "cn=Configuration".
+ * oru-slapdAdminDN and oru-slapdAdminPW in the entry "cn=Configuration". A file without the first
+ * lets any DN in that comes with the password.
  *
  * Lines that can't be used (without a ":", or with a value that their attribute does not allow) do
  * not stop the load: each becomes an attribute oru-slapdInvalidLine of its entry and the file is
@@ -136,22 +152,27 @@ CFG32_API CfgHandle *cfg_init(void);
  * @param password  in clear text
  * @param method    CFG_AUTH_SIMPLE
  * @return 0;
- *         34 (Invalid DN syntax) for an entry whose DN can't be parsed;
+ *         21 (Invalid syntax) for a password of more than 1024 bytes, and when a file with unusable
+ *         lines can't be rewritten because an entry would not read back as it is written;
+ *         32 (No such object) when the file has no entry "cn=Configuration";
+ *         34 (Invalid DN syntax) for a dn, or an entry of the file, whose DN can't be parsed;
  *         49 (Invalid credentials), without a failure report;
- *         50 (Insufficient access) when a file with unusable lines can't be rewritten;
+ *         50 (Insufficient access) when a file with unusable lines can't be backed up or rewritten;
  *         65 (Object class violation) for an attribute outside of an entry, save one "version" and
  *         one "charset" line that can be used;
  *         80 for a failure of the system (exhausted memory included) or of the library, or when no
  *         file name is known;
+ *         83 (Encoding error) for a password that is too long when it is encoded;
  *         84 (Decoding error) for a stored password that can't be decoded with the key given;
  *         86 for another method;
  *         89 for a null handle;
  *         90 when memory is exhausted before the file is read;
  *         91 (Connection error) when the file is missing or can't be opened;
  *         162 (Unusable input character) for text that is not of the locale's character set.
- *         After a failure the handle is still created and may be bound again.
+ *         After a failure the handle is what it was and may be bound again.
  */
-CFG32_API int cfg_bind_s(CfgHandle *handle, const char *dn, const char *password, int method);
+CFG32_API int cfg_bind_s(CfgHandle *handle, const char *dn, const char *password,
+                         int method) CFG32_NOEXCEPT;
 
 /**
  * Releases a handle, bound or not, with all it owns. Writes nothing: the file on disk is current
@@ -159,25 +180,25 @@ CFG32_API int cfg_bind_s(CfgHandle *handle, const char *dn, const char *password
  *
  * @return 0; 89 for a null handle. The handle is gone in every case.
  */
-CFG32_API int cfg_unbind(CfgHandle *handle);
+CFG32_API int cfg_unbind(CfgHandle *handle) CFG32_NOEXCEPT;
 
 /**
  * Clears the handle's error and frees its failure report, as the other calls do when they begin.
  *
  * @return 0; 89 for a null handle.
  */
-CFG32_API int cfg_reset(CfgHandle *handle);
+CFG32_API int cfg_reset(CfgHandle *handle) CFG32_NOEXCEPT;
 
 /**
  * Reads an option. Does not reset the handle.
  *
  * @param option  CFG_OPT_...; another number returns 0 and writes nothing
  * @param out     int * for a boolean option (set to 1 or 0); char ** for a text, set to a copy for
- *                cfg_memfree(), or to null when there is none; struct aes_key_data ** for
- *                CFG_OPT_KEY_DATA, not a copy
+ *                cfg_memfree(), or to null when there is none or memory is exhausted;
+ *                struct aes_key_data ** for CFG_OPT_KEY_DATA, not a copy
  * @return 0; 89 for a null handle or a null out.
  */
-CFG32_API int cfg_get_option(CfgHandle *handle, int option, void *out);
+CFG32_API int cfg_get_option(CfgHandle *handle, int option, void *out) CFG32_NOEXCEPT;
 
 /**
  * Sets an option. Does not reset the handle and records no failure in it.
@@ -193,7 +214,7 @@ CFG32_API int cfg_get_option(CfgHandle *handle, int option, void *out);
  * @return 0; 21 (Invalid syntax) for a file name that is empty or too long; 89 for a null handle;
  *         90 when memory is exhausted. After a failure the option is unchanged.
  */
-CFG32_API int cfg_set_option(CfgHandle *handle, int option, const void *value);
+CFG32_API int cfg_set_option(CfgHandle *handle, int option, const void *value) CFG32_NOEXCEPT;
 
 /* ---------------------------------------------------------------------------------------------
  * Searching
@@ -217,36 +238,39 @@ CFG32_API int cfg_set_option(CfgHandle *handle, int option, const void *value);
  * @param attrsonly   accepted as in LDAP; the result carries the values either way
  * @param result      set to the first entry found, for cfg_msgfree(), or to null when there is none
  * @return 0, also when nothing was found;
- *         21 for a filter value that the attribute's syntax does not allow;
+ *         18 (Inappropriate matching), 21 or 34 for a filter value that the attribute's syntax does
+ *         not allow;
  *         32 (No such object) when there is no base entry;
- *         34 for a malformed DN;
+ *         34 for a malformed base, or a found entry whose DN has an empty value;
+ *         80 for a failure of the system (exhausted memory included) or of the library;
  *         84 for a password that can't be decoded;
  *         89 for a handle that is null or not bound, or a null base or result;
- *         90 when memory is exhausted;
+ *         90 when memory is exhausted while the result is built;
+ *         162 for a base or filter that is not of the locale's character set;
  *         or what cfg_bind_s() returns when the file has to be read again.
  */
 CFG32_API int cfg_search_s(CfgHandle *handle, const char *base, int scope, const char *filter,
-                           char **attrs, int attrsonly, CfgMessage **result);
+                           char **attrs, int attrsonly, CfgMessage **result) CFG32_NOEXCEPT;
 
 /** Returns the first entry of a result, which is the result itself. */
-CFG32_API CfgMessage *cfg_first_entry(CfgHandle *handle, CfgMessage *result);
+CFG32_API CfgMessage *cfg_first_entry(CfgHandle *handle, CfgMessage *result) CFG32_NOEXCEPT;
 
 /** Returns the entry after this one; null at the end and for a null entry. */
-CFG32_API CfgMessage *cfg_next_entry(CfgHandle *handle, CfgMessage *entry);
+CFG32_API CfgMessage *cfg_next_entry(CfgHandle *handle, CfgMessage *entry) CFG32_NOEXCEPT;
 
 /**
  * Counts the entries from this one to the end of its result.
  *
  * @return the number, 0 for null; 89 for a null handle.
  */
-CFG32_API int cfg_count_entries(CfgHandle *handle, CfgMessage *entry);
+CFG32_API int cfg_count_entries(CfgHandle *handle, CfgMessage *entry) CFG32_NOEXCEPT;
 
 /**
  * Counts the attributes of an entry.
  *
  * @return the number, 0 for null; 89 for a null handle.
  */
-CFG32_API int cfg_count_attributes(CfgHandle *handle, CfgMessage *entry);
+CFG32_API int cfg_count_attributes(CfgHandle *handle, CfgMessage *entry) CFG32_NOEXCEPT;
 
 /**
  * Begins a walk over an entry's attributes.
@@ -266,7 +290,8 @@ CFG32_API int cfg_count_attributes(CfgHandle *handle, CfgMessage *entry);
  * @return the first attribute's name, for cfg_memfree(); null for an entry without attributes
  *         (error 0), for a null entry or cursor (89), or when memory is exhausted (90).
  */
-CFG32_API char *cfg_first_attribute(CfgHandle *handle, CfgMessage *entry, CfgCursor **cursor);
+CFG32_API char *cfg_first_attribute(CfgHandle *handle, CfgMessage *entry,
+                                    CfgCursor **cursor) CFG32_NOEXCEPT;
 
 /**
  * Returns the name of the next attribute, for cfg_memfree().
@@ -276,7 +301,8 @@ CFG32_API char *cfg_first_attribute(CfgHandle *handle, CfgMessage *entry, CfgCur
  * @return null after the last attribute (error 0), for a null cursor (89), or when memory is
  *         exhausted (90).
  */
-CFG32_API char *cfg_next_attribute(CfgHandle *handle, CfgMessage *entry, CfgCursor *cursor);
+CFG32_API char *cfg_next_attribute(CfgHandle *handle, CfgMessage *entry,
+                                   CfgCursor *cursor) CFG32_NOEXCEPT;
 
 /**
  * Returns copies of an attribute's values.
@@ -288,30 +314,31 @@ CFG32_API char *cfg_next_attribute(CfgHandle *handle, CfgMessage *entry, CfgCurs
  *         Pass a handle: without one the values can't be counted, and an attribute with fewer than
  *         89 of them gives null.
  */
-CFG32_API char **cfg_get_values(CfgHandle *handle, CfgMessage *entry, const char *attribute);
+CFG32_API char **cfg_get_values(CfgHandle *handle, CfgMessage *entry,
+                                const char *attribute) CFG32_NOEXCEPT;
 
 /** Returns the number of strings in an array that ends with null; 0 for null. */
-CFG32_API int cfg_count_values(char **values);
+CFG32_API int cfg_count_values(char **values) CFG32_NOEXCEPT;
 
 /** Frees an array of cfg_get_values() and its strings. Null is ignored. */
-CFG32_API void cfg_value_free(char **values);
+CFG32_API void cfg_value_free(char **values) CFG32_NOEXCEPT;
 
 /**
  * Returns an entry's DN in its canonical form, for cfg_memfree().
  *
  * @return null for a node that is not an entry (89), or when memory is exhausted (90).
  */
-CFG32_API char *cfg_get_dn(CfgHandle *handle, CfgMessage *entry);
+CFG32_API char *cfg_get_dn(CfgHandle *handle, CfgMessage *entry) CFG32_NOEXCEPT;
 
 /** Frees a result from its first entry on; decoded passwords are wiped. Null is ignored.
  * @return 0. */
-CFG32_API int cfg_msgfree(CfgMessage *result);
+CFG32_API int cfg_msgfree(CfgMessage *result) CFG32_NOEXCEPT;
 
 /** Frees a cursor. Null is ignored. */
-CFG32_API void cfg_ber_free(CfgCursor *cursor);
+CFG32_API void cfg_ber_free(CfgCursor *cursor) CFG32_NOEXCEPT;
 
 /** Frees a string that a call returned as char *. Null is ignored. */
-CFG32_API void cfg_memfree(void *text);
+CFG32_API void cfg_memfree(void *text) CFG32_NOEXCEPT;
 
 /* ---------------------------------------------------------------------------------------------
  * Failures
@@ -322,10 +349,10 @@ CFG32_API void cfg_memfree(void *text);
  *
  * @return static text, "Unknown error" for a code without one; never null.
  */
-CFG32_API const char *cfg_err2string(int code);
+CFG32_API const char *cfg_err2string(int code) CFG32_NOEXCEPT;
 
 /** Returns the result code of the handle's last call; 89 for a null handle. */
-CFG32_API int cfg_get_errno(CfgHandle *handle);
+CFG32_API int cfg_get_errno(CfgHandle *handle) CFG32_NOEXCEPT;
 
 /**
  * Returns the extended code of the last failure: the library's own finer code (1000 and up) or,
@@ -333,20 +360,20 @@ CFG32_API int cfg_get_errno(CfgHandle *handle);
  *
  * @return 0 after a success; 89 for a null handle.
  */
-CFG32_API int cfg_get_exterror(CfgHandle *handle);
+CFG32_API int cfg_get_exterror(CfgHandle *handle) CFG32_NOEXCEPT;
 
 /** Does nothing; it is there for programs that were written against the LDAP interface. */
-CFG32_API void cfg_perror(CfgHandle *handle, const char *prefix);
+CFG32_API void cfg_perror(CfgHandle *handle, const char *prefix) CFG32_NOEXCEPT;
 
 /**
  * Returns a report of the last failure: the codes with their texts, the file and line, the entry,
  * attribute and value, what the attribute allows, and the causes.
  *
  * @return several lines, owned by the handle until the next call that resets it; null when the
- *         last call succeeded, failed without a report (a wrong password, a null argument), or the
- *         handle is null.
+ *         last call succeeded, failed without a report (a wrong password, a null argument,
+ *         exhausted memory), or the handle is null.
  */
-CFG32_API const char *cfg_dump_exception(CfgHandle *handle);
+CFG32_API const char *cfg_dump_exception(CfgHandle *handle) CFG32_NOEXCEPT;
 
 #ifdef __cplusplus
 }

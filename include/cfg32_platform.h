@@ -26,8 +26,7 @@
  *
  * B is base64 (RFC 4648 section 4, with padding, on one line) of
  *
- *    flags (1 byte)  nonce (12 bytes)  text (as long as the clear text, or shorter)  check (16
- * bytes)
+ *    flags (1 byte), nonce (12 bytes), text (at most as long as the clear text), check (16 bytes)
  *
  * The flags' upper four bits hold the version, 1; bit 0 says that the text was compressed
  * (RFC 1951) before it was sealed; the other bits are 0. The text is sealed with AES-GCM
@@ -131,8 +130,8 @@ CFG32_PLATFORM_API void initLocaleMutex(void) CFG32_PLATFORM_NOEXCEPT;
  * target's directory, readable by nobody but the calling user; it gets owner, group and permission
  * bits, is synced and then takes the target's name by rename(2); the directory is synced last.
  *
- * @param source the file to copy: a regular file, or a symbolic link to one. Opening it never
- * blocks.
+ * @param source the file to copy: a regular file, or a symbolic link to one, opened without ever
+ *               blocking.
  * @param target the copy's name. An existing regular file is replaced, and so is a symbolic link:
  *               the link itself, not the file it points to. Anything else (directory, FIFO, device,
  *               or a link to one) is refused. The target's directory must be readable.
@@ -236,9 +235,9 @@ CFG32_PLATFORM_API struct aes_key_data *aes_key_data_from_bytes(
  *
  * @param path the key file: a regular file, or a symbolic link to one, on which neither its group
  *             nor others have any permission
- * @return the key data, released with aes_key_data_free; null with errno EACCES when group or
- * others have any permission, EINVAL for a null path, a file that is not regular or of another
- *         size, else as open(2) and read(2) set it
+ * @return the key data, released with aes_key_data_free; null with errno EACCES when others have
+ * any permission, EINVAL for a null path, a file that is not regular or of another size, else as
+ *         open(2) and read(2) set it
  */
 CFG32_PLATFORM_API struct aes_key_data *aes_key_data_from_file(const char *path)
     CFG32_PLATFORM_NOEXCEPT;

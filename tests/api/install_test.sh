@@ -14,7 +14,7 @@ test -n "$package"
 PKG_CONFIG_PATH=$(dirname "$package")
 export PKG_CONFIG_PATH
 package_config() {
-    pkg-config --define-variable=prefix="$prefix" "$@" cfg32
+    pkg-config "$@" cfg32
 }
 cd "$scratch"
 printf 'dn: cn=Configuration\nobjectclass: top\n' >oruslapd.conf

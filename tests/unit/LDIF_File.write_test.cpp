@@ -286,6 +286,46 @@ TEST_F(LDIF_File_flush, ValueThatWouldNotReadBackFailsBeforeAFileIsTouched) {
     }
 }
 
+// What a load accepts and a later load would refuse, or read as something else.
+TEST_F(LDIF_File_flush, FileThatWouldNotLoadAgainAsItWasIsLeftAlone) {
+    const struct {
+        const char* why;
+        const char* text;
+        const char* entry;
+    } rows[] = {
+        {"an attribute of the root", "version: 1\n\ndn: cn=a\n\ndn:\nsn: y\n\n", ""},
+        {"a second value of the root's version", "version: 1\n\ndn: cn=a\n\ndn:\ncharset: y\n\n",
+         ""},
+        {"names with leading blanks merge into a continuation",
+         "version: 1\n\ndn: cn=a\n# c\n foo: a\n# d\n foo: b\nsn: 1\n\n", "cn=a"},
+    };
+    for (const auto& row : rows) {
+        SCOPED_TRACE(row.why);
+        const auto file = store(row.text, backup);
+        const LDIF_Exception e = failure_of([&] { file->flush(); });
+        EXPECT_EQ(summary(e), "21/1005 Entry would not read back as it is written");
+        EXPECT_EQ(e.configFile, path);
+        EXPECT_EQ(e.entryDn, row.entry);
+        EXPECT_EQ(folder.read("conf"), row.text);
+        EXPECT_FALSE(folder.has("backup"));
+    }
+}
+
+TEST_F(LDIF_File_flush, FileThatTheLoadWouldSpoilIsLeftAlone) {
+    // The line without a colon counts as a DN line; its entry could not be read back.
+    const char* const text = "version: 1\n\ndn: cn=a\n\ndn=x\nsn: y\n\n";
+    const LDIF_Exception e = failure_of([&] { store(text); });
+    EXPECT_EQ(summary(e), "21/1005 Entry would not read back as it is written");
+    EXPECT_EQ(folder.read("conf"), text);
+}
+
+TEST_F(LDIF_File_flush, NamesWithLeadingBlanksAreWrittenWhereTheyReadBack) {
+    const std::string text = "charset: x\nversion: 1\n\ndn: cn=a\n# c\n foo: a\nsn: 1\n\n";
+    const auto file = store(text);
+    file->flush();
+    EXPECT_EQ(folder.read("conf"), text);
+}
+
 TEST_F(LDIF_File_flush, UnexpectedFailureIsASystemErrorBeforeAFileIsTouched) {
     const auto file = store(content, backup);
     _AttrType failing = *getAttrType("sn");

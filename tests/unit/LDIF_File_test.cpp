@@ -457,6 +457,16 @@ TEST_F(LDIF_File_load, UnchangedFileIsNotReadAgain) {
     EXPECT_EQ(file.root().find(dn_of("cn=Configuration")), entry);
 }
 
+TEST_F(LDIF_File_load, EntryThatCannotBeMergedIsReportedWithItsName) {
+    const LDIF_Exception e = failure_to_load(
+        "version: 1\n\ndn: cn=a\noru-slapdAdminPW: {SHA}x\n\n"
+        "dn: cn=A\noru-slapdAdminPW: {SHA}y\n\n");
+    EXPECT_EQ(e.ldapErr, 84);
+    EXPECT_EQ(e.entryDn, "cn=A");
+    EXPECT_EQ(e.configFile, path);
+    EXPECT_EQ(e.configLine, 8);
+}
+
 TEST_F(LDIF_File_load, TheModificationTimeAloneTellsOfAChangeInPlace) {
     put(valid);
     LDIF_File file(path, "", nullptr);

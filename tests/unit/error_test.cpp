@@ -184,6 +184,12 @@ class error : public testing::Test {
 
 using error_tables = error;
 
+// No exception leaves a call.
+static_assert(
+    noexcept(cfg_init()) && noexcept(cfg_unbind(nullptr)) && noexcept(cfg_reset(nullptr)));
+static_assert(noexcept(cfg_bind_s(nullptr, nullptr, nullptr, 0)));
+static_assert(noexcept(cfg_search_s(nullptr, nullptr, 0, nullptr, nullptr, 0, nullptr)));
+
 TEST_F(error_tables, LdapTableHasItsRowsInTheStoredOrder) {
     size_t row = 0;
     for (const text_row& expected : ldap_rows) {

@@ -21,8 +21,7 @@ constexpr failure not_encoded{83, 1000, "format_password();"};
 constexpr failure left_not_decoded{84, 1000, "unformat_password(left);"};
 constexpr failure right_not_decoded{84, 1000, "unformat_password(right);"};
 
-constexpr int clear_text = 1;         // answer of check_format
-constexpr int scheme_selector = 133;  // for format_password
+constexpr int clear_text = 1;  // answer of check_format
 constexpr long shortest = 1;
 constexpr long longest = 1024;
 
@@ -51,8 +50,8 @@ class decoded_password {
     decoded_password(const LDIF_Value& value, const failure& kind, const throw_site& site = {}) {
         const std::string stored = value.str();
         errno = 0;
-        if (!stored.empty() &&
-            !unformat_password(decoder_input(stored).c_str(), &clear_, value.key, 0)) {
+        if (!stored.empty() && !unformat_password(decoder_input(stored).c_str(), &clear_, value.key,
+                                                  CFG32_PASSWORD_FLAG)) {
             routine_failed(kind, value, stored, site);
         }
     }
@@ -80,8 +79,8 @@ int compare_clear(const char* left, const char* right) {
 std::string encoded(const LDIF_Value& value, const std::string& clear, int length) {
     char buffer[longest] = {};
     errno = 0;
-    if (!format_password(scheme_selector, 0, value.key, clear.c_str(), length, buffer,
-                         sizeof buffer)) {
+    if (!format_password(CFG32_PASSWORD_SELECTOR, CFG32_PASSWORD_FLAG, value.key, clear.c_str(),
+                         length, buffer, sizeof buffer)) {
         routine_failed(not_encoded, value, clear);
     }
     return buffer;

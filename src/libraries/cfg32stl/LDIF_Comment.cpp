@@ -12,7 +12,6 @@ LDIF_Comment& LDIF_Comment::operator+=(const LDIF_Line& line) {
 LDIF_Comment& LDIF_Comment::operator+=(const LDIF_Comment& other) {
     // By position and up to the size of before: a comment may be appended to itself.
     const size_t count = other.lines_.size();
-    lines_.reserve(lines_.size() + count);
     for (size_t i = 0; i < count; ++i) {
         lines_.push_back(other.lines_[i]);
     }

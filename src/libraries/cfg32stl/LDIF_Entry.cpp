@@ -83,7 +83,12 @@ LDIF_Entry& LDIF_Entry::operator+=(LDIF_Entry& child) {
 LDIF_Entry& LDIF_Entry::operator+=(LDIF_Entry&& child) {
     list node;
     node.push_back(std::move(child));
-    return place(node);
+    try {
+        return place(node);
+    } catch (...) {
+        child = std::move(node.front());
+        throw;
+    }
 }
 
 /// Places the one entry of node, whose relative DN is relative to this entry's parent.

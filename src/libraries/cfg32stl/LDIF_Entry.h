@@ -46,7 +46,7 @@ class LDIF_Entry {
     /// not below this entry; the tree is then unchanged.
     virtual LDIF_Entry& operator+=(LDIF_Entry& child);
     LDIF_Entry& operator+=(LDIF_Attribute&& attribute);
-    /// The same without a copy.
+    /// The same without a copy. After a failure the child is what it was.
     LDIF_Entry& operator+=(LDIF_Entry&& child);
 
     /// The entry in file form, without its children.

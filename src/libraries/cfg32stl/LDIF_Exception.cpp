@@ -9,13 +9,13 @@
 #include "cfg32_platform.h"
 #include "failure.h"
 
-bool LDIF_Exception::showStack = true;
-bool LDIF_Exception::showSource = false;
+std::atomic<bool> LDIF_Exception::showStack = true;
+std::atomic<bool> LDIF_Exception::showSource = false;
 
 LDIF_Exception::LDIF_Exception(const char* file, int line, int ldapErr, int extErr, const char* msg)
     : srcFile(file), srcLine(line), msg(msg), ldapErr(ldapErr), extErr(extErr) {}
 
-LDIF_Exception::LDIF_Exception(const LDIF_Exception& e)
+LDIF_Exception::LDIF_Exception(const LDIF_Exception& e, std::unique_ptr<LDIF_Exception> cause)
     : std::exception(e),
       srcFile(e.srcFile),
       srcLine(e.srcLine),
@@ -30,27 +30,20 @@ LDIF_Exception::LDIF_Exception(const LDIF_Exception& e)
       attribute(e.attribute),
       value(e.value),
       attrType(e.attrType),
-      cause(e.cause ? std::make_unique<LDIF_Exception>(*e.cause) : nullptr) {}
+      cause(std::move(cause)) {}
+
+LDIF_Exception::LDIF_Exception(const LDIF_Exception& e)
+    : LDIF_Exception(e, e.cause ? std::make_unique<LDIF_Exception>(*e.cause) : nullptr) {}
 
 LDIF_Exception::LDIF_Exception(const char* file, int line, const LDIF_Exception& e)
     : LDIF_Exception(file, line, LDIF_Exception(e)) {}
 
 LDIF_Exception::LDIF_Exception(const char* file, int line, LDIF_Exception&& e)
-    : std::exception(e),
-      srcFile(file),
-      srcLine(line),
-      msg(e.msg),
-      ldapErr(e.ldapErr),
-      extErr(e.extErr),
-      sysErrno(e.sysErrno),
-      sysErrnoKind(e.sysErrnoKind),
-      configFile(e.configFile),
-      configLine(e.configLine),
-      entryDn(e.entryDn),
-      attribute(e.attribute),
-      value(e.value),
-      attrType(e.attrType),
-      cause(std::make_unique<LDIF_Exception>(std::move(e))) {}
+    : LDIF_Exception(e, nullptr) {
+    srcFile = file;
+    srcLine = line;
+    cause = std::make_unique<LDIF_Exception>(std::move(e));
+}
 
 namespace {
 

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <atomic>
 #include <exception>
 #include <iosfwd>
 #include <memory>
@@ -52,8 +53,12 @@ class LDIF_Exception : public std::exception {
     virtual std::string msgStr() const;
 
     // Process-wide, set through the handle options CFG_OPT_SHOW_STACK and CFG_OPT_SHOW_SOURCE.
-    static bool showStack;   ///< reports show the causes
-    static bool showSource;  ///< str() begins with the source position
+    static std::atomic<bool> showStack;   ///< reports show the causes
+    static std::atomic<bool> showSource;  ///< str() begins with the source position
+
+  private:
+    /// e with another cause.
+    LDIF_Exception(const LDIF_Exception& e, std::unique_ptr<LDIF_Exception> cause);
 };
 
 std::ostream& operator<<(std::ostream& out, const LDIF_Exception& e);

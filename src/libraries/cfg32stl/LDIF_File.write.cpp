@@ -8,6 +8,7 @@
 #include <cerrno>
 
 #include "LDIF_File.h"
+#include "LDIF_Util.h"
 #include "cfg32_platform.h"
 #include "disk.h"
 #include "failure.h"
@@ -23,7 +24,7 @@ constexpr failure no_backup{50, 1004, ""};
 constexpr failure not_opened{50, 1004, ""};
 constexpr failure not_written{80, 1000, "System error writing file"};
 constexpr failure no_status{91, 1003, "_stat()"};
-constexpr failure not_a_line{21, 1005, "Text with a line break or a NUL can't be written"};
+constexpr failure not_readable{21, 1005, "Entry would not read back as it is written"};
 
 constexpr size_t name_buffer_size = 2048;
 
@@ -48,10 +49,33 @@ const char* group_name(gid_t owner, char (&buffer)[name_buffer_size]) {
     return is_known ? record.gr_name : nullptr;
 }
 
-/// True when the text is so many whole lines that each reads back as one.
-bool is_readable(std::string_view text, size_t lines) {
-    return static_cast<size_t>(std::count(text.begin(), text.end(), '\n')) == lines &&
-           text.find('\0') == std::string_view::npos && text.find('\r') == std::string_view::npos;
+/// True when an entry's text is so many lines that each reads back as one.
+bool reads_back(std::string_view text, size_t lines) {
+    if (text.find('\0') != std::string_view::npos || text.find('\r') != std::string_view::npos) {
+        return false;
+    }
+    bool may_be_continued = false;  // comment and blank lines take no continuation
+    for (; !text.empty(); --lines) {
+        const std::string_view line = text.substr(0, text.find('\n'));
+        if (lines == 0 || (may_be_continued && without_leading_space(line).size() < line.size())) {
+            return false;
+        }
+        may_be_continued = !line.empty() && line.front() != '#';
+        text.remove_prefix(std::min(line.size() + 1, text.size()));
+    }
+    return lines == 0;
+}
+
+/// True when the entry is one that a load takes: the root has two attributes at most, and another's
+/// first line is its DN.
+bool can_be_loaded(const LDIF_Entry& entry) {
+    if (!entry.is_root()) {
+        return entry.name() == "dn";
+    }
+    const LDIF_Attributes& attributes = entry.attributes();
+    return std::all_of(attributes.begin(), attributes.end(), [](const LDIF_Attribute& attribute) {
+        return (attribute == "version" || attribute == "charset") && attribute.values().size() == 1;
+    });
 }
 
 }  // namespace
@@ -75,8 +99,9 @@ std::string LDIF_File::text() const {
     for_each_in_preorder(root_, [&](const LDIF_Entry& entry) {
         const size_t begin = out.size();
         entry.append_to(out);
-        if (!is_readable(std::string_view(out).substr(begin), entry.line_count())) {
-            raise_with(not_a_line, {}, [&](LDIF_Exception& e) { e.entryDn = shown(entry.dn()); });
+        if (!can_be_loaded(entry) ||
+            !reads_back(std::string_view(out).substr(begin), entry.line_count())) {
+            raise_with(not_readable, {}, [&](LDIF_Exception& e) { e.entryDn = shown(entry.dn()); });
         }
     });
     trailing_comment_.append_to(out);
@@ -84,6 +109,7 @@ std::string LDIF_File::text() const {
 }
 
 void LDIF_File::back_up() const {
+    // Not the remembered status: what was changed meanwhile is still to be noticed.
     struct stat status;
     if (stat(file_name_.c_str(), &status) != 0) {
         raise_with(no_status_for_backup, {}, name_file_and_errno(errno));
@@ -104,7 +130,11 @@ void LDIF_File::back_up() const {
 void LDIF_File::write(const std::string& content) {
     const mode_t mode = is_loaded_ ? status_.st_mode & 07777 : S_IRUSR | S_IWUSR;
     struct stat status;
-    unique_fd file = open_regular(file_name_.c_str(), status, O_WRONLY | O_CREAT, mode);
+    const char* name = file_name_.c_str();
+    unique_fd file = open_regular(name, status, O_WRONLY);
+    if (!file && errno == ENOENT) {
+        file = open_regular(name, status, O_WRONLY | O_CREAT, mode);
+    }
     if (!file) {
         const int error = errno;
         raise_with(not_opened, formatted("Unable to open: \"%s\"", file_name_),

@@ -29,10 +29,7 @@ constexpr size_t longest_scan = 16;
 
 LDIF_Value::LDIF_Value(const _AttrType* type, const char* text, aes_key_data* key)
     : attrType(type), key(key) {
-    if (!text) {
-        raise_with(no_text, {}, [&](LDIF_Exception& e) { e.attrType = type; });
-    }
-    check(text);
+    text ? check(text) : raise_with(no_text, {}, [&](LDIF_Exception& e) { e.attrType = type; });
 }
 
 LDIF_Value::LDIF_Value(const _AttrType* type, const std::string& text, aes_key_data* key)

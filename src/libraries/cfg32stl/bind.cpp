@@ -32,7 +32,7 @@ void require_file_name(CfgHandle& handle) {
 
 }  // namespace
 
-int cfg_bind_s(CfgHandle* handle, const char* dn, const char* password, int method) {
+int cfg_bind_s(CfgHandle* handle, const char* dn, const char* password, int method) noexcept {
     return handle_call(handle, "cfg_bind_s()", [&]() -> int {
         require_file_name(*handle);
         if (method != CFG_AUTH_SIMPLE) {

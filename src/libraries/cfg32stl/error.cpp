@@ -46,13 +46,13 @@ const char* cfg_text(int code) {
 
 }  // namespace
 
-const char* cfg_err2string(int code) {
+const char* cfg_err2string(int code) noexcept {
     return code <= last_ldap_code ? ldap_text(code) : cfg_text(code);
 }
 
-int cfg_get_errno(CfgHandle* handle) { return handle ? handle->err : CFG_PARAM_ERROR; }
+int cfg_get_errno(CfgHandle* handle) noexcept { return handle ? handle->err : CFG_PARAM_ERROR; }
 
-int cfg_get_exterror(CfgHandle* handle) {
+int cfg_get_exterror(CfgHandle* handle) noexcept {
     if (!handle) {
         return CFG_PARAM_ERROR;
     }
@@ -60,9 +60,9 @@ int cfg_get_exterror(CfgHandle* handle) {
     return e && e->extErr != 0 ? e->extErr : handle->err;
 }
 
-void cfg_perror(CfgHandle*, const char*) {}
+void cfg_perror(CfgHandle*, const char*) noexcept {}
 
-const char* cfg_dump_exception(CfgHandle* handle) {
+const char* cfg_dump_exception(CfgHandle* handle) noexcept {
     if (!handle) {
         return nullptr;
     }

@@ -7,7 +7,7 @@
 #include <new>
 #include <utility>
 
-int cfg_reset(CfgHandle* handle) {
+int cfg_reset(CfgHandle* handle) noexcept {
     if (!handle) {
         return CFG_PARAM_ERROR;
     }

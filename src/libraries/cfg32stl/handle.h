@@ -17,7 +17,7 @@ struct CfgHandle {
     LDIF_File* file;            ///< the loaded file, null until bound
     LDIF_Exception* exception;  ///< of the last call, null if none
     char* dumpText;             ///< cached by cfg_dump_exception()
-    char* treeText;             ///< cached by cfg_tree_view()
+    char* treeText;             ///< cached drawing of the entry tree
     aes_key_data* keyData;      ///< not owned
 };
 static_assert(sizeof(CfgHandle) == 64);
@@ -71,5 +71,5 @@ int bound_call(CfgHandle* handle, const char* call, Operation operation,
 }  // namespace cfg32
 
 /// The default configuration file, below the server's installation directory: text in a static
-/// buffer, or null when the directory is unknown or its name is too long.
+/// buffer of the thread, or null when the directory is unknown or its name is too long.
 char* getDefaultConfigFilename();

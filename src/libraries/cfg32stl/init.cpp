@@ -8,7 +8,7 @@
 #include "cfg32_platform.h"
 #include "handle.h"
 
-CfgHandle* cfg_init() {
+CfgHandle* cfg_init() noexcept {
     auto* handle = static_cast<CfgHandle*>(calloc(1, sizeof(CfgHandle)));
     if (!handle) {
         return nullptr;
@@ -26,7 +26,7 @@ CfgHandle* cfg_init() {
 }
 
 char* getDefaultConfigFilename() {
-    static char name[512];
+    static thread_local char name[512];
     char* installation = getNUVInstallPath();
     if (!installation) {
         return nullptr;

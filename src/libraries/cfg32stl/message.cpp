@@ -24,12 +24,15 @@ std::nullptr_t fail(CfgHandle* handle, int code) {
 
 char* copy_of(CfgHandle* handle, const char* text) {
     char* copy = strdup(text);
-    return copy ? copy : fail(handle, CFG_NO_MEMORY);
+    if (!copy) {
+        fail(handle, CFG_NO_MEMORY);
+    }
+    return copy;
 }
 
 CfgMessage* find_attribute(CfgMessage* entry, const char* name) {
     CfgMessage* attribute = entry->child;
-    while (attribute && strcasecmp(attribute->text, name) != 0) {
+    while (attribute && (!attribute->text || strcasecmp(attribute->text, name) != 0)) {
         attribute = attribute->next;
     }
     return attribute;
@@ -49,19 +52,28 @@ int copy_values(const CfgMessage* value, int count, char** values) {
     return CFG_SUCCESS;
 }
 
+/// Wipes the copies of passwords, which nobody else will.
+void wipe_secrets(const CfgMessage* value, char** values) {
+    for (char** copy = values; *copy; ++copy, value = value->next) {
+        if (value->is_secret) {
+            explicit_bzero(*copy, strlen(*copy));
+        }
+    }
+}
+
 }  // namespace
 
-CfgMessage* cfg_first_entry(CfgHandle* handle, CfgMessage* result) {
+CfgMessage* cfg_first_entry(CfgHandle* handle, CfgMessage* result) noexcept {
     cfg_reset(handle);
     return result;
 }
 
-CfgMessage* cfg_next_entry(CfgHandle* handle, CfgMessage* entry) {
+CfgMessage* cfg_next_entry(CfgHandle* handle, CfgMessage* entry) noexcept {
     cfg_reset(handle);
     return entry ? entry->next : nullptr;
 }
 
-int cfg_count_entries(CfgHandle* handle, CfgMessage* node) {
+int cfg_count_entries(CfgHandle* handle, CfgMessage* node) noexcept {
     if (cfg_reset(handle) != CFG_SUCCESS) {
         return CFG_PARAM_ERROR;
     }
@@ -72,11 +84,11 @@ int cfg_count_entries(CfgHandle* handle, CfgMessage* node) {
     return count;
 }
 
-int cfg_count_attributes(CfgHandle* handle, CfgMessage* entry) {
+int cfg_count_attributes(CfgHandle* handle, CfgMessage* entry) noexcept {
     return cfg_count_entries(handle, entry ? entry->child : nullptr);
 }
 
-char* cfg_first_attribute(CfgHandle* handle, CfgMessage* entry, CfgCursor** cursor) {
+char* cfg_first_attribute(CfgHandle* handle, CfgMessage* entry, CfgCursor** cursor) noexcept {
     cfg_reset(handle);
     if (!cursor) {
         return fail(handle, CFG_PARAM_ERROR);
@@ -101,7 +113,7 @@ char* cfg_first_attribute(CfgHandle* handle, CfgMessage* entry, CfgCursor** curs
     return name;
 }
 
-char* cfg_next_attribute(CfgHandle* handle, CfgMessage*, CfgCursor* cursor) {
+char* cfg_next_attribute(CfgHandle* handle, CfgMessage*, CfgCursor* cursor) noexcept {
     cfg_reset(handle);
     if (!cursor) {
         return fail(handle, CFG_PARAM_ERROR);
@@ -114,7 +126,7 @@ char* cfg_next_attribute(CfgHandle* handle, CfgMessage*, CfgCursor* cursor) {
     return has_name ? copy_of(handle, cursor->attribute->text) : nullptr;
 }
 
-char** cfg_get_values(CfgHandle* handle, CfgMessage* entry, const char* name) {
+char** cfg_get_values(CfgHandle* handle, CfgMessage* entry, const char* name) noexcept {
     cfg_reset(handle);
     if (!entry || !name) {
         return fail(handle, CFG_PARAM_ERROR);
@@ -133,13 +145,14 @@ char** cfg_get_values(CfgHandle* handle, CfgMessage* entry, const char* name) {
         return fail(handle, CFG_NO_MEMORY);
     }
     if (const int code = copy_values(attribute->child, count, values); code != CFG_SUCCESS) {
+        wipe_secrets(attribute->child, values);
         cfg_value_free(values);
         return fail(handle, code);
     }
     return values;
 }
 
-int cfg_count_values(char** values) {
+int cfg_count_values(char** values) noexcept {
     int count = 0;
     while (values && values[count]) {
         ++count;
@@ -147,14 +160,14 @@ int cfg_count_values(char** values) {
     return count;
 }
 
-void cfg_value_free(char** values) {
+void cfg_value_free(char** values) noexcept {
     for (char** value = values; value && *value; ++value) {
         free(*value);
     }
     free(values);
 }
 
-char* cfg_get_dn(CfgHandle* handle, CfgMessage* entry) {
+char* cfg_get_dn(CfgHandle* handle, CfgMessage* entry) noexcept {
     cfg_reset(handle);
     if (!entry || !entry->text || entry->kind != entry_message) {
         return fail(handle, CFG_PARAM_ERROR);
@@ -162,7 +175,7 @@ char* cfg_get_dn(CfgHandle* handle, CfgMessage* entry) {
     return copy_of(handle, entry->text);
 }
 
-int cfg_msgfree(CfgMessage* node) {
+int cfg_msgfree(CfgMessage* node) noexcept {
     // Along the chain by a loop, down by recursion: a result is only three levels deep.
     while (node) {
         CfgMessage* next = node->next;
@@ -177,6 +190,6 @@ int cfg_msgfree(CfgMessage* node) {
     return CFG_SUCCESS;
 }
 
-void cfg_ber_free(CfgCursor* cursor) { free(cursor); }
+void cfg_ber_free(CfgCursor* cursor) noexcept { free(cursor); }
 
-void cfg_memfree(void* text) { free(text); }
+void cfg_memfree(void* text) noexcept { free(text); }

@@ -1,6 +1,8 @@
 // The options of a handle.
 
 #include <algorithm>
+#include <atomic>
+#include <cerrno>
 #include <cstdlib>
 #include <cstring>
 #include <iterator>
@@ -14,9 +16,9 @@ namespace {
 /// Where an option is kept: exactly one of the members is set.
 struct option {
     int id;
-    unsigned int flag;       ///< a bit of the handle's flags
-    bool* process_flag;      ///< shared by all handles
-    char* CfgHandle::*text;  ///< a file name
+    unsigned int flag;                ///< a bit of the handle's flags
+    std::atomic<bool>* process_flag;  ///< shared by all handles
+    char* CfgHandle::*text;           ///< a file name
     aes_key_data* CfgHandle::*key;
 };
 
@@ -54,7 +56,7 @@ int set_file_name(char*& name, const char* text) {
         name = copy;
         return CFG_SUCCESS;
     } catch (const LDIF_Exception& e) {
-        return e.ldapErr;
+        return e.sysErrno == ENOMEM ? CFG_NO_MEMORY : e.ldapErr;
     } catch (...) {
         return CFG_NO_MEMORY;
     }
@@ -62,7 +64,7 @@ int set_file_name(char*& name, const char* text) {
 
 }  // namespace
 
-int cfg_get_option(CfgHandle* handle, int id, void* out) {
+int cfg_get_option(CfgHandle* handle, int id, void* out) noexcept {
     if (!handle || !out) {
         return CFG_PARAM_ERROR;
     }
@@ -76,13 +78,14 @@ int cfg_get_option(CfgHandle* handle, int id, void* out) {
     } else if (row->key) {
         *static_cast<aes_key_data**>(out) = handle->*row->key;
     } else {
-        const bool is_on = row->process_flag ? *row->process_flag : handle->flags & row->flag;
+        const bool is_on =
+            row->process_flag ? row->process_flag->load() : (handle->flags & row->flag) != 0;
         *static_cast<int*>(out) = is_on ? 1 : 0;
     }
     return CFG_SUCCESS;
 }
 
-int cfg_set_option(CfgHandle* handle, int id, const void* value) {
+int cfg_set_option(CfgHandle* handle, int id, const void* value) noexcept {
     if (!handle) {
         return CFG_PARAM_ERROR;
     }

@@ -80,8 +80,8 @@ char* decoded(const LDIF_Value& value, aes_key_data* key, const char* dn, const 
     const std::string stored = value.str();
     const std::string input = stored.empty() ? stored : decoder_input(stored);
     char* clear = nullptr;
-    if (input.size() >= decode_buffer_size || !unformat_password(input.c_str(), &clear, key, 0) ||
-        !clear) {
+    if (input.size() >= decode_buffer_size ||
+        !unformat_password(input.c_str(), &clear, key, CFG32_PASSWORD_FLAG) || !clear) {
         raise_with(not_decoded, {}, [&](LDIF_Exception& e) {
             e.value = stored;
             e.entryDn = dn;
@@ -172,7 +172,7 @@ int build(const result_builder& builder, const LDIF_Search_Results& found, CfgMe
 }  // namespace
 
 int cfg_search_s(CfgHandle* handle, const char* base, int scope, const char* filter, char** attrs,
-                 int attrsonly, CfgMessage** result) {
+                 int attrsonly, CfgMessage** result) noexcept {
     return bound_call(handle, "cfg_search_s()", [&](LDIF_File& file) -> int {
         if (!result || !base) {
             return CFG_PARAM_ERROR;

@@ -6,7 +6,7 @@
 #include "LDIF_File.h"
 #include "handle.h"
 
-int cfg_unbind(CfgHandle* handle) {
+int cfg_unbind(CfgHandle* handle) noexcept {
     if (cfg_reset(handle) != CFG_SUCCESS) {
         return CFG_PARAM_ERROR;
     }

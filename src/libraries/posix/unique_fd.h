@@ -13,7 +13,10 @@ class unique_fd {
     unique_fd() = default;
     explicit unique_fd(int fd) : fd_(fd) {}
     unique_fd(unique_fd&& other) noexcept : fd_(std::exchange(other.fd_, -1)) {}
-    unique_fd& operator=(unique_fd&&) = delete;
+    unique_fd& operator=(unique_fd&& other) noexcept {
+        std::swap(fd_, other.fd_);
+        return *this;
+    }
     ~unique_fd() {
         const int saved = errno;
         close();
