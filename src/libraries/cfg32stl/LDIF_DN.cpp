@@ -110,7 +110,7 @@ std::string quoted_text(const std::string& value) {
 /// Whitespace at either end is written in hexadecimal, whitespace in the middle as it is.
 std::string plain_text(const std::string& value) {
     size_t begin = value.size();  // of the first character that is not whitespace
-    size_t end = value.size();    // of the last one
+    size_t end = begin;           // of the last one
     for (size_t at = 0; at < value.size();) {
         const character next = first_character(std::string_view(value).substr(at));
         const bool is_whitespace = next.is_valid && is_space(next.code);

@@ -173,6 +173,7 @@ int build(const result_builder& builder, const LDIF_Search_Results& found, CfgMe
 
 int cfg_search_s(CfgHandle* handle, const char* base, int scope, const char* filter, char** attrs,
                  int attrsonly, CfgMessage** result) noexcept {
+    // cppcheck-suppress throwInNoexceptFunction  ; bound_call lets nothing through
     return bound_call(handle, "cfg_search_s()", [&](LDIF_File& file) -> int {
         if (!result || !base) {
             return CFG_PARAM_ERROR;

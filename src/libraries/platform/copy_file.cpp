@@ -38,7 +38,8 @@ bool split_target(const char* target, target_name& name) {
     if (*name.base == '\0')
         return fail(*target == '\0' ? ENOENT : EISDIR);
     if (slash == nullptr) {
-        std::strcpy(name.directory.data(), ".");
+        name.directory[0] = '.';
+        name.directory[1] = '\0';
         return true;
     }
     // The slash stays: it makes the root directory "/" and does no harm elsewhere.

@@ -15,6 +15,7 @@ using bytes_view = std::span<const unsigned char>;
 template <std::size_t Capacity>
 class wiped_buffer {
   public:
+    // cppcheck-suppress uninitMemberVar  ; written before it is read, and large
     wiped_buffer() = default;
     wiped_buffer(const wiped_buffer&) = delete;
     wiped_buffer& operator=(const wiped_buffer&) = delete;
