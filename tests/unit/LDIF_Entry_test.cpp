@@ -9,6 +9,7 @@
 #include <vector>
 
 #include "failures.h"
+#include "lines.h"
 
 using namespace cfg32::tests;
 using testing::ElementsAre;
@@ -18,23 +19,6 @@ namespace {
 LDIF_DN dn_of(const std::string& text) { return LDIF_DN(cisString(text)); }
 
 LDIF_Entry entry_of(const std::string& dn) { return LDIF_Entry(dn_of(dn)); }
-
-LDIF_Line line_of(int type, const std::string& attribute, const std::string& value) {
-    LDIF_Line line;
-    line.type = type;
-    line.attribute = attribute;
-    line.value = value;
-    line.hasSeparator = 1;
-    return line;
-}
-
-LDIF_Comment comment_of(const std::vector<std::string>& lines) {
-    LDIF_Comment comment;
-    for (const std::string& text : lines) {
-        comment += line_of(text.empty() ? LDIF_Line::blankLine : LDIF_Line::comment, "", text);
-    }
-    return comment;
-}
 
 LDIF_Attribute attribute_of(const std::string& name, const std::string& value) {
     return LDIF_Attribute(nullptr, name, value);
