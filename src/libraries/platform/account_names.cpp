@@ -29,8 +29,9 @@ bool find_number(int (*lookup)(const char*, Record*, char*, std::size_t, Record*
         Record record;
         Record* found = nullptr;
         const int error = lookup(name, &record, buffer.get(), size, &found);
-        if (error == ERANGE)
+        if (error == ERANGE) {
             continue;
+        }
         if (found == nullptr) {
             // POSIX asks for 0 when there is no such name; ENOENT, ESRCH, EBADF and EPERM are seen
             // as well, see getpwnam(3).

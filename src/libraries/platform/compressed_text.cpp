@@ -27,8 +27,9 @@ void* allocate_block(void*, uInt count, uInt size) {
     const std::size_t total = block_header + std::size_t{count} * size;
     // Zeroed: zlib's compressor looks at its hash chains before it has filled them.
     auto* block = static_cast<unsigned char*>(std::calloc(1, total));
-    if (block == nullptr)
+    if (block == nullptr) {
         return nullptr;
+    }
     *reinterpret_cast<std::size_t*>(block) = total;
     return block + block_header;
 }
@@ -50,8 +51,9 @@ std::optional<std::size_t> run_whole(z_stream& stream, bytes_view in,
     const bool complete = Run(&stream, Z_FINISH) == Z_STREAM_END && stream.avail_in == 0;
     const std::size_t left = stream.avail_out;
     End(&stream);
-    if (!complete)
+    if (!complete) {
         return std::nullopt;
+    }
     return out.size() - left;
 }
 
@@ -76,15 +78,17 @@ z_stream wiping_stream() {
 std::optional<std::size_t> compress_text(bytes_view text, std::span<unsigned char> out) {
     z_stream stream = wiping_stream();
     if (deflateInit2(&stream, Z_BEST_COMPRESSION, Z_DEFLATED, raw_deflate * compress_window,
-                     compress_memory, Z_DEFAULT_STRATEGY) != Z_OK)
+                     compress_memory, Z_DEFAULT_STRATEGY) != Z_OK) {
         return std::nullopt;
+    }
     return run_whole<&deflate, &deflateEnd>(stream, text, out);
 }
 
 std::optional<std::size_t> expand_text(bytes_view compressed, std::span<unsigned char> out) {
     z_stream stream = wiping_stream();
-    if (inflateInit2(&stream, raw_deflate * expand_window) != Z_OK)
+    if (inflateInit2(&stream, raw_deflate * expand_window) != Z_OK) {
         return std::nullopt;
+    }
     return run_whole<&inflate, &inflateEnd>(stream, compressed, out);
 }
 

@@ -35,8 +35,9 @@ struct target_name {
 bool split_target(const char* target, target_name& name) {
     const char* slash = std::strrchr(target, '/');
     name.base = slash == nullptr ? target : slash + 1;
-    if (*name.base == '\0')
+    if (*name.base == '\0') {
         return fail(*target == '\0' ? ENOENT : EISDIR);
+    }
     if (slash == nullptr) {
         name.directory[0] = '.';
         name.directory[1] = '\0';
@@ -44,8 +45,9 @@ bool split_target(const char* target, target_name& name) {
     }
     // The slash stays: it makes the root directory "/" and does no harm elsewhere.
     const std::size_t length = static_cast<std::size_t>(slash - target) + 1;
-    if (length >= name.directory.size())
+    if (length >= name.directory.size()) {
         return fail(ENAMETOOLONG);
+    }
     std::memcpy(name.directory.data(), target, length);
     name.directory[length] = '\0';
     return true;
@@ -54,10 +56,12 @@ bool split_target(const char* target, target_name& name) {
 // rename(2) would replace a device or a FIFO as readily as a file, and a name of the source itself.
 bool may_replace(const char* target, const struct stat& source) {
     struct stat status;
-    if (::stat(target, &status) != 0)
+    if (::stat(target, &status) != 0) {
         return errno == ENOENT;
-    if (S_ISDIR(status.st_mode))
+    }
+    if (S_ISDIR(status.st_mode)) {
         return fail(EISDIR);
+    }
     const bool same = status.st_dev == source.st_dev && status.st_ino == source.st_ino;
     return !same && S_ISREG(status.st_mode) ? true : fail(EINVAL);
 }
@@ -65,8 +69,9 @@ bool may_replace(const char* target, const struct stat& source) {
 bool write_all(int fd, const char* data, std::size_t size) {
     while (size > 0) {
         const ssize_t written = retry_interrupted([=] { return ::write(fd, data, size); });
-        if (written < 0)
+        if (written < 0) {
             return false;
+        }
         data += written;
         size -= static_cast<std::size_t>(written);
     }
@@ -84,10 +89,12 @@ bool copy_content(int from, int to) {
     for (;;) {
         const ssize_t got =
             retry_interrupted([&] { return ::read(from, buffer.data(), buffer.size()); });
-        if (got <= 0)
+        if (got <= 0) {
             return got == 0;
-        if (!write_all(to, buffer.data(), static_cast<std::size_t>(got)))
+        }
+        if (!write_all(to, buffer.data(), static_cast<std::size_t>(got))) {
             return false;
+        }
     }
 }
 
@@ -100,14 +107,18 @@ bool drop_inherited_access_list(int fd) {
 
 bool give_owner(int fd, uid_t owner, gid_t group) {
     struct stat status;
-    if (::fstat(fd, &status) != 0)
+    if (::fstat(fd, &status) != 0) {
         return false;
-    if (owner == status.st_uid)
+    }
+    if (owner == status.st_uid) {
         owner = unchanged_owner;
-    if (group == status.st_gid)
+    }
+    if (group == status.st_gid) {
         group = unchanged_group;
-    if (owner == unchanged_owner && group == unchanged_group)
+    }
+    if (owner == unchanged_owner && group == unchanged_group) {
         return true;
+    }
     return ::fchown(fd, owner, group) == 0;
 }
 
@@ -126,23 +137,28 @@ bool sync_directory(int directory) {
 
 bool copy_file(const char* source, const char* target, const char* owner, const char* group,
                mode_t mode) {
-    if (source == nullptr || target == nullptr)
+    if (source == nullptr || target == nullptr) {
         return fail(EINVAL);
+    }
     uid_t owner_id;
     gid_t group_id;
     target_name name;
-    if (!find_owner(owner, owner_id) || !find_group(group, group_id) || !split_target(target, name))
+    if (!find_owner(owner, owner_id) || !find_group(group, group_id) ||
+        !split_target(target, name)) {
         return false;
+    }
 
     struct stat source_status;
     const unique_fd from = open_regular(source, source_status);
-    if (!from || !may_replace(target, source_status))
+    if (!from || !may_replace(target, source_status)) {
         return false;
+    }
     // Opened before anything is written, so that the sync at the end can't fail for lack of it.
     const unique_fd directory(retry_interrupted(
         [&name] { return ::open(name.directory.data(), O_RDONLY | O_DIRECTORY | O_CLOEXEC); }));
-    if (!directory)
+    if (!directory) {
         return false;
+    }
 
     temporary_file copy(directory.get());
     return copy && copy_content(from.get(), copy.fd()) &&

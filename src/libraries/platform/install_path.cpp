@@ -11,7 +11,8 @@ constexpr const char* configured_path = CFG32_INSTALL_PATH;
 
 char* getNUVInstallPath() noexcept {
     const char* path = secure_getenv("NUV_INSTALL_PATH");
-    if (path == nullptr || *path == '\0')
+    if (path == nullptr || *path == '\0') {
         path = configured_path;
+    }
     return *path == '\0' ? nullptr : strdup(path);
 }

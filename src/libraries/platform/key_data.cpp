@@ -26,10 +26,12 @@ bool read_content(int fd, key_file_content& content) {
     while (size < content.capacity()) {
         const ssize_t got = retry_interrupted(
             [&] { return ::read(fd, content.data() + size, content.capacity() - size); });
-        if (got < 0)
+        if (got < 0) {
             return false;
-        if (got == 0)
+        }
+        if (got == 0) {
             break;
+        }
         size += static_cast<std::size_t>(got);
     }
     content.resize(size);
@@ -49,36 +51,42 @@ using namespace cfg32;
 using namespace cfg32::platform;
 
 aes_key_data* aes_key_data_from_bytes(const unsigned char* bytes, size_t size) noexcept {
-    if (bytes == nullptr || !is_key_size(size))
+    if (bytes == nullptr || !is_key_size(size)) {
         return fail(EINVAL);
+    }
     auto* key = static_cast<aes_key_data*>(std::calloc(1, sizeof(aes_key_data)));
-    if (key == nullptr)
+    if (key == nullptr) {
         return fail(ENOMEM);
+    }
     key->size = size;
     std::memcpy(key->bytes, bytes, size);
     return key;
 }
 
 aes_key_data* aes_key_data_from_file(const char* path) noexcept {
-    if (path == nullptr)
+    if (path == nullptr) {
         return fail(EINVAL);
+    }
     struct stat status;
     const unique_fd fd = open_regular(path, status);
     if (!fd) {
         // A directory is just one more thing that is no key file.
         return errno == EISDIR ? fail(EINVAL) : nullptr;
     }
-    if ((status.st_mode & access_of_others) != 0)
+    if ((status.st_mode & access_of_others) != 0) {
         return fail(EACCES);
+    }
     key_file_content content;
-    if (!read_content(fd.get(), content))
+    if (!read_content(fd.get(), content)) {
         return nullptr;
+    }
     return aes_key_data_from_bytes(content.data(), content.size());
 }
 
 void aes_key_data_free(aes_key_data* key) noexcept {
-    if (key == nullptr)
+    if (key == nullptr) {
         return;
+    }
     OPENSSL_cleanse(key, sizeof *key);
     std::free(key);
 }

@@ -32,8 +32,9 @@ bool has_nul(bytes_view bytes) { return std::find(bytes.begin(), bytes.end(), 0)
 bool seal_as_text(const seal_context& context, std::uint8_t flags, bytes_view plain, char* out) {
     unsigned char payload[largest_payload];
     const std::span<unsigned char> sealed(payload, plain.size() + seal_overhead);
-    if (!seal_bytes(context, flags, plain, sealed))
+    if (!seal_bytes(context, flags, plain, sealed)) {
         return false;
+    }
     out = std::copy(context.label.begin(), context.label.end(), out);
     *base64_encode(sealed, out) = '\0';
     return true;
@@ -42,16 +43,19 @@ bool seal_as_text(const seal_context& context, std::uint8_t flags, bytes_view pl
 bool encode(const seal_context& context, bytes_view clear, std::span<char> out) {
     const std::size_t fixed = context.label.size() + 1;
     const std::size_t payload_room = base64_room(out.size() - std::min(out.size(), fixed));
-    if (payload_room < seal_overhead)
+    if (payload_room < seal_overhead) {
         return false;
+    }
     const std::size_t room = payload_room - seal_overhead;
-    if (clear.size() <= room)
+    if (clear.size() <= room) {
         return seal_as_text(context, format_version, clear, out.data());
+    }
 
     clear_text shorter;
     const auto size = compress_text(clear, {shorter.data(), shorter.capacity()});
-    if (!size || *size > room)
+    if (!size || *size > room) {
         return false;
+    }
     shorter.resize(*size);
     return seal_as_text(context, format_version | compressed_flag, shorter.view(), out.data());
 }
@@ -71,15 +75,18 @@ bool expand(bytes_view compressed, clear_text& clear) {
 bool decode(const seal_context& context, std::string_view armored, clear_text& clear) {
     unsigned char payload[largest_payload];
     const auto size = base64_decode(armored, payload);
-    if (!size || *size < seal_overhead)
+    if (!size || *size < seal_overhead) {
         return false;
+    }
     clear_text plain;
     plain.resize(*size - seal_overhead);
     std::uint8_t flags = 0;
-    if (!unseal_bytes(context, {payload, *size}, flags, {plain.data(), plain.size()}))
+    if (!unseal_bytes(context, {payload, *size}, flags, {plain.data(), plain.size()})) {
         return false;
-    if ((flags & ~compressed_flag) != format_version)
+    }
+    if ((flags & ~compressed_flag) != format_version) {
         return false;
+    }
     const bool done = (flags & compressed_flag) != 0 ? expand(plain.view(), clear)
                                                      : copy_text(plain.view(), clear);
     return done && !has_nul(clear.view());
@@ -98,18 +105,21 @@ seal_context encryption(const password_scheme& scheme, const aes_key_data& key) 
 }  // namespace
 
 bool encode_password(bytes_view clear, const aes_key_data* key, std::span<char> out) {
-    if (clear.size() > CFG32_PASSWORD_MAX || has_nul(clear))
+    if (clear.size() > CFG32_PASSWORD_MAX || has_nul(clear)) {
         return false;
-    if (key == nullptr)
+    }
+    if (key == nullptr) {
         return encode(masking, clear, out);
+    }
     const password_scheme* scheme = scheme_for_key(key->size);
     return scheme != nullptr && encode(encryption(*scheme, *key), clear, out);
 }
 
 bool decode_password(std::string_view encoded, const aes_key_data* key, clear_text& clear) {
     const password_scheme* scheme = scheme_of(encoded);
-    if (scheme == nullptr)
+    if (scheme == nullptr) {
         return unmask(encoded, clear);
+    }
     const std::string_view rest = encoded.substr(scheme->tag.size());
     switch (scheme->kind) {
         case scheme_kind::masked:

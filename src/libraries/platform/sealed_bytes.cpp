@@ -57,8 +57,9 @@ cipher_context start(const seal_context& context, const unsigned char* nonce, st
     if (!cipher ||
         EVP_CipherInit_ex(cipher.get(), type, nullptr, context.key.data(), nonce, way) != 1 ||
         !update(cipher.get(), nullptr, context.label.data(), context.label.size()) ||
-        !update(cipher.get(), nullptr, &flags, sizeof flags))
+        !update(cipher.get(), nullptr, &flags, sizeof flags)) {
         return nullptr;
+    }
     return cipher;
 }
 
@@ -67,15 +68,17 @@ cipher_context start(const seal_context& context, const unsigned char* nonce, st
 bool seal_bytes(const seal_context& context, std::uint8_t flags, bytes_view plain,
                 std::span<unsigned char> sealed) {
     const error_queue_guard errors;
-    if (sealed.size() != plain.size() + seal_overhead)
+    if (sealed.size() != plain.size() + seal_overhead) {
         return false;
+    }
     unsigned char* const nonce = sealed.data() + 1;
     unsigned char* const text = nonce + seal_nonce_size;
     unsigned char* const tag = text + plain.size();
 
     sealed[0] = flags;
-    if (RAND_bytes(nonce, seal_nonce_size) != 1)
+    if (RAND_bytes(nonce, seal_nonce_size) != 1) {
         return false;
+    }
     const cipher_context cipher = start(context, nonce, flags, encrypt);
     int rest = 0;
     return cipher && (plain.empty() || update(cipher.get(), text, plain.data(), plain.size())) &&
@@ -86,8 +89,9 @@ bool seal_bytes(const seal_context& context, std::uint8_t flags, bytes_view plai
 bool unseal_bytes(const seal_context& context, bytes_view sealed, std::uint8_t& flags,
                   std::span<unsigned char> plain) {
     const error_queue_guard errors;
-    if (sealed.size() != plain.size() + seal_overhead)
+    if (sealed.size() != plain.size() + seal_overhead) {
         return false;
+    }
     const unsigned char* const nonce = sealed.data() + 1;
     const unsigned char* const text = nonce + seal_nonce_size;
     // OpenSSL takes the tag through a pointer to mutable bytes and doesn't change them.

@@ -39,8 +39,9 @@ temporary_file::~temporary_file() {
 int temporary_file::create() {
     for (int attempt = 0; attempt < create_attempts && choose_name(); ++attempt) {
         const int fd = create_exclusively(directory_, name_.data());
-        if (fd >= 0 || errno != EEXIST)
+        if (fd >= 0 || errno != EEXIST) {
             return fd;
+        }
     }
     return -1;
 }
@@ -49,8 +50,9 @@ bool temporary_file::choose_name() {
     std::uint64_t random = 0;
     const auto got =
         retry_interrupted([&random] { return ::getrandom(&random, sizeof random, 0); });
-    if (got != static_cast<ssize_t>(sizeof random))
+    if (got != static_cast<ssize_t>(sizeof random)) {
         return false;
+    }
     std::snprintf(name_.data(), name_.size(), ".cfg32-%016llx.tmp",
                   static_cast<unsigned long long>(random));
     return true;
@@ -58,8 +60,9 @@ bool temporary_file::choose_name() {
 
 bool temporary_file::move_to(const char* name) {
     // Some file systems report a failed write no earlier than at the close.
-    if (!fd_.close() || ::renameat(directory_, name_.data(), directory_, name) != 0)
+    if (!fd_.close() || ::renameat(directory_, name_.data(), directory_, name) != 0) {
         return false;
+    }
     named_ = false;
     return true;
 }

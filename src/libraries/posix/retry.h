@@ -8,8 +8,9 @@ namespace cfg32 {
 template <typename Call>
 auto retry_interrupted(Call call) {
     auto result = call();
-    while (result < 0 && errno == EINTR)
+    while (result < 0 && errno == EINTR) {
         result = call();
+    }
     return result;
 }
 
