@@ -1,6 +1,5 @@
 /* cfg_msgfree and cfg_memfree. */
 
-#include <pthread.h>
 #include <stdio.h>
 #include <stdlib.h>
 #include <string.h>
@@ -49,32 +48,19 @@ static char *configuration_of(int entries) {
     return text;
 }
 
-static void *free_result(void *result) {
-    cfg_msgfree(result);
-    return NULL;
-}
-
 static void a_large_result_is_freed_on_a_small_stack(void **state) {
     struct fixture *f = *state;
-    pthread_attr_t attributes;
-    pthread_t thread;
     char *text = configuration_of(many_entries);
     load(f, text);
     free(text);
     CfgMessage *result = found(f->handle, "cn=Configuration", CFG_SCOPE_SUBTREE, NULL, NULL);
     assert_int_equal(cfg_count_entries(f->handle, result), many_entries + 1);
-    assert_int_equal(pthread_attr_init(&attributes), 0);
-    assert_int_equal(pthread_attr_setstacksize(&attributes, small_stack), 0);
-    assert_int_equal(pthread_create(&thread, &attributes, free_result, result), 0);
-    assert_int_equal(pthread_join(thread, NULL), 0);
-    pthread_attr_destroy(&attributes);
+    free_on_a_stack_of(small_stack, result);
 }
 
 static void an_attribute_with_many_values_is_freed_on_a_small_stack(void **state) {
     struct fixture *f = *state;
     enum { values = 1000 };
-    pthread_attr_t attributes;
-    pthread_t thread;
     char *text = malloc(sizeof CONFIGURATION_HEAD + (size_t)values * 32);
     assert_non_null(text);
     char *end = text + sprintf(text, "%s", CONFIGURATION_HEAD);
@@ -84,11 +70,7 @@ static void an_attribute_with_many_values_is_freed_on_a_small_stack(void **state
     load(f, text);
     free(text);
     CfgMessage *result = found(f->handle, "cn=Configuration", CFG_SCOPE_BASE, NULL, NULL);
-    assert_int_equal(pthread_attr_init(&attributes), 0);
-    assert_int_equal(pthread_attr_setstacksize(&attributes, small_stack), 0);
-    assert_int_equal(pthread_create(&thread, &attributes, free_result, result), 0);
-    assert_int_equal(pthread_join(thread, NULL), 0);
-    pthread_attr_destroy(&attributes);
+    free_on_a_stack_of(small_stack, result);
 }
 
 int main(void) {

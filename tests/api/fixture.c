@@ -3,6 +3,7 @@
 #include <dirent.h>
 #include <fcntl.h>
 #include <langinfo.h>
+#include <pthread.h>
 #include <stdio.h>
 #include <stdlib.h>
 #include <string.h>
@@ -258,4 +259,20 @@ void assert_values(CfgHandle *handle, CfgMessage *entry, const char *attribute,
     cfg_value_free(values);
     assert_string_equal(text, expected);
     free(text);
+}
+
+static void *free_result(void *result) {
+    return cfg_msgfree(result) == CFG_SUCCESS ? result : NULL;
+}
+
+void free_on_a_stack_of(size_t size, CfgMessage *result) {
+    pthread_attr_t attributes;
+    pthread_t thread;
+    void *done = NULL;
+    assert_int_equal(pthread_attr_init(&attributes), 0);
+    assert_int_equal(pthread_attr_setstacksize(&attributes, size), 0);
+    assert_int_equal(pthread_create(&thread, &attributes, free_result, result), 0);
+    assert_int_equal(pthread_join(thread, &done), 0);
+    assert_ptr_equal(done, result);
+    pthread_attr_destroy(&attributes);
 }

@@ -98,4 +98,7 @@ void assert_attributes(CfgHandle *handle, CfgMessage *entry, const char *expecte
 void assert_values(CfgHandle *handle, CfgMessage *entry, const char *attribute,
                    const char *expected);
 
+/** Frees a result in a thread with a stack of so many bytes. */
+void free_on_a_stack_of(size_t size, CfgMessage *result);
+
 #endif

@@ -106,7 +106,7 @@ static void a_million_entries_can_be_freed(void **state) {
     for (int i = 0; i < 1000000; ++i) {
         first = node(entry_kind, NULL, NULL, first);
     }
-    assert_int_equal(cfg_msgfree(message(first)), CFG_SUCCESS);
+    free_on_a_stack_of((size_t)8 << 20, message(first));
 }
 
 int main(void) {
