@@ -140,6 +140,10 @@ bool is_plain(std::string_view text) {
 }
 
 std::string_view without_leading_space(std::string_view text) {
+    // Most texts begin with an ASCII character that tells at once.
+    if (!text.empty() && is_ascii(text.front()) && !is_ascii_space(text.front())) {
+        return text;
+    }
     if (is_plain(text)) {
         return text.substr(leading_spaces(text));
     }
