@@ -169,8 +169,8 @@ CFG32_API CfgHandle *cfg_init(void) CFG32_NOEXCEPT;
  *         90 when memory is exhausted before the file is read;
  *         91 (Connection error) when the file is missing or can't be opened;
  *         162 (Unusable input character) for text that is not of the locale's character set.
- *         After a failure the handle is what it was (with the default file name, if it had none) and
- *         may be bound again.
+ *         After a failure the handle is what it was, with the default file name if it had none,
+ *         and may be bound again.
  */
 CFG32_API int cfg_bind_s(CfgHandle *handle, const char *dn, const char *password,
                          int method) CFG32_NOEXCEPT;
