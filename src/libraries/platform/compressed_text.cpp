@@ -68,9 +68,10 @@ z_stream wiping_stream() {
 // registers on the stack, and with them pieces of the text. A run over a harmless text when this
 // library is loaded gets that over before there are any.
 [[maybe_unused]] const bool compressor_is_bound = [] {
-    const unsigned char harmless[CFG32_PASSWORD_MAX] = {};
+    unsigned char harmless[CFG32_PASSWORD_MAX] = {};
     unsigned char out[64];
-    return compress_text(harmless, out).has_value();
+    const auto size = compress_text(harmless, out);
+    return size && expand_text({out, *size}, harmless).has_value();
 }();
 
 }  // namespace
