@@ -4,7 +4,7 @@
  *
  * The configuration is one LDIF text file: a tree of entries under "cn=Configuration". The calls
  * mirror the synchronous LDAP client interface (RFC 1823): make a handle, bind as the administrator
- * whose DN and password stand in the file itself, search, walk the results.
+ * whose DN and password stand in the file itself, search, walk the results, add, modify, delete.
  *
  * Conventions
  *
@@ -20,25 +20,52 @@
  *     it.
  *  3. Reset. Every call that takes a handle first clears the handle's error and frees the report
  *     of the last failure, except the option calls and the ones that tell of that failure:
- *     cfg_get_option(), cfg_set_option(), cfg_get_errno(), cfg_get_exterror(), cfg_perror() and
- *     cfg_dump_exception(). So ask about a failure before anything else.
+ *     cfg_get_option(), cfg_set_option(), cfg_get_errno(), cfg_get_exterror(), cfg_perror(),
+ *     cfg_dump_exception(), the queries from cfg_get_file_name() to cfg_get_is_single(), and
+ *     cfg_tree_view(). So ask about a failure before anything else.
  *  4. Memory. Each description says who owns what is returned: results go to cfg_msgfree(), value
  *     arrays to cfg_value_free(), strings to cfg_memfree(), cursors to cfg_ber_free(). A result
  *     outlives the handle that it came from. Text returned as const char * is not the caller's.
  *     Arguments stay the caller's and are not kept, save for the key of CFG_OPT_KEY_DATA.
- *  5. Secrets. Passwords that a search decoded are wiped when their result is freed. Copies made by
+ *  5. Changes. When a call that changes the configuration returns 0, the new file is on the disk,
+ *     and so is, if CFG_OPT_BACKUP_FILE names one, a copy of the file of before. The backup is
+ *     complete before the first byte of the file changes: at every moment one of the two is a
+ *     complete version. The file is overwritten in place; links to it, its owner and its mode
+ *     stay. When a call returns anything else, the file is what it was, except as said below of
+ *     codes 80 and 91 at cfg_modify_s(). The copy in memory is not rolled back: modifications
+ *     before the one that was refused, and a change that could not be written, are seen by
+ *     searches of this handle and are written with its next change. To drop them, unbind.
+ *  6. Many programs. Every program that uses this library sees the changes of the others at its
+ *     next call, and no change is lost when several make one at the same time: each keeps the
+ *     others away (flock(2) on the file itself) while it changes the file, and while it reads it. A
+ *     call that has to wait for longer than ten seconds gives up with CFG_BUSY (51).
+ *  7. Secrets. Passwords that a search decoded are wiped when their result is freed. Copies made by
  *     cfg_get_values() are the caller's to wipe. The report of a failure holds the value that was
  *     refused, which may be a password: don't log it where others read.
- *  6. Threads. A handle, its results and their cursors belong to one thread at a time. Handles
+ *  8. Threads. A handle, its results and their cursors belong to one thread at a time. Handles
  *     are independent of each other, save for the two process-wide options CFG_OPT_SHOW_SOURCE and
  *     CFG_OPT_SHOW_STACK.
- *  7. Locale. cfg_init() calls setlocale(LC_ALL, "") under the server's locale lock: the text of
+ *  9. Locale. cfg_init() calls setlocale(LC_ALL, "") under the server's locale lock: the text of
  *     the file is read in the character set of the environment. As setlocale() changes the whole
  *     process, make handles while no other thread is in a call of this library.
- *  8. No C++ exception leaves a call.
+ * 10. No C++ exception leaves a call.
  */
 #ifndef CFG32_H
 #define CFG32_H
+
+#include <stdint.h>
+
+/*
+ * Changes are told in the LDAP client interface's own records, LDAPMod and struct berval. A system
+ * that has a client's <ldap.h> has them from there, so that a program can include both headers, in
+ * any order; elsewhere, and where CFG32_WITHOUT_LDAP_H is defined, they are defined here in the
+ * same form.
+ */
+#if !defined(LDAP_MOD_ADD) && !defined(CFG32_WITHOUT_LDAP_H) && defined(__has_include)
+#if __has_include(<ldap.h>)
+#include <ldap.h>
+#endif
+#endif
 
 #ifdef __cplusplus
 extern "C" {
@@ -70,16 +97,55 @@ typedef struct CfgCursor CfgCursor;
 /** Key material for encoded passwords; made by the server's password routines. */
 struct aes_key_data;
 
+#ifndef LDAP_MOD_ADD
+
+/** A counted value. */
+typedef struct berval {
+    unsigned long bv_len; /**< not looked at by this library */
+    char *bv_val;         /**< ended by a NUL */
+} BerValue;
+
+/** One modification of an attribute (RFC 1823, 4.8). */
+typedef struct ldapmod {
+    int mod_op;     /**< LDAP_MOD_..., with LDAP_MOD_BVALUES for values in mod_bvalues */
+    char *mod_type; /**< the attribute's name */
+    union mod_vals_u {
+        char **modv_strvals;
+        struct berval **modv_bvals;
+    } mod_vals; /**< the values, ended by null; null for none */
+#define mod_values mod_vals.modv_strvals
+#define mod_bvalues mod_vals.modv_bvals
+} LDAPMod;
+
+/** @name Operations of a modification
+ * @{ */
+#define LDAP_MOD_ADD 0x0000     /**< add the values; values that are there already are no error */
+#define LDAP_MOD_DELETE 0x0001  /**< delete the values, or the whole attribute when none is given \
+                                 */
+#define LDAP_MOD_REPLACE 0x0002 /**< let the values take the place of all there are */
+#define LDAP_MOD_BVALUES 0x0080 /**< flag: the values are in mod_bvalues */
+/** @} */
+
+#endif
+
 /** The result codes that callers most often ask for; cfg_err2string() knows all of them. */
 enum {
-    CFG_SUCCESS = 0,              /**< done */
-    CFG_NO_SUCH_ATTRIBUTE = 16,   /**< the entry has no attribute of that name */
-    CFG_INVALID_CREDENTIALS = 49, /**< not the administrator's DN and password */
-    CFG_OTHER = 80,               /**< a failure of the system or of the library */
-    CFG_DECODING_ERROR = 84,      /**< a stored password can't be decoded */
-    CFG_AUTH_UNKNOWN = 86,        /**< a bind method other than CFG_AUTH_SIMPLE */
-    CFG_PARAM_ERROR = 89,         /**< a null argument, or a handle that is not bound */
-    CFG_NO_MEMORY = 90            /**< memory is exhausted */
+    CFG_SUCCESS = 0,                 /**< done */
+    CFG_NO_SUCH_ATTRIBUTE = 16,      /**< the entry has no attribute of that name */
+    CFG_CONSTRAINT_VIOLATION = 19,   /**< a second value for a single-valued attribute */
+    CFG_INVALID_SYNTAX = 21,         /**< a value that its attribute does not allow */
+    CFG_NO_SUCH_OBJECT = 32,         /**< no entry of that DN */
+    CFG_INVALID_DN_SYNTAX = 34,      /**< text that is no DN */
+    CFG_INVALID_CREDENTIALS = 49,    /**< not the administrator's DN and password */
+    CFG_INSUFFICIENT_ACCESS = 50,    /**< a file that may not be written or backed up */
+    CFG_BUSY = 51,                   /**< another program has the file, or changed it meanwhile */
+    CFG_NOT_ALLOWED_ON_NONLEAF = 66, /**< an entry that has others below it */
+    CFG_OTHER = 80,                  /**< a failure of the system or of the library */
+    CFG_DECODING_ERROR = 84,         /**< a stored password can't be decoded */
+    CFG_AUTH_UNKNOWN = 86,           /**< a bind method other than CFG_AUTH_SIMPLE */
+    CFG_PARAM_ERROR = 89,            /**< a null argument, or a handle that is not bound */
+    CFG_NO_MEMORY = 90,              /**< memory is exhausted */
+    CFG_CONNECT_ERROR = 91           /**< a file that is missing or can't be opened */
 };
 
 /** @name Options
@@ -99,8 +165,8 @@ enum {
 /** Text, at first null: the configuration file that the next cfg_bind_s() loads. A bound handle
  * keeps the file it has, but while this is null its calls return 89. */
 #define CFG_OPT_CONFIG_FILE 1005
-/** Text, at first null: where the next cfg_bind_s() has the file copied before each change. Null
- * makes no backup. */
+/** Text, at first null: where the next cfg_bind_s() has the file copied before each change, with
+ * its owner, group and mode. Null makes no backup. */
 #define CFG_OPT_BACKUP_FILE 1006
 /** struct aes_key_data *, at first null: key for encoded passwords. The next cfg_bind_s() loads the
  * file with it, and searches decode with it at once. It stays the caller's and must outlive the
@@ -158,6 +224,7 @@ CFG32_API CfgHandle *cfg_init(void) CFG32_NOEXCEPT;
  *         34 (Invalid DN syntax) for a dn, or an entry of the file, whose DN can't be parsed;
  *         49 (Invalid credentials), without a failure report;
  *         50 (Insufficient access) when a file with unusable lines can't be backed up or rewritten;
+ *         51 (DSA is busy) when another program kept the file for ten seconds;
  *         65 (Object class violation) for an attribute outside of an entry, save one "version" and
  *         one "charset" line that can be used;
  *         80 for a failure of the system (exhausted memory included) or of the library, or when no
@@ -342,6 +409,86 @@ CFG32_API void cfg_ber_free(CfgCursor *cursor) CFG32_NOEXCEPT;
 CFG32_API void cfg_memfree(void *text) CFG32_NOEXCEPT;
 
 /* ---------------------------------------------------------------------------------------------
+ * Changing
+ * ------------------------------------------------------------------------------------------- */
+
+/**
+ * Changes the attributes of an entry, and writes the file.
+ *
+ * The modifications are carried out in their order:
+ *  - LDAP_MOD_ADD adds values. One that is there already, by the attribute's own comparison, is
+ *    passed over.
+ *  - LDAP_MOD_DELETE deletes values, or without values the whole attribute. A value that is not
+ *    there is passed over; an attribute whose last value goes is deleted, with the comment lines
+ *    before it.
+ *  - LDAP_MOD_REPLACE lets values take the place of all there are, and keeps the comment; without
+ *    values it deletes the attribute, which need not be there. A replacement that the attribute's
+ *    syntax refuses leaves the attribute without values in this handle (see convention 5).
+ *
+ * @code
+ * char *port[] = {"1389", NULL};
+ * LDAPMod replace = {.mod_op = LDAP_MOD_REPLACE, .mod_type = "oru-slapdPort", .mod_values = port};
+ * LDAPMod *changes[] = {&replace, NULL};
+ * if (cfg_modify_s(handle, "cn=Front End, cn=Configuration", changes) != CFG_SUCCESS)
+ *     fprintf(stderr, "%s\n", cfg_dump_exception(handle));
+ * @endcode
+ *
+ * @param handle  a bound handle
+ * @param dn      the entry
+ * @param mods    ended by null; null or empty writes the file as it is, whether there is such an
+ *                entry or not. Values are texts ended by NUL, binary ones as well. They stay the
+ *                caller's.
+ * @return 0;
+ *         16 (No such attribute) when an attribute to delete from is not there;
+ *         19 (Constraint violation) for a second, different value of a single-valued attribute:
+ *         that modification changes nothing;
+ *         18, 21, 34, 83 or 84 for a value that the attribute's syntax does not allow; 21 also for
+ * a name or value that would not read back as it is written (a line feed, blanks at its ends),
+ * which is forgotten; 32 (No such object) when there is no such entry; 34 (Invalid DN syntax) for a
+ * malformed dn; 50 (Insufficient access) when the file can't be backed up or opened for writing; 51
+ * (DSA is busy) when another program kept the file for ten seconds, or one that does not ask
+ * changed it during this call: try again; 80 for a failure of the system (the report tells the
+ * errno: a full disk, for example) or of the library. When the file had been written to, the old
+ * content was put back; if that failed as well, the report says so, and the complete version is the
+ * backup; 89 for a handle that is null or not bound, a null dn, or an unknown operation; 90 when
+ * memory is exhausted; 91 (Connection error) when the file is missing. "_stat()" without a "No such
+ * file" means that the file was written, but could not be looked at afterwards; 162 for text that
+ * is not of the locale's character set; or what cfg_bind_s() returns when the file has to be read
+ * again.
+ */
+CFG32_API int cfg_modify_s(CfgHandle *handle, const char *dn, struct ldapmod **mods) CFG32_NOEXCEPT;
+
+/**
+ * Adds an entry, and writes the file.
+ *
+ * The entry's ancestors need not be there. An entry that is there already takes over the new
+ * attributes and values.
+ *
+ * @param dn    the entry's DN; the attribute of its first part is not added by itself
+ * @param mods  the attributes with their values, ended by null; may be null. The operation is not
+ *              looked at, save for LDAP_MOD_BVALUES; an attribute without values is passed over
+ * @return as cfg_modify_s(), save 16 and 32.
+ */
+CFG32_API int cfg_add_s(CfgHandle *handle, const char *dn, struct ldapmod **mods) CFG32_NOEXCEPT;
+
+/**
+ * Deletes an entry, with the comment lines before it, and writes the file. With
+ * CFG_OPT_DELETE_NON_LEAVES everything below the entry goes with it.
+ *
+ * @return as cfg_modify_s(), and 66 (Operation not allowed on nonleaf) for an entry with others
+ *         below it while CFG_OPT_DELETE_NON_LEAVES is off.
+ */
+CFG32_API int cfg_delete_s(CfgHandle *handle, const char *dn) CFG32_NOEXCEPT;
+
+/**
+ * Writes the file as it is: in its canonical form, after a backup. No other call needs this one.
+ *
+ * @return as cfg_modify_s(), of 50, 51, 80, 89, 91 and what cfg_bind_s() returns when the file has
+ *         to be read again.
+ */
+CFG32_API int cfg_flush_s(CfgHandle *handle) CFG32_NOEXCEPT;
+
+/* ---------------------------------------------------------------------------------------------
  * Failures
  * ------------------------------------------------------------------------------------------- */
 
@@ -375,6 +522,72 @@ CFG32_API void cfg_perror(CfgHandle *handle, const char *prefix) CFG32_NOEXCEPT;
  *         exhausted memory), or the handle is null.
  */
 CFG32_API const char *cfg_dump_exception(CfgHandle *handle) CFG32_NOEXCEPT;
+
+/*
+ * Where the last failure was, and what would have been allowed. None of these calls resets the
+ * handle. Text belongs to the library; text of the failure itself is valid until the next call that
+ * resets the handle.
+ */
+
+/**
+ * Returns the configuration file of the last failure; when there was none, of the bind; before a
+ * bind, the one of CFG_OPT_CONFIG_FILE or the default one.
+ *
+ * @return null for a null handle, or when no name is known. The default name is valid until the
+ *         next call of this function in the same thread.
+ */
+CFG32_API const char *cfg_get_file_name(CfgHandle *handle) CFG32_NOEXCEPT;
+
+/** Returns the line of that file, counted from 1; 0 when none is known and for a null handle. */
+CFG32_API int cfg_get_file_line(CfgHandle *handle) CFG32_NOEXCEPT;
+
+/** Returns the DN of the entry; "" when the failure tells none, null without a failure or handle.
+ */
+CFG32_API const char *cfg_get_entry(CfgHandle *handle) CFG32_NOEXCEPT;
+
+/** Returns the attribute's name; null when the failure tells none, without a failure or handle. */
+CFG32_API const char *cfg_get_attribute(CfgHandle *handle) CFG32_NOEXCEPT;
+
+/** Returns the value; "" when the failure tells none, null without a failure or handle. */
+CFG32_API const char *cfg_get_value(CfgHandle *handle) CFG32_NOEXCEPT;
+
+/**
+ * Returns the words that the violated attribute allows.
+ *
+ * @return an array ended by null, static; null when it has no such list, and without a violated
+ *         attribute.
+ */
+CFG32_API const char *const *cfg_get_enum(CfgHandle *handle) CFG32_NOEXCEPT;
+
+/** Returns the bits that the violated attribute allows; 0 for none. */
+CFG32_API int64_t cfg_get_bitmask(CfgHandle *handle) CFG32_NOEXCEPT;
+
+/** Returns the least value of the violated attribute, or the least length of its text in bytes. */
+CFG32_API int64_t cfg_get_minimum(CfgHandle *handle) CFG32_NOEXCEPT;
+
+/** Returns the greatest value, or length; there is a range when this or the minimum is not 0. */
+CFG32_API int64_t cfg_get_maximum(CfgHandle *handle) CFG32_NOEXCEPT;
+
+/** Returns 1 when the violated attribute takes one value only, else 0. */
+CFG32_API int cfg_get_is_single(CfgHandle *handle) CFG32_NOEXCEPT;
+
+/**
+ * Draws the tree of the entries that the handle has in memory. Does not reset the handle and does
+ * not read the file again.
+ *
+ * @param style  CFG_TREE_ASCII, or another number for the line-drawing bytes of code page 437
+ * @return text that belongs to the handle until the next call that resets it; a second call before
+ *         that returns the same text, whatever the style. Null for a handle that is null or not
+ *         bound, when memory is exhausted, and when an entry's DN can't be printed; the handle
+ *         tells which.
+ */
+CFG32_API char *cfg_tree_view(CfgHandle *handle, int style) CFG32_NOEXCEPT;
+
+/** @name Styles of cfg_tree_view()
+ * @{ */
+#define CFG_TREE_ASCII 0
+#define CFG_TREE_CP437 1
+/** @} */
 
 #ifdef __cplusplus
 }

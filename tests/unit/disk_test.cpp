@@ -38,8 +38,11 @@ struct disk : testing::Test {
     }
 
     bool write(const std::string& name, const std::string& text) {
-        unique_fd file = opened(folder.file(name), O_WRONLY | O_CREAT);
-        return file && overwrite(file.get(), text) && file.close();
+        struct stat status;
+        unique_fd file =
+            open_regular(folder.file(name).c_str(), status, O_WRONLY | O_CREAT, owner_only);
+        return file && reserve(file.get(), static_cast<size_t>(status.st_size), text) &&
+               overwrite(file.get(), text) && file.close();
     }
 
     /// errno of an attempt to open the path, 0 when it opens.

@@ -219,6 +219,20 @@ const LDIF_Entry* LDIF_Entry::find(const LDIF_DN& dn) const {
     return entry;
 }
 
+LDIF_Entry* LDIF_Entry::child(const LDIF_DN& relative_dn) {
+    LDIF_Entry* found = index_ ? index_->equal_or_ancestor(relative_dn, 0) : nullptr;
+    return found && found->relative_dn_ == relative_dn ? found : nullptr;
+}
+
+void LDIF_Entry::erase(LDIF_Entry& child) {
+    const list::iterator position = index_->position_of(child);
+    index_->erase(position);
+    children_.erase(position);
+    if (children_.empty()) {
+        index_.reset();
+    }
+}
+
 LDIF_Entry LDIF_Entry::header() const {
     LDIF_Entry copy;
     copy.name_ = name_;

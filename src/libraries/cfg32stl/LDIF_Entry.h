@@ -64,6 +64,11 @@ class LDIF_Entry {
     virtual LDIF_Entry* find(const LDIF_DN& dn);
     const LDIF_Entry* find(const LDIF_DN& dn) const;
 
+    /// The child whose relative DN that is, or null.
+    LDIF_Entry* child(const LDIF_DN& relative_dn);
+    /// Removes a child with everything below it.
+    void erase(LDIF_Entry& child);
+
     bool is_root() const { return name_.empty(); }
     const cisString& name() const { return name_; }  ///< of the DN line, as it was written
     const LDIF_DN& dn() const { return dn_; }

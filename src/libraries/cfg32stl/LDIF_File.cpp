@@ -10,7 +10,6 @@
 #include "disk.h"
 #include "failure.h"
 #include "line_source.h"
-#include "open_regular.h"
 
 using namespace cfg32;
 
@@ -202,31 +201,43 @@ LDIF_File::LDIF_File(const std::string& fileName, const std::string& backupFileN
 }
 
 bool LDIF_File::is_current(const struct stat& status) const {
-    const bool is_same_file = status.st_dev == status_.st_dev && status.st_ino == status_.st_ino;
-    return is_loaded_ && is_same_file && status.st_mtim.tv_sec == status_.st_mtim.tv_sec &&
+    return is_loaded_ && is_same_file(status, status_) &&
+           status.st_mtim.tv_sec == status_.st_mtim.tv_sec &&
            status.st_mtim.tv_nsec == status_.st_mtim.tv_nsec;
 }
 
 int LDIF_File::refresh() {
+    const bool is_loaded = load_if_changed();
+    if (is_loaded && has_invalid_lines_) {
+        const update lock(*this);
+        load_if_changed();  // another process may have been first
+        if (has_invalid_lines_) {
+            flush();
+        }
+    }
+    return is_loaded ? 1 : 0;
+}
+
+bool LDIF_File::load_if_changed() {
     struct stat status;
     if (stat(file_name_.c_str(), &status) != 0) {
         raise_with(no_status, {}, name_file_and_errno(errno));
     }
     if (is_current(status)) {
-        return 0;
+        return false;
     }
-    struct stat opened;
-    const unique_fd file = open_regular(file_name_.c_str(), opened);
+    // Nobody shall write while it is read. In an update nobody does.
+    const locked_file file = locked(O_RDONLY, is_updated_ ? LOCK_UN : LOCK_SH);
     if (!file) {
         raise_with(not_opened, {}, name_file_and_errno(errno));
     }
-    is_loaded_ = false;
+    is_loaded_ = is_whole_ = false;
     trailing_comment_.clear();
     root_.clear();
     std::string text;
     loader load(root_, trailing_comment_, key_);
     const auto body = [&] {
-        if (!read_all(file.get(), static_cast<size_t>(opened.st_size), text)) {
+        if (!read_all(file.get(), static_cast<size_t>(file.status().st_size), text)) {
             raise_with(not_read, {}, name_file_and_errno(errno));
         }
         load.run(text);
@@ -237,10 +248,8 @@ int LDIF_File::refresh() {
                       e.configLine = load.line_number();
                       e.entryDn = load.place();
                   });
-    status_ = status;
-    is_loaded_ = true;
-    if (load.found_invalid_lines()) {
-        flush();
-    }
-    return 1;
+    status_ = file.status();
+    is_loaded_ = is_whole_ = true;
+    has_invalid_lines_ = load.found_invalid_lines();
+    return true;
 }

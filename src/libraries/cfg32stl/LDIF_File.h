@@ -2,19 +2,44 @@
 
 #include <sys/stat.h>
 
+#include <set>
 #include <string>
 
 #include "LDIF_Comment.h"
 #include "LDIF_Entry.h"
 #include "LDIF_Exception.h"
 #include "LDIF_Search.h"
+#include "file_lock.h"
 
 struct aes_key_data;
+struct ldapmod;
 
 /// The configuration file in memory. Loaded by the constructor, read again by refresh() when the
 /// file was changed, written by flush().
+///
+/// Who changes the file holds an update from before the refresh until after the flush:
+///
+///     const LDIF_File::update lock(file);
+///     file.refresh();
+///     file.modify(dn, mods);
+///     file.flush();
 class LDIF_File {
   public:
+    /// Keeps every other user of the library away from the file. Throws 51/51 when one of them
+    /// does so for longer than longest_wait. A file that can't be opened is left to refresh() to
+    /// report.
+    class update {
+      public:
+        explicit update(LDIF_File& file);
+        update(const update&) = delete;
+        update& operator=(const update&) = delete;
+        ~update();
+
+      private:
+        LDIF_File& file_;
+        const bool is_outermost_;
+    };
+
     /// Loads the file. An empty backupFileName makes no backups. The key stays the caller's.
     /// Throws LDIF_Exception 91/1001 for an empty fileName and what refresh() throws.
     LDIF_File(const std::string& fileName, const std::string& backupFileName, aes_key_data* key);
@@ -28,9 +53,27 @@ class LDIF_File {
     /// call reads again.
     int refresh();
 
-    /// Copies the file to the backup name, if there is one, and writes the store over it. A failure
-    /// before the writing leaves the file untouched.
+    /// Copies the file to the backup name, if there is one, and writes the store over it. When it
+    /// returns, both are on the disk. A failure before the writing leaves the file untouched; after
+    /// one in the middle the old content is put back, if that is possible. Within an update the
+    /// file must be the one that was refreshed (51/51 otherwise). A store that would not read back
+    /// as it is written is refused (21/1005) and read again by the next refresh().
     void flush();
+
+    /// Changes an entry's attributes. Modifications before one that is refused stay applied.
+    /// Throws 32/32 when there is no such entry, 16/16 when there is no attribute to delete,
+    /// 19/1006 for a second value of a single-valued attribute, 89/1010 for an unknown operation,
+    /// 21/1005 for an attribute that would not read back as it is written, and what the values'
+    /// syntax throws.
+    void modify(const LDIF_DN& dn, ldapmod** mods);
+    /// Adds an entry, or merges its attributes into the entry that has the DN already.
+    void add(const LDIF_DN& dn, ldapmod** mods);
+    /// Removes an entry; one with children (66/66) only when deleteNonLeaves allows it. Throws
+    /// 32/32 when there is no such entry.
+    void erase(const LDIF_DN& dn, bool deleteNonLeaves);
+
+    /// A drawing of the tree, in plain characters or in those of code page 437 (oem).
+    std::string treeView(bool oem) const;
 
     /// Copies of the entries at or below base that the filter matches. Throws 32/32 when there is
     /// no base entry.
@@ -55,13 +98,19 @@ class LDIF_File {
 
   private:
     bool is_current(const struct stat& status) const;
+    bool load_if_changed();
+    cfg32::locked_file locked(int flags, int operation) const;
     int authenticate(const char* dn, const char* password, int method) const;
-    std::string text() const;
+    std::string text();
     void back_up() const;
-    void write(const std::string& content);
+    void write(const std::string& content, bool is_refreshed);
+    cfg32::unique_fd open_for_writing(struct stat& status);
+    void create();
+    void overwrite(int file, const struct stat& status, const std::string& content);
 
     // What is filled in of a failure.
     void name_file(LDIF_Exception& e) const { e.configFile = file_name_; }
+    void name_entry(LDIF_Exception& e, const LDIF_DN& dn) const;
     auto name_file_and_errno(int error) const {
         return [this, error](LDIF_Exception& e) {
             name_file(e);
@@ -76,5 +125,20 @@ class LDIF_File {
     LDIF_Entry root_;
     int authentication_ = not_authenticated;
     aes_key_data* key_;
-    bool is_loaded_ = false;  // the tree is what status_ tells
+    bool is_whole_ = false;           // the tree is all of a file
+    bool is_loaded_ = false;          // the tree is what status_ tells
+    bool has_invalid_lines_ = false;  // that the file has not yet as attributes
+
+    bool is_updated_ = false;  // while there is an update
+    cfg32::locked_file lock_;
+    int lock_error_ = 0;  // why there is no lock, an errno
 };
+
+/// The tree at an entry in plain characters. prefix is what precedes it on its line; undefined
+/// takes the DNs that are missing between an entry and the one it is drawn below.
+std::string IA5_TreeView(const LDIF_Entry& entry, std::set<LDIF_DN>& undefined,
+                         const std::string& prefix);
+
+/// The same in the single bytes of code page 437. last: the entry is its parent's last child.
+std::string OEM_TreeView(const LDIF_Entry& entry, bool last, std::set<LDIF_DN>& undefined,
+                         const std::string& prefix);

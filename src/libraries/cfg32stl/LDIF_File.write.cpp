@@ -25,6 +25,9 @@ constexpr failure not_opened{50, 1004, ""};
 constexpr failure not_written{80, 1000, "System error writing file"};
 constexpr failure no_status{91, 1003, "_stat()"};
 constexpr failure not_readable{21, 1005, "Entry would not read back as it is written"};
+constexpr failure not_whole{80, 1000, "Configuration file was not read to its end"};
+constexpr failure changed_meanwhile{51, 51, "Configuration file was changed meanwhile"};
+constexpr failure not_put_back{80, 1000, "The old content could not be put back"};
 
 constexpr size_t name_buffer_size = 2048;
 
@@ -85,22 +88,28 @@ void LDIF_File::flush() {
     const auto body = [&] {
         // Whatever can fail in memory fails before a file is touched.
         const std::string content = with_context([&] { return text(); }, details);
+        const bool is_refreshed = is_updated_;
+        const update lock(*this);
         if (!backup_file_name_.empty()) {
             back_up();
         }
-        write(content);
+        write(content, is_refreshed);
     };
     with_system_error([] { return "writing file"; }, body, details);
 }
 
 /// The whole file as text.
-std::string LDIF_File::text() const {
+std::string LDIF_File::text() {
+    if (!is_whole_) {
+        raise(not_whole);
+    }
     std::string out;
     for_each_in_preorder(root_, [&](const LDIF_Entry& entry) {
         const size_t begin = out.size();
         entry.append_to(out);
         if (!can_be_loaded(entry) ||
             !reads_back(std::string_view(out).substr(begin), entry.line_count())) {
+            is_loaded_ = false;  // so that what can't be written is forgotten
             raise_with(not_readable, {}, [&](LDIF_Exception& e) { e.entryDn = shown(entry.dn()); });
         }
     });
@@ -118,7 +127,9 @@ void LDIF_File::back_up() const {
     char group_buffer[name_buffer_size];
     const char* owner = owner_name(status.st_uid, owner_buffer);
     const char* group = group_name(status.st_gid, group_buffer);
-    if (!copyFile(file_name_.c_str(), backup_file_name_.c_str(), owner, group, status.st_mode)) {
+    errno = lock_error_;
+    if (!lock_ ||
+        !copyFile(file_name_.c_str(), backup_file_name_.c_str(), owner, group, status.st_mode)) {
         const int error = errno;
         raise_with(no_backup,
                    formatted("Unable to backup the configuration file: \"%s\" ", file_name_),
@@ -126,28 +137,69 @@ void LDIF_File::back_up() const {
     }
 }
 
-/// Makes content the file's, in place: links to it, its owner and its mode stay.
-void LDIF_File::write(const std::string& content) {
-    const mode_t mode = is_loaded_ ? status_.st_mode & 07777 : S_IRUSR | S_IWUSR;
+/// Makes content the file's, in place: links to it, its owner and its mode stay. What was refreshed
+/// in this update and is another file now, or has changed, is not overwritten.
+void LDIF_File::write(const std::string& content, bool is_refreshed) {
     struct stat status;
-    const char* name = file_name_.c_str();
-    unique_fd file = open_regular(name, status, O_WRONLY);
-    if (!file && errno == ENOENT) {
-        file = open_regular(name, status, O_WRONLY | O_CREAT, mode);
+    unique_fd file = open_for_writing(status);
+    if (!is_same_file(status, lock_.status()) || (is_refreshed && !is_current(status))) {
+        raise_with(changed_meanwhile, {}, [&](LDIF_Exception& e) { name_file(e); });
     }
-    if (!file) {
-        const int error = errno;
-        raise_with(not_opened, formatted("Unable to open: \"%s\"", file_name_),
-                   name_file_and_errno(error));
-    }
-    if (!overwrite(file.get(), content) || !file.close()) {
-        const int error = errno;
-        is_loaded_ = false;  // the file may be neither the old nor the new one
-        raise_with(not_written, {}, name_file_and_errno(error));
+    overwrite(file.get(), status, content);
+    if (!make_later(file.get(), status.st_mtim) || !file.close()) {
+        raise_with(not_written, {}, name_file_and_errno(errno));
     }
     if (stat(file_name_.c_str(), &status) != 0) {
         raise_with(no_status, {}, name_file_and_errno(errno));
     }
     status_ = status;
     is_loaded_ = true;
+    has_invalid_lines_ = false;
+}
+
+unique_fd LDIF_File::open_for_writing(struct stat& status) {
+    if (!lock_ && lock_error_ == ENOENT) {
+        create();
+    }
+    errno = lock_error_;
+    unique_fd file;
+    if (lock_) {
+        file = open_regular(file_name_.c_str(), status, O_RDWR);
+    }
+    if (!file) {
+        const int error = errno;
+        raise_with(not_opened, formatted("Unable to open: \"%s\"", file_name_),
+                   name_file_and_errno(error));
+    }
+    return file;
+}
+
+/// Makes an empty file in the place of one that was removed.
+void LDIF_File::create() {
+    const mode_t mode = is_loaded_ ? status_.st_mode & 07777 : S_IRUSR | S_IWUSR;
+    struct stat status;
+    if (open_regular(file_name_.c_str(), status, O_WRONLY | O_CREAT, mode)) {
+        lock_ = locked(O_RDWR, LOCK_EX);
+    }
+    lock_error_ = lock_ ? 0 : errno;
+}
+
+/// Makes content the open file's, or puts back what was there.
+void LDIF_File::overwrite(int file, const struct stat& status, const std::string& content) {
+    std::string before;
+    if (!read_all(file, static_cast<size_t>(status.st_size), before) ||
+        !reserve(file, before.size(), content)) {
+        raise_with(not_written, {}, name_file_and_errno(errno));
+    }
+    is_loaded_ = false;  // until it is known what the file has become
+    if (cfg32::overwrite(file, content)) {
+        return;
+    }
+    LDIF_Exception e = make_exception(not_written);
+    name_file_and_errno(errno)(e);
+    if (!cfg32::overwrite(file, before)) {
+        e.cause = std::make_unique<LDIF_Exception>(make_exception(not_put_back));
+        name_file_and_errno(errno)(*e.cause);
+    }
+    throw e;
 }

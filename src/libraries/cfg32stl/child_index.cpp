@@ -35,13 +35,22 @@ void child_index::insert(position child) {
 }
 
 void child_index::erase(position child) {
-    const LDIF_DN& dn = child->relative_dn();
-    const auto [first, last] = by_dn_.equal_range(dn.hash());
-    const auto is_child = [&](const auto& entry) { return entry.second.child == child; };
-    const auto found = std::find_if(first, last, is_child);
-    const uint64_t order = found->second.order;
-    by_dn_.erase(found);
-    for_each_ancestor(dn, [&](size_t hash) { by_ancestor_.erase({hash, order}); });
+    const auto entry = entry_of(*child);
+    const uint64_t order = entry->second.order;
+    by_dn_.erase(entry);
+    for_each_ancestor(child->relative_dn(), [&](size_t hash) {
+        by_ancestor_.erase({hash, order});
+    });
+}
+
+child_index::position child_index::position_of(const LDIF_Entry& child) const {
+    return entry_of(child)->second.child;
+}
+
+child_index::dn_map::const_iterator child_index::entry_of(const LDIF_Entry& child) const {
+    const auto [first, last] = by_dn_.equal_range(child.relative_dn().hash());
+    return std::find_if(first, last,
+                        [&](const auto& entry) { return &*entry.second.child == &child; });
 }
 
 LDIF_Entry* child_index::equal_or_ancestor(const LDIF_DN& dn, size_t from) const {

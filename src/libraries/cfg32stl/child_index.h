@@ -25,6 +25,9 @@ class child_index {
     void insert(position child);
     void erase(position child);
 
+    /// Where a child that was entered stands.
+    position position_of(const LDIF_Entry& child) const;
+
     /// The child whose relative DN equals dn, or is an ancestor of it, when the first `from` RDNs
     /// of dn are left out; null for none.
     LDIF_Entry* equal_or_ancestor(const LDIF_DN& dn, size_t from) const;
@@ -37,10 +40,14 @@ class child_index {
         position child;
         uint64_t order;
     };
+    using dn_map = std::unordered_multimap<size_t, numbered_child>;
+
+    dn_map::const_iterator entry_of(const LDIF_Entry& child) const;
+
     // Of children below the same missing ancestor the order tells which came first.
     using hash_and_order = std::pair<size_t, uint64_t>;
 
-    std::unordered_multimap<size_t, numbered_child> by_dn_;
+    dn_map by_dn_;
     std::map<hash_and_order, position> by_ancestor_;
     uint64_t next_order_ = 0;
 };

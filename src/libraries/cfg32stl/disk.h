@@ -3,16 +3,23 @@
 // Reading and writing whole open files. Failures are false, with the reason in errno.
 
 #include <cstddef>
+#include <ctime>
 #include <string>
 #include <string_view>
 
 namespace cfg32 {
 
-/// Reads the file to its end. expected is a hint of how much there is.
+/// Reads the whole file. expected is a hint of how much there is.
 bool read_all(int file, size_t expected, std::string& text);
 
-/// Makes the text the file's whole content, on the disk: room for it is reserved before the old
-/// content is touched.
+/// Takes the room that the text needs beyond the end of the file, which is `present` bytes long.
+/// After a failure the file is what it was.
+bool reserve(int file, size_t present, std::string_view text);
+
+/// Makes the text the file's whole content, on the disk.
 bool overwrite(int file, std::string_view text);
+
+/// Makes the file's modification time a later one than `before`, if it isn't.
+bool make_later(int file, const timespec& before);
 
 }  // namespace cfg32

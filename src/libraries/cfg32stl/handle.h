@@ -31,9 +31,12 @@ int record(CfgHandle& handle, const LDIF_Exception& e) noexcept;
 /// Keeps "System error in <call>" in the handle, for what nobody expected; returns 80 (or 90).
 int record_system_error(CfgHandle& handle, const char* call, const throw_site& site) noexcept;
 
+/// True after a successful bind.
+inline bool is_bound(const CfgHandle& handle) { return handle.fileName && handle.file; }
+
 /// Runs body, which returns a result code, and keeps the code, or what it throws, in the handle.
 template <class Body>
-int guarded(CfgHandle& handle, const char* call, Body body, const throw_site& site) noexcept {
+int guarded(CfgHandle& handle, const char* call, Body body, const throw_site& site = {}) noexcept {
     try {
         return handle.err = body();
     } catch (const LDIF_Exception& e) {
@@ -59,12 +62,7 @@ int bound_call(CfgHandle* handle, const char* call, Operation operation,
                const throw_site& site = {}) noexcept {
     return handle_call(
         handle, call,
-        [&]() -> int {
-            if (!handle->fileName || !handle->file) {
-                return CFG_PARAM_ERROR;
-            }
-            return operation(*handle->file);
-        },
+        [&]() -> int { return is_bound(*handle) ? operation(*handle->file) : CFG_PARAM_ERROR; },
         site);
 }
 
