@@ -31,10 +31,12 @@
  *     and so is, if CFG_OPT_BACKUP_FILE names one, a copy of the file of before. The backup is
  *     complete before the first byte of the file changes: at every moment one of the two is a
  *     complete version. The file is overwritten in place; links to it, its owner and its mode
- *     stay. When a call returns anything else, the file is what it was, except as said below of
- *     codes 80 and 91 at cfg_modify_s(). The copy in memory is not rolled back: modifications
- *     before the one that was refused, and a change that could not be written, are seen by
- *     searches of this handle and are written with its next change. To drop them, unbind.
+ *     stay. A process that is killed in the middle leaves a file that no call loads (80/1002):
+ *     copy the backup over it. When a call returns anything else than 0, the file is what it was,
+ *     except as said below of codes 80 and 91 at cfg_modify_s(). The copy in memory is not rolled
+ *     back: modifications before the one that was refused, and a change that could not be
+ *     written, are seen by searches of this handle and are written with its next change. To drop
+ *     them, unbind.
  *  6. Many programs. Every program that uses this library sees the changes of the others at its
  *     next call, and no change is lost when several make one at the same time: each keeps the
  *     others away (flock(2) on the file itself) while it changes the file, and while it reads it. A
@@ -119,8 +121,9 @@ typedef struct ldapmod {
 
 /** @name Operations of a modification
  * @{ */
-#define LDAP_MOD_ADD 0x0000     /**< add the values; values that are there already are no error */
-#define LDAP_MOD_DELETE 0x0001  /**< delete the values, or the whole attribute when none is given \
+#define LDAP_MOD_ADD 0x0000 /**< add the values; values that are there already are no error */
+#define LDAP_MOD_DELETE                                                                           \
+    0x0001                      /**< delete the values, or the whole attribute when none is given \
                                  */
 #define LDAP_MOD_REPLACE 0x0002 /**< let the values take the place of all there are */
 #define LDAP_MOD_BVALUES 0x0080 /**< flag: the values are in mod_bvalues */

@@ -19,6 +19,9 @@ constexpr failure no_name{91, 1001, "Config filename is NULL!"};
 constexpr failure no_status{91, 1003, "_stat()"};
 constexpr failure not_opened{91, 1004, "ifstream()"};
 constexpr failure not_read{80, 1000, "System error reading file"};
+constexpr failure unfinished{80, 1002,
+                             "Configuration file was not written to its end; "
+                             "its backup is the complete version"};
 constexpr failure second_version{19, 1006, "More than 1 \"version\" attribute not allowed"};
 constexpr failure second_charset{19, 1006, "More than 1 \"charset\" attribute not allowed"};
 constexpr failure not_of_root{65, 1007, "\""};
@@ -239,6 +242,9 @@ bool LDIF_File::load_if_changed() {
     const auto body = [&] {
         if (!read_all(file.get(), static_cast<size_t>(file.status().st_size), text)) {
             raise_with(not_read, {}, name_file_and_errno(errno));
+        }
+        if (text.starts_with(unfinished_mark)) {
+            raise(unfinished);
         }
         load.run(text);
     };

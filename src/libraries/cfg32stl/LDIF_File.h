@@ -106,7 +106,7 @@ class LDIF_File {
     void write(const std::string& content, bool is_refreshed);
     cfg32::unique_fd open_for_writing(struct stat& status);
     void create();
-    void overwrite(int file, const struct stat& status, const std::string& content);
+    void overwrite(cfg32::unique_fd file, const struct stat& status, const std::string& content);
 
     // What is filled in of a failure.
     void name_file(LDIF_Exception& e) const { e.configFile = file_name_; }
@@ -133,6 +133,14 @@ class LDIF_File {
     cfg32::locked_file lock_;
     int lock_error_ = 0;  // why there is no lock, an errno
 };
+
+namespace cfg32 {
+
+/// What a file with a backup begins with while it is written.
+inline constexpr std::string_view unfinished_mark =
+    "# This file is being written. If it stays so, its backup is the complete version.\n";
+
+}  // namespace cfg32
 
 /// The tree at an entry in plain characters. prefix is what precedes it on its line; undefined
 /// takes the DNs that are missing between an entry and the one it is drawn below.

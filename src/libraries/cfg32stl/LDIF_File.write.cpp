@@ -145,10 +145,7 @@ void LDIF_File::write(const std::string& content, bool is_refreshed) {
     if (!is_same_file(status, lock_.status()) || (is_refreshed && !is_current(status))) {
         raise_with(changed_meanwhile, {}, [&](LDIF_Exception& e) { name_file(e); });
     }
-    overwrite(file.get(), status, content);
-    if (!make_later(file.get(), status.st_mtim) || !file.close()) {
-        raise_with(not_written, {}, name_file_and_errno(errno));
-    }
+    overwrite(std::move(file), status, content);
     if (stat(file_name_.c_str(), &status) != 0) {
         raise_with(no_status, {}, name_file_and_errno(errno));
     }
@@ -185,19 +182,23 @@ void LDIF_File::create() {
 }
 
 /// Makes content the open file's, or puts back what was there.
-void LDIF_File::overwrite(int file, const struct stat& status, const std::string& content) {
+void LDIF_File::overwrite(unique_fd file, const struct stat& status, const std::string& content) {
     std::string before;
-    if (!read_all(file, static_cast<size_t>(status.st_size), before) ||
-        !reserve(file, before.size(), content)) {
+    if (!read_all(file.get(), static_cast<size_t>(status.st_size), before) ||
+        !reserve(file.get(), before.size(), content)) {
         raise_with(not_written, {}, name_file_and_errno(errno));
     }
     is_loaded_ = false;  // until it is known what the file has become
-    if (cfg32::overwrite(file, content)) {
+    // A process that is killed in the middle leaves a file that no load takes for a complete one:
+    // it would repair what can't be read, and let the backup be overwritten by it.
+    const std::string_view mark = backup_file_name_.empty() ? "" : unfinished_mark;
+    if (cfg32::overwrite(file.get(), content, mark) && make_later(file.get(), status.st_mtim) &&
+        file.close()) {
         return;
     }
     LDIF_Exception e = make_exception(not_written);
     name_file_and_errno(errno)(e);
-    if (!cfg32::overwrite(file, before)) {
+    if (!cfg32::overwrite(lock_.get(), before, mark)) {
         e.cause = std::make_unique<LDIF_Exception>(make_exception(not_put_back));
         name_file_and_errno(errno)(*e.cause);
     }

@@ -135,8 +135,13 @@ bool reserve(int file, size_t present, std::string_view text) {
     return is_possible ? result == 0 : write_tail(file, present, text);
 }
 
-bool overwrite(int file, std::string_view text) {
-    return write_all(file, text, 0) && resize(file, text.size()) &&
+bool overwrite(int file, std::string_view text, std::string_view mark) {
+    if (text.size() < mark.size()) {
+        mark = {};
+    }
+    // The mark is less than what the system writes at once: it is there, or it isn't.
+    return write_all(file, mark, 0) && write_all(file, text.substr(mark.size()), mark.size()) &&
+           resize(file, text.size()) && write_all(file, text.substr(0, mark.size()), 0) &&
            retry_interrupted([=] { return fdatasync(file); }) == 0;
 }
 

@@ -16,8 +16,9 @@ bool read_all(int file, size_t expected, std::string& text);
 /// After a failure the file is what it was.
 bool reserve(int file, size_t present, std::string_view text);
 
-/// Makes the text the file's whole content, on the disk.
-bool overwrite(int file, std::string_view text);
+/// Makes the text the file's whole content, on the disk. Until it is complete the file begins with
+/// the mark, if there is one; a text that is shorter than the mark does without.
+bool overwrite(int file, std::string_view text, std::string_view mark = {});
 
 /// Makes the file's modification time a later one than `before`, if it isn't.
 bool make_later(int file, const timespec& before);
