@@ -121,10 +121,8 @@ typedef struct ldapmod {
 
 /** @name Operations of a modification
  * @{ */
-#define LDAP_MOD_ADD 0x0000 /**< add the values; values that are there already are no error */
-#define LDAP_MOD_DELETE                                                                           \
-    0x0001                      /**< delete the values, or the whole attribute when none is given \
-                                 */
+#define LDAP_MOD_ADD 0x0000     /**< add the values; values that are there already are no error */
+#define LDAP_MOD_DELETE 0x0001  /**< delete the values; without values, the whole attribute */
 #define LDAP_MOD_REPLACE 0x0002 /**< let the values take the place of all there are */
 #define LDAP_MOD_BVALUES 0x0080 /**< flag: the values are in mod_bvalues */
 /** @} */
@@ -230,8 +228,8 @@ CFG32_API CfgHandle *cfg_init(void) CFG32_NOEXCEPT;
  *         51 (DSA is busy) when another program kept the file for ten seconds;
  *         65 (Object class violation) for an attribute outside of an entry, save one "version" and
  *         one "charset" line that can be used;
- *         80 for a failure of the system (exhausted memory included) or of the library, or when no
- *         file name is known;
+ *         80 for a failure of the system (exhausted memory included) or of the library, when no
+ *         file name is known, or for a file that was not written to its end;
  *         83 (Encoding error) for a password that is too long when it is encoded;
  *         84 (Decoding error) for a stored password that can't be decoded with the key given;
  *         86 for another method;
