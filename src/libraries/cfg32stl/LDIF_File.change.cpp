@@ -1,6 +1,8 @@
 // Changing the store.
 
+#include <cerrno>
 #include <string>
+#include <vector>
 
 #include "LDIF_File.h"
 #include "LDIF_Line.h"
@@ -22,43 +24,28 @@ constexpr failure not_readable{21, 1005, "Attribute would not read back as it is
 constexpr failure not_a_leaf{66, 66, "Use CFG_OPT_DELETE_NON_LEAVES to enable subtree delete"};
 
 /// What a modification record (RFC 1823, 4.8) says.
-class modification {
-  public:
-    explicit modification(const ldapmod& mod) : mod_(mod) {}
+struct modification {
+    explicit modification(const ldapmod& mod);
 
-    int operation() const { return mod_.mod_op & ~LDAP_MOD_BVALUES; }
-    unsigned int code() const { return static_cast<unsigned int>(mod_.mod_op); }
-    bool is_binary() const { return (mod_.mod_op & LDAP_MOD_BVALUES) != 0; }
-    const char* name() const { return mod_.mod_type ? mod_.mod_type : empty_str; }
+    int code;  ///< the operation, flag included
+    const char* name;
+    std::vector<const char*> values;
 
-    bool has_values() const {
-        return is_binary() ? mod_.mod_bvalues && *mod_.mod_bvalues
-                           : mod_.mod_values && *mod_.mod_values;
-    }
-
-    /// Calls use(text) for each value, until it returns false.
-    template <class Use>
-    void for_each_value(Use use) const;
-
-  private:
-    const ldapmod& mod_;
+    int operation() const { return code & ~LDAP_MOD_BVALUES; }
+    bool is_binary() const { return (code & LDAP_MOD_BVALUES) != 0; }
 };
 
-template <class Use>
-void modification::for_each_value(Use use) const {
-    if (!has_values()) {
-        return;
-    }
+modification::modification(const ldapmod& mod)
+    : code(mod.mod_op), name(mod.mod_type ? mod.mod_type : empty_str) {
     if (!is_binary()) {
-        for (char* const* value = mod_.mod_values; *value && use(*value); ++value) {
+        for (char* const* value = mod.mod_values; value && *value; ++value) {
+            values.push_back(*value);
         }
         return;
     }
     // KEPT: a binary value is a text, too; its length is not looked at.
-    for (berval* const* value = mod_.mod_bvalues; *value; ++value) {
-        if (!use((*value)->bv_val ? (*value)->bv_val : empty_str)) {
-            return;
-        }
+    for (berval* const* value = mod.mod_bvalues; value && *value; ++value) {
+        values.push_back((*value)->bv_val ? (*value)->bv_val : empty_str);
     }
 }
 
@@ -83,9 +70,12 @@ auto naming(const LDIF_Attribute& attribute, const LDIF_Value& value) {
 /// Callers choose names and values that no line of a file could have.
 void require_readable(const LDIF_Attribute& attribute) {
     for (const LDIF_Value& value : attribute.values()) {
-        if (!reads_back(attribute.name(), value.str())) {
-            raise_with(not_readable, {}, naming(attribute, value));
-        }
+        const auto body = [&] {
+            if (!reads_back(attribute.name(), value.str())) {
+                raise(not_readable);
+            }
+        };
+        with_context(body, naming(attribute, value));
     }
 }
 
@@ -118,39 +108,34 @@ void erase(LDIF_Attributes& attributes, const LDIF_Attribute& attribute) {
 }
 
 void delete_values(LDIF_Attributes& attributes, const modification& mod) {
-    LDIF_Attribute* found = find(attributes, cisString(mod.name()));
+    LDIF_Attribute* found = find(attributes, cisString(mod.name));
     if (!found) {
         raise_with(no_attribute, {}, [&](LDIF_Exception& e) {
-            e.attribute = mod.name();
+            e.attribute = mod.name;
             // KEPT: where a value is expected, the name of the attribute stands again.
-            e.value = !mod.has_values() ? "<NULL>" : mod.is_binary() ? "<binary>" : mod.name();
+            e.value = mod.values.empty() ? "<NULL>" : mod.is_binary() ? "<binary>" : mod.name;
         });
     }
-    if (mod.has_values()) {
-        mod.for_each_value([&](const char* value) {
-            if (!found->values().empty()) {
-                found->values() -= value;
-            }
-            return !found->values().empty();
-        });
+    LDIF_Values& present = found->values();
+    for (size_t i = 0; i < mod.values.size() && !present.empty(); ++i) {
+        present -= mod.values[i];
     }
-    if (!mod.has_values() || found->values().empty()) {
+    if (mod.values.empty() || present.empty()) {
         erase(attributes, *found);
     }
 }
 
 /// The attribute that a modification brings, its values checked by their syntax.
 LDIF_Attribute attribute_of(const modification& mod, aes_key_data* key) {
-    LDIF_Attribute attribute(key, mod.name(), {});
-    mod.for_each_value([&](const char* value) {
+    LDIF_Attribute attribute(key, mod.name, {});
+    for (const char* value : mod.values) {
         attribute += std::string(value);
-        return true;
-    });
+    }
     return attribute;
 }
 
 void add_values(LDIF_Entry& entry, const modification& mod, aes_key_data* key) {
-    if (!mod.has_values()) {
+    if (mod.values.empty()) {
         return;
     }
     LDIF_Attribute attribute = attribute_of(mod, key);
@@ -160,11 +145,11 @@ void add_values(LDIF_Entry& entry, const modification& mod, aes_key_data* key) {
 }
 
 void replace_values(LDIF_Entry& entry, const modification& mod, aes_key_data* key) {
-    LDIF_Attribute* present = find(entry.attributes(), cisString(mod.name()));
+    LDIF_Attribute* present = find(entry.attributes(), cisString(mod.name));
     if (!present) {
         return add_values(entry, mod, key);
     }
-    if (!mod.has_values()) {
+    if (mod.values.empty()) {
         return erase(entry.attributes(), *present);
     }
     const auto attribute = [&] {
@@ -192,7 +177,8 @@ void apply(LDIF_Entry& entry, const modification& mod, aes_key_data* key) {
             return replace_values(entry, mod, key);
         default:
             char message[32];
-            nuv_snprintf(message, sizeof message, "Unknown mod_op: %u", mod.code());
+            nuv_snprintf(message, sizeof message, "Unknown mod_op: %u",
+                         static_cast<unsigned int>(mod.code));
             raise(unknown_operation, message);
     }
 }
@@ -209,10 +195,12 @@ LDIF_Entry& nearest_ancestor(LDIF_Entry& root, LDIF_DN dn) {
 
 }  // namespace
 
-/// What a report says of a failed change.
-void LDIF_File::name_entry(LDIF_Exception& e, const LDIF_DN& dn) const {
+/// Completes the report of a failed change. Exhausted memory may have left it half done: the next
+/// refresh reads the file again.
+void LDIF_File::note_failure(LDIF_Exception& e, const LDIF_DN& dn) {
     name_file(e);
     e.entryDn = shown(dn);
+    is_loaded_ = is_loaded_ && e.sysErrno != ENOMEM;
 }
 
 void LDIF_File::modify(const LDIF_DN& dn, ldapmod** mods) {
@@ -228,7 +216,7 @@ void LDIF_File::modify(const LDIF_DN& dn, ldapmod** mods) {
             apply(*entry, modification(**mods), key_);
         }
     };
-    with_boundary(in("LDIF_File::modify()"), body, [&](LDIF_Exception& e) { name_entry(e, dn); });
+    with_boundary(in("LDIF_File::modify()"), body, [&](LDIF_Exception& e) { note_failure(e, dn); });
 }
 
 void LDIF_File::add(const LDIF_DN& dn, ldapmod** mods) {
@@ -246,7 +234,7 @@ void LDIF_File::add(const LDIF_DN& dn, ldapmod** mods) {
         }
         root_ += std::move(added);
     };
-    with_boundary(in("LDIF_File::add()"), body, [&](LDIF_Exception& e) { name_entry(e, dn); });
+    with_boundary(in("LDIF_File::add()"), body, [&](LDIF_Exception& e) { note_failure(e, dn); });
 }
 
 void LDIF_File::erase(const LDIF_DN& dn, bool deleteNonLeaves) {
@@ -262,5 +250,5 @@ void LDIF_File::erase(const LDIF_DN& dn, bool deleteNonLeaves) {
         }
         parent.erase(*entry);
     };
-    with_boundary(in("LDIF_File::erase()"), body, [&](LDIF_Exception& e) { name_entry(e, dn); });
+    with_boundary(in("LDIF_File::erase()"), body, [&](LDIF_Exception& e) { note_failure(e, dn); });
 }

@@ -110,7 +110,7 @@ class LDIF_File {
 
     // What is filled in of a failure.
     void name_file(LDIF_Exception& e) const { e.configFile = file_name_; }
-    void name_entry(LDIF_Exception& e, const LDIF_DN& dn) const;
+    void note_failure(LDIF_Exception& e, const LDIF_DN& dn);
     auto name_file_and_errno(int error) const {
         return [this, error](LDIF_Exception& e) {
             name_file(e);
