@@ -43,7 +43,7 @@
  *     call that has to wait for longer than ten seconds gives up with CFG_BUSY (51).
  *  7. Secrets. Passwords that a search decoded are wiped when their result is freed. Copies made by
  *     cfg_get_values() are the caller's to wipe. The report of a failure holds the value that was
- *     refused, which may be a password: don't log it where others read.
+ *     refused, or a whole entry, with which may come a password: don't log it where others read.
  *  8. Threads. A handle, its results and their cursors belong to one thread at a time. Handles
  *     are independent of each other, save for the two process-wide options CFG_OPT_SHOW_SOURCE and
  *     CFG_OPT_SHOW_STACK.
@@ -542,7 +542,10 @@ CFG32_API const char *cfg_get_file_name(CfgHandle *handle) CFG32_NOEXCEPT;
 /** Returns the line of that file, counted from 1; 0 when none is known and for a null handle. */
 CFG32_API int cfg_get_file_line(CfgHandle *handle) CFG32_NOEXCEPT;
 
-/** Returns the DN of the entry; "" when the failure tells none, null without a failure or handle.
+/**
+ * Returns the DN of the entry; for a refused search filter, the whole text of the base entry.
+ *
+ * @return "" when the failure tells none, null without a failure or handle.
  */
 CFG32_API const char *cfg_get_entry(CfgHandle *handle) CFG32_NOEXCEPT;
 
@@ -579,8 +582,8 @@ CFG32_API int cfg_get_is_single(CfgHandle *handle) CFG32_NOEXCEPT;
  * @param style  CFG_TREE_ASCII, or another number for the line-drawing bytes of code page 437
  * @return text that belongs to the handle until the next call that resets it; a second call before
  *         that returns the same text, whatever the style. Null for a handle that is null or not
- *         bound, when memory is exhausted, and when an entry's DN can't be printed; the handle
- *         tells which.
+ *         bound, when memory is exhausted, and when an entry's DN can't be printed (cfg_flush_s()
+ *         tells which).
  */
 CFG32_API char *cfg_tree_view(CfgHandle *handle, int style) CFG32_NOEXCEPT;
 

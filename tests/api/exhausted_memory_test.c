@@ -317,6 +317,34 @@ static void dump_exception_gives_null_and_later_the_report(void **state) {
     }
 }
 
+/* Frees the drawing, and sees that it was the handle's. */
+static void assert_reset_frees(CfgHandle *handle, const char *tree, long before) {
+    watch_block(tree, strlen(tree) + 1);
+    cfg_reset(handle);
+    assert_non_null(freed_bytes());
+    assert_nothing_is_left(before);
+}
+
+static void tree_view_gives_null_and_later_the_drawing(void **state) {
+    struct fixture *f = *state;
+    for (int style = CFG_TREE_ASCII; style <= CFG_TREE_CP437; ++style) {
+        const long before = live_blocks();
+        for (long n = 1;; ++n) {
+            fail_call(call_any, n);
+            const char *tree = cfg_tree_view(f->handle, style);
+            if (stop_failing() == 0) {
+                assert_non_null(tree);
+                assert_true(n > 2);
+                assert_reset_frees(f->handle, tree, before);
+                break;
+            }
+            assert_null(tree);
+            cfg_reset(f->handle);
+            assert_nothing_is_left(before);
+        }
+    }
+}
+
 static void a_failure_that_can_not_be_recorded_still_has_a_code(void **state) {
     struct fixture *f = *state;
     CfgMessage *result = NULL;
@@ -355,6 +383,7 @@ int main(void) {
         BOUND(first_attribute_gives_90_and_a_null_cursor),
         BOUND(next_attribute_gives_90_and_goes_on),
         CREATED(dump_exception_gives_null_and_later_the_report),
+        BOUND(tree_view_gives_null_and_later_the_drawing),
         BOUND(a_failure_that_can_not_be_recorded_still_has_a_code),
     };
     reset_host();

@@ -166,7 +166,25 @@ int search_all(CfgHandle *handle) {
     return code;
 }
 
+int modify_one(CfgHandle *handle, const char *dn, int operation, const char *name,
+               const char *value) {
+    char *values[] = {(char *)value, NULL};
+    LDAPMod change = {
+        .mod_op = operation, .mod_type = (char *)name, .mod_values = value ? values : NULL};
+    LDAPMod *changes[] = {&change, NULL};
+    return cfg_modify_s(handle, dn, changes);
+}
+
 /* ---- expectations ---- */
+
+void assert_text(const char *text, const char *expected) {
+    if (!expected) {
+        assert_null(text);
+        return;
+    }
+    assert_non_null(text);
+    assert_string_equal(text, expected);
+}
 
 void assert_report_has(CfgHandle *handle, int code, const char *text) {
     assert_int_equal(cfg_get_errno(handle), code);

@@ -81,9 +81,14 @@ void load(const struct fixture *f, const char *text);
 CfgMessage *found(CfgHandle *handle, const char *base, int scope, const char *filter, char **attrs);
 /** The result code of a subtree search of the whole configuration. */
 int search_all(CfgHandle *handle);
+/** cfg_modify_s with one modification, of one value; a null value is none. */
+int modify_one(CfgHandle *handle, const char *dn, int operation, const char *name,
+               const char *value);
 
 /* Expectations */
 
+/** The text is the expected one, or both are null. */
+void assert_text(const char *text, const char *expected);
 /** The handle holds the code, and a report that has the text. */
 void assert_report_has(CfgHandle *handle, int code, const char *text);
 /** The handle holds the code and no report. */

@@ -93,6 +93,7 @@ LDIF_Search_Results& LDIF_Search_Results::addEntry(const LDIF_Entry& entry, cons
             }
         }
     };
+    // KEPT: the entry is told by its whole text, not by its DN.
     with_boundary(in("LDIF_Search_Results::addEntry()"), body,
                   [&](LDIF_Exception& e) { e.entryDn = shown(entry); });
     return *this;

@@ -2,6 +2,7 @@
 // cfg_tree_view.
 
 #include <cstring>
+#include <exception>
 
 #include "LDIF_AttrType.h"
 #include "LDIF_File.h"
@@ -92,11 +93,12 @@ char* cfg_tree_view(CfgHandle* handle, int style) noexcept {
         return nullptr;
     }
     if (!handle->treeText && is_bound(*handle)) {
-        // The report of the last failure stays, unless the drawing itself fails.
-        guarded(*handle, "cfg_tree_view()", [&] {
+        try {
             handle->treeText = strdup(handle->file->treeView(style != 0).c_str());
-            return handle->err;
-        });
+        } catch (const std::exception&) {
+            // The handle still tells of the last call that failed, not of this one.
+            return nullptr;
+        }
     }
     return handle->treeText;
 }

@@ -22,8 +22,7 @@ namespace cfg32 {
 
 int record(CfgHandle& handle, const LDIF_Exception& e) noexcept {
     try {
-        auto copy = std::make_unique<LDIF_Exception>(e);
-        delete std::exchange(handle.exception, copy.release());
+        handle.exception = std::make_unique<LDIF_Exception>(e).release();
         return handle.err = e.ldapErr;
     } catch (const std::bad_alloc&) {
         return handle.err = CFG_NO_MEMORY;

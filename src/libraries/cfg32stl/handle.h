@@ -36,7 +36,7 @@ inline bool is_bound(const CfgHandle& handle) { return handle.fileName && handle
 
 /// Runs body, which returns a result code, and keeps the code, or what it throws, in the handle.
 template <class Body>
-int guarded(CfgHandle& handle, const char* call, Body body, const throw_site& site = {}) noexcept {
+int guarded(CfgHandle& handle, const char* call, Body body, const throw_site& site) noexcept {
     try {
         return handle.err = body();
     } catch (const LDIF_Exception& e) {
