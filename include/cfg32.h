@@ -215,7 +215,8 @@ CFG32_API CfgHandle *cfg_init(void) CFG32_NOEXCEPT;
  * rewritten at once, after a backup if CFG_OPT_BACKUP_FILE names one.
  *
  * @param handle    a created handle
- * @param dn        the administrator's DN, or null with a null password for an anonymous bind
+ * @param dn        the administrator's DN, or null with a null password for an anonymous bind;
+ *                  that one may change the file, too: who may is up to the file's own permissions
  * @param password  in clear text
  * @param method    CFG_AUTH_SIMPLE
  * @return 0;

@@ -12,9 +12,11 @@
 #include "LDIF_File.h"
 #include "cfg32_platform.h"
 #include "temporary_folder.h"
+#include "tree_description.h"
 #include "utf8_locale.h"
 
 using cfg32::for_each_in_preorder;
+using cfg32::tests::description;
 using cfg32::tests::temporary_folder;
 
 namespace {
@@ -112,9 +114,11 @@ TEST_F(oruslapd_conf, EveryPasswordIsStoredEncodedAndAllButTheHashedOneDecode) {
 }
 
 TEST_F(oruslapd_conf, IsWrittenSoThatItReadsBack) {
+    const std::string tree = description(*file);
     file->flush();
     const std::string written = folder.read("oruslapd.conf");
     LDIF_File again(path, "", key.get());
+    EXPECT_EQ(description(again), tree);
     again.flush();
     EXPECT_EQ(folder.read("oruslapd.conf"), written);
 }

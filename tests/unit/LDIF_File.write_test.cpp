@@ -4,14 +4,13 @@
 
 #include <cerrno>
 #include <csignal>
-#include <memory>
 #include <stdexcept>
 #include <string>
+#include <tuple>
 
 #include "LDIF_Exception.h"
-#include "LDIF_File.h"
 #include "failures.h"
-#include "temporary_folder.h"
+#include "stores.h"
 
 using namespace cfg32::tests;
 using testing::EndsWith;
@@ -21,26 +20,11 @@ namespace {
 
 const char* const content = "charset: x\nversion: 1\n\n# c\ndn: cn=a\nsn: 1\n\n# end\n";
 
-struct LDIF_File_flush : testing::Test {
-    temporary_folder folder;
-    const std::string path = folder.file("conf");
-    const std::string backup = folder.file("backup");
-
-    std::unique_ptr<LDIF_File> store(const std::string& text, const std::string& backup_name = "") {
-        folder.write("conf", text);
-        return std::make_unique<LDIF_File>(path, backup_name, nullptr);
-    }
-
-    struct stat status_of(const std::string& name) const {
-        struct stat status {};
-        EXPECT_EQ(lstat(folder.file(name).c_str(), &status), 0) << name;
-        return status;
-    }
-};
+struct LDIF_File_flush : store_test {};
 
 /// Adds a value to the store's entry cn=a.
 void add_value(LDIF_File& file, const std::string& value) {
-    const LDIF_Entry* entry = file.root().find(LDIF_DN(cisString("cn=a")));
+    const LDIF_Entry* entry = file.root().find(dn_of("cn=a"));
     const_cast<LDIF_Entry&>(*entry) += LDIF_Attribute(nullptr, "sn", value);
 }
 
@@ -400,4 +384,66 @@ TEST_F(LDIF_File_flush, FailedWriteIsMadeGoodByTheNext) {
     ASSERT_EQ(rmdir(path.c_str()), 0);
     file->flush();
     EXPECT_THAT(folder.read("conf"), HasSubstr("sn: 2\n"));
+}
+
+// The modification time alone tells others that there is something new.
+TEST_F(LDIF_File_flush, EveryWriteMakesTheModificationTimeALaterOne) {
+    const auto file = store(content);
+    timespec before = status_of("conf").st_mtim;
+    for (int i = 0; i < 500; ++i) {
+        file->flush();
+        const timespec after = status_of("conf").st_mtim;
+        ASSERT_TRUE(std::tie(after.tv_sec, after.tv_nsec) > std::tie(before.tv_sec, before.tv_nsec))
+            << i;
+        ASSERT_EQ(file->refresh(), 0);
+        before = after;
+    }
+}
+
+TEST_F(LDIF_File_flush, ModificationTimeInTheFutureBecomesALaterOneToo) {
+    const auto file = store(content);
+    folder.touch("conf", 1'000'000);
+    const timespec before = status_of("conf").st_mtim;
+    LDIF_File reader(path, "", nullptr);
+    file->flush();
+    const timespec after = status_of("conf").st_mtim;
+    EXPECT_TRUE(std::tie(after.tv_sec, after.tv_nsec) > std::tie(before.tv_sec, before.tv_nsec));
+    EXPECT_EQ(file->refresh(), 0);
+    EXPECT_EQ(reader.refresh(), 1);
+}
+
+// It would cut off what the load did not come to.
+TEST_F(LDIF_File_flush, StoreOfHalfAFileIsNotWritten) {
+    const char* const second = "version: 1\n\ndn: cn=a\nsn: 1\n\nsn: outside\n\ndn: cn=b\n\n";
+    for (const std::string& name : {std::string(), backup}) {
+        const auto file = store(content, name);
+        folder.write("conf", second);
+        folder.touch("conf", 1);
+        failure_of([&] { file->refresh(); });
+        ASSERT_TRUE(file->root().find(dn_of("cn=a"))) << "the load ended in the middle";
+        const timespec time = status_of("conf").st_mtim;
+        const LDIF_Exception e = failure_of([&] { file->flush(); });
+        EXPECT_EQ(summary(e), "80/1000 Configuration file was not read to its end");
+        EXPECT_EQ(e.configFile, path);
+        EXPECT_EQ(folder.read("conf"), second);
+        EXPECT_EQ(status_of("conf").st_mtim.tv_nsec, time.tv_nsec);
+        EXPECT_FALSE(folder.has("backup"));
+        folder.write("conf", content);
+        file->refresh();
+        file->flush();
+        EXPECT_EQ(folder.read("conf"), content);
+    }
+}
+
+// Otherwise no later change could be written either.
+TEST_F(LDIF_File_flush, WhatWouldNotReadBackIsForgottenByTheNextRefresh) {
+    const auto file = store(content);
+    add_value(*file, "a\nb");
+    EXPECT_EQ(summary(failure_of([&] { file->flush(); })),
+              "21/1005 Entry would not read back as it is written");
+    EXPECT_EQ(file->refresh(), 1);
+    EXPECT_EQ(text_of(*file), content);
+    file->flush();
+    EXPECT_EQ(folder.read("conf"), content);
+    EXPECT_EQ(file->refresh(), 0);
 }

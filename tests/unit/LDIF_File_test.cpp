@@ -387,6 +387,27 @@ TEST_F(LDIF_File_load, BadLinesThatCannotBeBackedUpEndTheLoadAndLeaveTheFile) {
     EXPECT_EQ(folder.read("conf"), text);
 }
 
+// What looks like an entry may be half of one, and what looks like a bad line the seam of two.
+TEST_F(LDIF_File_load, FileThatWasNotWrittenToItsEndIsRefusedAndNothingIsWritten) {
+    const std::string mark(cfg32::unfinished_mark);
+    const std::string good = "version: 1\n\ndn: cn=a\nsn: 1\n";
+    for (const std::string& text : {mark, mark + good, mark + "garbage\n" + good}) {
+        SCOPED_TRACE(text);
+        put(text);
+        folder.write("backup", good);
+        const LDIF_Exception e =
+            failure_of([&] { LDIF_File(path, folder.file("backup"), nullptr); });
+        EXPECT_EQ(summary(e),
+                  "80/1002 Configuration file was not written to its end; its backup is the "
+                  "complete version");
+        EXPECT_EQ(e.configFile, path);
+        EXPECT_EQ(folder.read("conf"), text);
+        EXPECT_EQ(folder.read("backup"), good);
+    }
+    // Anywhere else the line is a comment like any other.
+    load(good + mark);
+}
+
 TEST_F(LDIF_File_load, FileOfValidLinesIsNotWritten) {
     const char* const text = "dn: CN=b;cn=a\nsn: 2\ncn: b\n\n\n# c\n\n";
     put(text);

@@ -1,17 +1,18 @@
 #include "child_index.h"
 
 #include <gmock/gmock.h>
-#include <pthread.h>
 
-#include <algorithm>
-#include <cctype>
-#include <random>
 #include <sstream>
 #include <string>
 #include <utility>
 #include <vector>
 
+#include "model_tree.h"
+#include "random_names.h"
+#include "small_stack.h"
+
 using cfg32::child_index;
+using namespace cfg32::tests;
 using testing::ElementsAre;
 using testing::IsEmpty;
 
@@ -19,133 +20,11 @@ namespace {
 
 LDIF_DN dn_of(const std::string& text) { return LDIF_DN(cisString(text)); }
 
-// An entry's place as its rules say it literally: children are a list that is walked in order, and
-// names are compared part by part.
-
-using steps = std::vector<std::string>;  // a DN's RDNs, root first, in lower case
-
-steps steps_of(const LDIF_DN& dn) {
-    steps all;
-    for (const LDIF_RDN& rdn : dn.rdns()) {
-        std::string text = rdn.str();
-        for (char& c : text) {
-            c = static_cast<char>(tolower(static_cast<unsigned char>(c)));
-        }
-        all.push_back(text);
-    }
-    return all;
-}
-
-steps intersection(const steps& a, const steps& b) {
-    return {a.begin(), std::mismatch(a.begin(), a.end(), b.begin(), b.end()).first};
-}
-
-struct model_entry {
-    steps relative;
-    std::string dn;  // as it is printed; "" for the root
-    std::string comment;
-    std::string values;  // of "sn"
-    std::vector<model_entry> children;
-
-    const model_entry& add(model_entry child) {
-        if (child.relative == relative) {
-            comment += child.comment;
-            values += child.values;
-            for (const model_entry& grandchild : child.children) {
-                place(grandchild);
-            }
-            return *this;
-        }
-        const steps common = intersection(relative, child.relative);
-        EXPECT_EQ(common, relative);
-        child.relative.erase(child.relative.begin(),
-                             child.relative.begin() + static_cast<ptrdiff_t>(common.size()));
-        return place(std::move(child));
-    }
-
-    /// child's name is relative to this entry already.
-    const model_entry& place(model_entry child) {
-        for (size_t i = 0; i < children.size();) {
-            model_entry& c = children[i];
-            const steps common = intersection(c.relative, child.relative);
-            if (c.relative == child.relative || c.relative == common) {
-                return c.add(std::move(child));
-            }
-            if (child.relative == common) {
-                child.add(c);
-                children.erase(children.begin() + static_cast<ptrdiff_t>(i));
-            } else {
-                ++i;
-            }
-        }
-        children.push_back(std::move(child));
-        return *this;
-    }
-
-    const model_entry* find(const steps& dn_steps) const {
-        if (relative == dn_steps) {
-            return this;
-        }
-        const steps common = intersection(relative, dn_steps);
-        if (common != relative) {
-            return nullptr;
-        }
-        const steps rest(dn_steps.begin() + static_cast<ptrdiff_t>(common.size()), dn_steps.end());
-        for (const model_entry& c : children) {
-            if (const model_entry* found = c.find(rest)) {
-                return found;
-            }
-        }
-        return nullptr;
-    }
-
-    std::string str() const {
-        std::string text = comment;
-        if (!dn.empty()) {
-            text += "dn: " + dn + "\n";
-        }
-        for (const char value : values) {
-            text += std::string("sn: ") + value + "\n";
-        }
-        return text + (dn.empty() && children.empty() ? "" : "\n");
-    }
-};
-
 void print(const model_entry& entry, std::string& out) {
     out += entry.str();
     for (const model_entry& child : entry.children) {
         print(child, out);
     }
-}
-
-/// The relative names and the nesting of a tree, one line for an entry.
-void print_shape(const model_entry& entry, size_t depth, std::string& out) {
-    out.append(depth, ' ');
-    for (const std::string& step : entry.relative) {
-        out += "/" + step;
-    }
-    out += "\n";
-    for (const model_entry& child : entry.children) {
-        print_shape(child, depth + 1, out);
-    }
-}
-
-void print_shape(const LDIF_Entry& entry, size_t depth, std::string& out) {
-    out.append(depth, ' ');
-    for (const std::string& step : steps_of(entry.relative_dn())) {
-        out += "/" + step;
-    }
-    out += "\n";
-    for (const LDIF_Entry& child : entry.children()) {
-        print_shape(child, depth + 1, out);
-    }
-}
-
-template <class Entry>
-std::string shape(const Entry& entry) {
-    std::string text;
-    print_shape(entry, 0, text);
-    return text;
 }
 
 std::string file_text(const LDIF_Entry& entry) {
@@ -160,25 +39,9 @@ std::string file_text(const model_entry& entry) {
     return text;
 }
 
-class random_names {
+class random_entries : public random_names {
   public:
-    explicit random_names(unsigned seed) : random_(seed) {}
-
-    unsigned below(unsigned count) { return static_cast<unsigned>(random_() % count); }
-
-    std::string rdn() {
-        static const char* const pool[] = {"cn=a", "CN=A", "cn=b", "o=a",       "ou=x",
-                                           "OU=X", "cn=c", "sn=a", "cn=a+sn=b", "SN=B+cn=a"};
-        return pool[below(std::size(pool))];
-    }
-
-    std::string dn(unsigned depth) {
-        std::string text = rdn();
-        while (--depth > 0) {
-            text += "," + rdn();
-        }
-        return text;
-    }
+    using random_names::random_names;
 
     LDIF_Entry entry(const std::string& text, model_entry& model) {
         const std::string comment = "# " + std::to_string(++number_);
@@ -203,7 +66,6 @@ class random_names {
     }
 
   private:
-    std::mt19937 random_;
     unsigned number_ = 0;
 };
 
@@ -221,26 +83,10 @@ void drop_repeated_values(model_entry& entry) {
     }
 }
 
-/// Runs body on a stack that is too small for a recursion down a deep tree.
-void on_a_small_stack(void (*body)()) {
-    constexpr size_t stack_size = 256 * 1024;
-    pthread_attr_t attributes;
-    ASSERT_EQ(pthread_attr_init(&attributes), 0);
-    ASSERT_EQ(pthread_attr_setstacksize(&attributes, stack_size), 0);
-    pthread_t thread;
-    const auto start = [](void* argument) -> void* {
-        (*static_cast<void (**)()>(argument))();
-        return nullptr;
-    };
-    ASSERT_EQ(pthread_create(&thread, &attributes, start, &body), 0);
-    EXPECT_EQ(pthread_join(thread, nullptr), 0);
-    pthread_attr_destroy(&attributes);
-}
-
 }  // namespace
 
 TEST(child_index, RandomInsertionsBuildTheTreeThatTheWalkOverAllSiblingsBuilds) {
-    random_names names(1);
+    random_entries names(1);
     for (int round = 0; round < 150; ++round) {
         SCOPED_TRACE(round);
         const unsigned count = 1 + names.below(60);
@@ -272,7 +118,7 @@ TEST(child_index, RandomInsertionsBuildTheTreeThatTheWalkOverAllSiblingsBuilds) 
 }
 
 TEST(child_index, RandomSubtreesArePlacedWhereTheWalkOverAllSiblingsPlacesThem) {
-    random_names names(2);
+    random_entries names(2);
     for (int round = 0; round < 150; ++round) {
         SCOPED_TRACE(round);
         LDIF_Entry root;
@@ -432,4 +278,30 @@ TEST(child_index, ErasedChildIsFoundNoMore) {
     EXPECT_EQ(children.nearest("cn=1,o=a"), "none");
     EXPECT_EQ(children.nearest("cn=2,o=a"), "cn=2, o=a");
     EXPECT_THAT(children.below("o=a"), ElementsAre("cn=2, o=a"));
+}
+
+TEST(child_index, TellsWhereAChildStands) {
+    indexed_entries children;
+    std::vector<child_index::position> positions;
+    for (const char* dn : {"o=a", "cn=2,cn=1,o=b", "cn=1,o=c", "cn=1+sn=2,o=d"}) {
+        positions.push_back(children.add(dn));
+    }
+    for (const auto position : positions) {
+        EXPECT_EQ(children.index.position_of(*position), position);
+    }
+    children.index.erase(positions[1]);
+    EXPECT_EQ(children.index.position_of(*positions[0]), positions[0]);
+    EXPECT_EQ(children.index.position_of(*positions[2]), positions[2]);
+}
+
+// A child is meant by itself and not by its name.
+TEST(child_index, TellsChildrenOfTheSameNameApart) {
+    indexed_entries children;
+    const auto first = children.add("cn=1,o=a");
+    const auto second = children.add("CN=1,O=A");
+    EXPECT_EQ(children.index.position_of(*first), first);
+    EXPECT_EQ(children.index.position_of(*second), second);
+    children.index.erase(first);
+    EXPECT_EQ(children.index.position_of(*second), second);
+    EXPECT_EQ(children.nearest("cn=1,o=a"), "CN=1, O=A");
 }

@@ -1,5 +1,6 @@
 #include "disk.h"
 
+#include <dlfcn.h>
 #include <gmock/gmock.h>
 #include <sys/resource.h>
 #include <sys/socket.h>
@@ -7,15 +8,44 @@
 
 #include <cerrno>
 #include <csignal>
+#include <cstdint>
 #include <cstdlib>
 #include <string>
 #include <utility>
 
 #include "open_regular.h"
 #include "temporary_folder.h"
+#include "unprivileged.h"
 
 using namespace cfg32;
+using cfg32::tests::as_nobody;
 using cfg32::tests::temporary_folder;
+
+namespace {
+
+constexpr int64_t second = 1'000'000'000;
+
+/// What the file system rounds the times down to that a program chooses, in nanoseconds.
+thread_local int64_t granularity = 1;
+
+timespec rounded(const timespec& time) {
+    const int64_t all = time.tv_sec * second + time.tv_nsec;
+    const int64_t less = all - all % granularity;
+    return {less / second, static_cast<long>(less % second)};
+}
+
+}  // namespace
+
+// Takes the place of the C library's, for file systems of all kinds.
+extern "C" int futimens(int file, const timespec times[2]) noexcept {
+    static const auto original =
+        reinterpret_cast<int (*)(int, const timespec*)>(dlsym(RTLD_NEXT, "futimens"));
+    if (!times || granularity == 1) {
+        return original(file, times);
+    }
+    const timespec coarse[2] = {times[0], rounded(times[1])};
+    return original(file, coarse);
+}
 
 namespace {
 
@@ -243,4 +273,155 @@ TEST_F(disk, FullDeviceIsReported) {
     ASSERT_TRUE(full);
     EXPECT_FALSE(overwrite(full.get(), "text"));
     EXPECT_NE(errno, 0);
+}
+
+TEST_F(disk, TextThatFitsNeedsNoRoom) {
+    const unique_fd file = opened(folder.write("f", "before"), O_RDONLY);
+    for (const char* text : {"", "short", "before"}) {
+        EXPECT_TRUE(reserve(file.get(), 6, text)) << text;
+    }
+}
+
+TEST_F(disk, RoomIsTakenBehindTheContent) {
+    constexpr blkcnt_t block_unit = 512;
+    const std::string before = "before";
+    const std::string after(1 << 20, 'x');
+    const unique_fd file = opened(folder.write("f", before), O_RDWR);
+    ASSERT_TRUE(reserve(file.get(), before.size(), after));
+    struct stat status {};
+    ASSERT_EQ(fstat(file.get(), &status), 0);
+    EXPECT_GE(status.st_blocks * block_unit, static_cast<off_t>(after.size()));
+    // Where a file system can't reserve, the part beyond the end is there already.
+    const std::string now = folder.read("f");
+    EXPECT_TRUE(now == before || now == before + after.substr(before.size()));
+}
+
+TEST_F(disk, RoomThatCannotBeTakenIsReportedAndChangesNothing) {
+    const unique_fd file = opened(folder.write("f", "before"), O_RDONLY);
+    EXPECT_FALSE(reserve(file.get(), 6, "longer than before"));
+    EXPECT_EQ(errno, EBADF);
+    EXPECT_EQ(folder.read("f"), "before");
+}
+
+TEST_F(disk, LimitOfTheProcessIsKeptToTheByte) {
+    const unique_fd file = opened(folder.write("f", "before"), O_RDWR);
+    const auto child = [&] {
+        limit_file_size(30);
+        const bool fits = reserve(file.get(), 6, std::string(30, 'x'));
+        const bool is_refused = !reserve(file.get(), 6, std::string(31, 'x')) && errno == EFBIG;
+        _exit(fits && is_refused ? 0 : 1);
+    };
+    EXPECT_EXIT(child(), testing::ExitedWithCode(0), "");
+}
+
+namespace {
+
+/// A file whose modification time can be seen and set.
+struct timed_file {
+    unique_fd file;
+
+    timespec time() const {
+        struct stat status {};
+        EXPECT_EQ(fstat(file.get(), &status), 0);
+        return status.st_mtim;
+    }
+
+    /// Returns the time that the file has then.
+    timespec set(const timespec& time) const {
+        const timespec times[2] = {time, time};
+        EXPECT_EQ(::futimens(file.get(), times), 0);
+        return this->time();
+    }
+};
+
+int64_t nanoseconds(const timespec& time) { return time.tv_sec * second + time.tv_nsec; }
+
+constexpr timespec some_time{1'000'000'000, 123'456'789};
+constexpr timespec end_of_a_second{1'000'000'000, 999'999'999};
+constexpr timespec future{4'000'000'000, 999'999'999};
+
+}  // namespace
+
+TEST_F(disk, TimeIsMadeTheNextOneThatThereIs) {
+    const timed_file file{opened(folder.write("f", "x"), O_RDWR)};
+    for (const timespec& time : {some_time, end_of_a_second, future, timespec{0, 0}}) {
+        const timespec before = file.set(time);
+        EXPECT_TRUE(make_later(file.file.get(), before));
+        EXPECT_EQ(nanoseconds(file.time()), nanoseconds(before) + 1) << time.tv_sec;
+    }
+}
+
+TEST_F(disk, TimeThatIsLaterAlreadyStays) {
+    const timed_file file{opened(folder.write("f", "x"), O_RDWR)};
+    const timespec now = file.set(some_time);
+    for (const timespec& before : {timespec{some_time.tv_sec, some_time.tv_nsec - 1},
+                                   timespec{some_time.tv_sec - 1, 999'999'999}, timespec{0, 0}}) {
+        EXPECT_TRUE(make_later(file.file.get(), before));
+        EXPECT_EQ(nanoseconds(file.time()), nanoseconds(now));
+    }
+}
+
+TEST_F(disk, TimeOfBeforeInTheFutureIsPassed) {
+    const timed_file file{opened(folder.write("f", "x"), O_RDWR)};
+    file.set(some_time);
+    EXPECT_TRUE(make_later(file.file.get(), future));
+    EXPECT_EQ(nanoseconds(file.time()), nanoseconds(future) + 1);
+}
+
+TEST_F(disk, OnlyTheModificationTimeIsSet) {
+    const std::string path = folder.write("f", "x");
+    const timed_file file{opened(path, O_RDWR)};
+    file.set(some_time);
+    EXPECT_TRUE(make_later(file.file.get(), some_time));
+    struct stat status {};
+    ASSERT_EQ(stat(path.c_str(), &status), 0);
+    EXPECT_EQ(nanoseconds(status.st_atim), nanoseconds(some_time));
+}
+
+TEST_F(disk, TimeIsMadeLaterWhereFileSystemsRoundItDown) {
+    const timed_file file{opened(folder.write("f", "x"), O_RDWR)};
+    for (const int64_t step : {int64_t{1}, int64_t{100}, int64_t{1000}, second, 2 * second}) {
+        for (const timespec& time : {some_time, end_of_a_second, future}) {
+            SCOPED_TRACE(std::to_string(step) + " " + std::to_string(time.tv_sec));
+            granularity = step;
+            const timespec before = file.set(time);
+            EXPECT_TRUE(make_later(file.file.get(), before));
+            granularity = 1;
+            EXPECT_GT(nanoseconds(file.time()), nanoseconds(before));
+            EXPECT_EQ(nanoseconds(file.time()) % step, 0);
+        }
+    }
+}
+
+TEST_F(disk, TimeThatCannotBeMadeLaterIsReported) {
+    const timed_file file{opened(folder.write("f", "x"), O_RDWR)};
+    granularity = 10 * second;
+    const timespec before = file.set(some_time);
+    errno = 0;
+    EXPECT_FALSE(make_later(file.file.get(), before));
+    EXPECT_EQ(errno, EOVERFLOW);
+    granularity = 1;
+    EXPECT_EQ(nanoseconds(file.time()), nanoseconds(before));
+    EXPECT_FALSE(make_later(-1, some_time));
+    EXPECT_EQ(errno, EBADF);
+}
+
+// Only the owner may choose a time, but who may write may set the present one.
+TEST_F(disk, TimeOfSomebodyElsesFileIsMadeThePresentOne) {
+    if (geteuid() != 0) {
+        GTEST_SKIP() << "only root can make a file of somebody else";
+    }
+    const std::string path = folder.write("f", "x");
+    ASSERT_EQ(chmod(path.c_str(), 0666), 0);
+    const timed_file file{opened(path, O_RDWR)};
+    const timespec before = file.set(some_time);
+    EXPECT_EQ(as_nobody([&] { return make_later(file.file.get(), before) ? 0 : 1; }), 0);
+    EXPECT_GT(nanoseconds(file.time()), nanoseconds(before));
+    // Which is of no use when the file's time lies in the future.
+    const timespec later = file.set(future);
+    const auto attempt = [&] {
+        return !make_later(file.file.get(), later) && errno == EPERM ? 0 : 1;
+    };
+    EXPECT_EQ(as_nobody(attempt), 0);
+    EXPECT_LE(nanoseconds(file.time()), nanoseconds(later));
 }

@@ -49,14 +49,16 @@ modification::modification(const ldapmod& mod)
     }
 }
 
-/// True when the line of a value reads back as that value of that attribute.
+/// True when the line of a value reads back, below another, as that value of that attribute.
 bool reads_back(const cisString& name, const std::string& value) {
-    const std::string text = name.text() + ": " + value + "\n";
+    const std::string text = "cn: x\n" + name.text() + ": " + value + "\n";
     line_source source(text);
+    LDIF_Line above;
     LDIF_Line line;
-    line.next(source, 0);
-    return source.position() == text.size() && line.hasSeparator && line.type == LDIF_Line::attr &&
-           line.attribute == name.text() && line.value == value;
+    above.next(source, 0);
+    line.next(source, 1);
+    return above.value == "x" && source.position() == text.size() && line.hasSeparator &&
+           line.type == LDIF_Line::attr && line.attribute == name.text() && line.value == value;
 }
 
 auto naming(const LDIF_Attribute& attribute, const LDIF_Value& value) {

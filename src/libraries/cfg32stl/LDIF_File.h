@@ -56,8 +56,8 @@ class LDIF_File {
     /// Copies the file to the backup name, if there is one, and writes the store over it. When it
     /// returns, both are on the disk. A failure before the writing leaves the file untouched; after
     /// one in the middle the old content is put back, if that is possible. Within an update the
-    /// file must be the one that was refreshed (51/51 otherwise). A store that would not read back
-    /// as it is written is refused (21/1005) and read again by the next refresh().
+    /// file must be the one that was refreshed (51/51 otherwise). A store that can't be written,
+    /// or would not read back as it is written (21/1005), is forgotten: the next refresh() reads.
     void flush();
 
     /// Changes an entry's attributes. Modifications before one that is refused stay applied.
@@ -101,7 +101,7 @@ class LDIF_File {
     bool load_if_changed();
     cfg32::locked_file locked(int flags, int operation) const;
     int authenticate(const char* dn, const char* password, int method) const;
-    std::string text();
+    std::string text() const;
     void back_up() const;
     void write(const std::string& content, bool is_refreshed);
     cfg32::unique_fd open_for_writing(struct stat& status);

@@ -85,9 +85,14 @@ bool can_be_loaded(const LDIF_Entry& entry) {
 
 void LDIF_File::flush() {
     const auto details = [&](LDIF_Exception& e) { name_file(e); };
+    // What can't be written shall not stand in the way of the next change.
+    const auto forgetting = [&](LDIF_Exception& e) {
+        name_file(e);
+        is_loaded_ = false;
+    };
     const auto body = [&] {
         // Whatever can fail in memory fails before a file is touched.
-        const std::string content = with_context([&] { return text(); }, details);
+        const std::string content = with_context([&] { return text(); }, forgetting);
         const bool is_refreshed = is_updated_;
         const update lock(*this);
         if (!backup_file_name_.empty()) {
@@ -99,7 +104,7 @@ void LDIF_File::flush() {
 }
 
 /// The whole file as text.
-std::string LDIF_File::text() {
+std::string LDIF_File::text() const {
     if (!is_whole_) {
         raise(not_whole);
     }
@@ -109,7 +114,6 @@ std::string LDIF_File::text() {
         entry.append_to(out);
         if (!can_be_loaded(entry) ||
             !reads_back(std::string_view(out).substr(begin), entry.line_count())) {
-            is_loaded_ = false;  // so that what can't be written is forgotten
             raise_with(not_readable, {}, [&](LDIF_Exception& e) { e.entryDn = shown(entry.dn()); });
         }
     });

@@ -36,6 +36,8 @@ class locked_file {
     const struct stat& status() const { return status_; }
 
   private:
+    bool take(const char* path, int flags, int operation);
+
     unique_fd file_;
     struct stat status_ {};
 };

@@ -1,0 +1,2 @@
+// The same program in the other language.
+#include "ldap_client.c"

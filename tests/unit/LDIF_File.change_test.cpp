@@ -1,0 +1,561 @@
+#include <gmock/gmock.h>
+
+#include <cerrno>
+#include <limits>
+#include <memory>
+#include <string>
+#include <vector>
+
+#include "LDIF_Exception.h"
+#include "LDIF_File.h"
+#include "failing_new.h"
+#include "failures.h"
+#include "modifications.h"
+#include "stores.h"
+
+using namespace cfg32::tests;
+using namespace cfg32::tests::operations;
+using namespace std::string_literals;
+using testing::StartsWith;
+
+namespace {
+
+const std::string head = "charset: x\nversion: 1\n\n";
+
+struct LDIF_File_modify : store_test {
+    /// A store with an entry "cn=a, o=b" of those lines.
+    std::unique_ptr<LDIF_File> store_with(const std::string& lines) {
+        return store(head + "dn: o=b\n\ndn: cn=a, o=b\n" + lines + "\n");
+    }
+
+    static void modify(LDIF_File& file, const std::vector<change>& changes,
+                       const std::string& dn = "CN=A,o=b") {
+        file.modify(dn_of(dn), modifications(changes).records());
+    }
+
+    static LDIF_Exception failure_to_modify(LDIF_File& file, const std::vector<change>& changes,
+                                            const std::string& dn = "CN=A,o=b") {
+        return failure_of([&] { modify(file, changes, dn); });
+    }
+
+    /// The lines that the entry has now.
+    static std::string lines(const LDIF_File& file) {
+        const std::string text = file.root().find(dn_of("cn=a,o=b"))->str();
+        const std::string label = "dn: cn=a, o=b\n";
+        EXPECT_THAT(text, StartsWith(label));
+        return text.substr(label.size(), text.size() - label.size() - 1);
+    }
+
+    static LDIF_Attributes& attributes(LDIF_File& file) {
+        const LDIF_Entry* entry = file.root().find(dn_of("cn=a,o=b"));
+        return const_cast<LDIF_Entry*>(entry)->attributes();
+    }
+};
+
+}  // namespace
+
+TEST_F(LDIF_File_modify, ModificationsAreApplied) {
+    const struct {
+        const char* what;
+        const char* before;
+        std::vector<change> changes;
+        const char* after;
+    } rows[] = {
+        {"add: a new attribute takes its place",
+         "cn: a\nsn: 1\n",
+         {{add, "ou", {"x"}}},
+         "cn: a\nou: x\nsn: 1\n"},
+        {"add: further values follow",
+         "sn: 1\n",
+         {{add, "sn", {"3", "2"}}},
+         "sn: 1\nsn: 3\nsn: 2\n"},
+        {"add: a value that is there is dropped",
+         "sn: 1\n",
+         {{add, "sn", {"1", "2", "2"}}},
+         "sn: 1\nsn: 2\n"},
+        {"add: equality is the syntax's",
+         "objectclass: top\n",
+         {{add, "objectclass", {"TOP", "x"}}},
+         "objectclass: top\nobjectclass: x\n"},
+        {"add: the name is as it was written first",
+         "sn: 1\n",
+         {{add, "SN", {"2"}}},
+         "sn: 1\nsn: 2\n"},
+        {"add: a new name is as the caller writes it", "", {{add, "Sn", {"1"}}}, "Sn: 1\n"},
+        {"add: no values, nothing", "sn: 1\n", {{add, "sn", {}}, {add, "ou", {}}}, "sn: 1\n"},
+        {"add: no values, no look at the name", "sn: 1\n", {{add, "a:b", {}}}, "sn: 1\n"},
+        {"add: an empty value is one", "", {{add, "sn", {""}}}, "sn: \n"},
+        {"add: values are stored as their syntax stores them",
+         "",
+         {{add, "oru-slapdPort", {"0389"}}, {add, "oru-slapdAdminDN", {"CN=x;o=y"}}},
+         "oru-slapdAdminDN: CN=x, o=y\noru-slapdPort: 389\n"},
+        {"delete: the attribute", "ou: x\nsn: 1\nsn: 2\n", {{del, "SN", {}}}, "ou: x\n"},
+        {"delete: values", "sn: 1\nsn: 2\nsn: 3\n", {{del, "sn", {"3", "1"}}}, "sn: 2\n"},
+        {"delete: equality is the syntax's",
+         "objectclass: top\nobjectclass: x\n",
+         {{del, "objectclass", {"TOP"}}},
+         "objectclass: x\n"},
+        {"delete: a value that is not there", "sn: 1\n", {{del, "sn", {"2"}}}, "sn: 1\n"},
+        {"delete: the last value takes the attribute with it",
+         "ou: x\nsn: 1\nsn: 2\n",
+         {{del, "sn", {"2", "1"}}},
+         "ou: x\n"},
+        {"delete: values after the last are not looked at",
+         "cn: a\noru-slapdPort: 389\n",
+         {{del, "oru-slapdPort", {"389", "no number"}}},
+         "cn: a\n"},
+        {"delete: a comment goes with its attribute", "# c\nsn: 1\n", {{del, "sn", {}}}, ""},
+        {"replace: the values",
+         "ou: x\nsn: 1\nsn: 2\n",
+         {{replace, "sn", {"2", "3"}}},
+         "ou: x\nsn: 2\nsn: 3\n"},
+        {"replace: the name and the comment stay",
+         "# c\nsn: 1\n",
+         {{replace, "SN", {"2"}}},
+         "# c\nsn: 2\n"},
+        {"replace: no values remove the attribute",
+         "ou: x\nsn: 1\n",
+         {{replace, "sn", {}}},
+         "ou: x\n"},
+        {"replace: a missing attribute is added",
+         "sn: 1\n",
+         {{replace, "ou", {"x", "y"}}},
+         "ou: x\nou: y\nsn: 1\n"},
+        {"replace: no values for a missing attribute", "sn: 1\n", {{replace, "ou", {}}}, "sn: 1\n"},
+        {"replace: repeated values are dropped",
+         "sn: 1\n",
+         {{replace, "sn", {"2", "2"}}},
+         "sn: 2\n"},
+        {"replace: a single value by another",
+         "oru-slapdPort: 389\n",
+         {{replace, "oru-slapdPort", {"636"}}},
+         "oru-slapdPort: 636\n"},
+        {"several are applied in their order",
+         "sn: 1\n",
+         {{add, "sn", {"2"}}, {del, "sn", {"1"}}, {replace, "ou", {"x"}}, {add, "ou", {"y"}}},
+         "ou: x\nou: y\nsn: 2\n"},
+        {"what one removes another adds again",
+         "oru-slapdPort: 389\n",
+         {{del, "oru-slapdPort", {}}, {add, "oru-slapdPort", {"636"}}},
+         "oru-slapdPort: 636\n"},
+        {"binary values",
+         "sn: 1\nsn: 2\nou: x\n",
+         {{add | binary, "sn", {"3"}},
+          {del | binary, "sn", {"1"}},
+          {replace | binary, "ou", {"y"}}},
+         "ou: y\nsn: 2\nsn: 3\n"},
+        {"binary values end at a NUL",
+         "",
+         {{add | binary, "sn", {"ab\0cd"s, "\0x"s}}},
+         "sn: ab\nsn: \n"},
+        {"no binary values",
+         "sn: 1\nou: x\n",
+         {{add | binary, "sn", {}}, {del | binary, "sn", {}}, {replace | binary, "ou", {}}},
+         ""},
+    };
+    for (const auto& row : rows) {
+        SCOPED_TRACE(row.what);
+        const auto file = store_with(row.before);
+        const std::string before = folder.read("conf");
+        modify(*file, row.changes);
+        EXPECT_EQ(lines(*file), row.after);
+        EXPECT_EQ(folder.read("conf"), before) << "it is a flush that writes";
+    }
+}
+
+TEST_F(LDIF_File_modify, LengthOfABinaryValueIsNotLookedAt) {
+    const auto file = store_with("");
+    modifications mods({{add | binary, "sn", {"abc", ""}}});
+    mods.record(0).mod_bvalues[0]->bv_len = 1;
+    mods.record(0).mod_bvalues[1]->bv_len = 1000;
+    mods.record(0).mod_bvalues[1]->bv_val = nullptr;
+    file->modify(dn_of("cn=a,o=b"), mods.records());
+    EXPECT_EQ(lines(*file), "sn: abc\nsn: \n");
+}
+
+TEST_F(LDIF_File_modify, NoArrayOfValuesIsNoValues) {
+    for (const int flag : {0, binary}) {
+        const auto file = store_with("ou: x\nsn: 1\nst: y\n");
+        modifications mods(
+            {{add | flag, "sn", {}}, {del | flag, "st", {}}, {replace | flag, "ou", {}}});
+        for (size_t i = 0; i < 3; ++i) {
+            if (flag != 0) {
+                mods.record(i).mod_bvalues = nullptr;
+            } else {
+                mods.record(i).mod_values = nullptr;
+            }
+        }
+        file->modify(dn_of("cn=a,o=b"), mods.records());
+        EXPECT_EQ(lines(*file), "sn: 1\n");
+    }
+}
+
+TEST_F(LDIF_File_modify, NothingToModifySucceedsEvenForAMissingEntry) {
+    const auto file = store_with("sn: 1\n");
+    const std::string before = text_of(*file);
+    for (const char* dn : {"cn=a,o=b", "cn=missing", "cn=", ""}) {
+        file->modify(dn_of(dn), nullptr);
+        modify(*file, {}, dn);
+    }
+    EXPECT_EQ(text_of(*file), before);
+}
+
+TEST_F(LDIF_File_modify, MissingEntryIsReported) {
+    const auto file = store_with("sn: 1\n");
+    const std::string before = text_of(*file);
+    for (const char* dn : {"cn=a", "cn=x, cn=a, o=b", "o=c"}) {
+        const LDIF_Exception e = failure_to_modify(*file, {{add, "sn", {"2"}}}, dn);
+        EXPECT_EQ(summary(e), "32/32 Entry not found");
+        EXPECT_EQ(e.entryDn, dn);
+        EXPECT_EQ(e.configFile, path);
+        EXPECT_EQ(e.srcFile, "src/libraries/cfg32stl/LDIF_File");
+        ASSERT_TRUE(e.cause);
+        EXPECT_EQ(summary(*e.cause), "32/32 Entry not found");
+        EXPECT_EQ(e.cause->entryDn, "");
+    }
+    EXPECT_EQ(text_of(*file), before);
+}
+
+TEST_F(LDIF_File_modify, NameThatCannotBePrintedIsReportedAsNothing) {
+    const auto file = store_with("");
+    const LDIF_Exception e = failure_to_modify(*file, {{add, "sn", {"1"}}}, "cn=");
+    EXPECT_EQ(summary(e), "32/32 Entry not found");
+    EXPECT_EQ(e.entryDn, "");
+}
+
+// Where a value is expected, the attribute's name stands again.
+TEST_F(LDIF_File_modify, MissingAttributeOfADeletionIsReported) {
+    const struct {
+        change deletion;
+        const char* value;
+    } rows[] = {
+        {{del, "Ou", {}}, "<NULL>"},
+        {{del | binary, "Ou", {}}, "<NULL>"},
+        {{del | binary, "Ou", {"x"}}, "<binary>"},
+        {{del, "Ou", {"x", "y"}}, "Ou"},
+        {{del, "", {}}, "<NULL>"},
+        {{del, "a:b", {"x"}}, "a:b"},
+    };
+    for (const auto& row : rows) {
+        const auto file = store_with("sn: 1\n");
+        const LDIF_Exception e = failure_to_modify(*file, {row.deletion});
+        EXPECT_EQ(summary(e), "16/16 Target attribute of MOD_DELETE not found");
+        EXPECT_EQ(e.attribute, row.deletion.name);
+        EXPECT_EQ(e.value, row.value);
+        EXPECT_EQ(e.attrType, nullptr);
+        EXPECT_EQ(e.entryDn, "CN=A, o=b") << "as the caller wrote it";
+        EXPECT_EQ(e.configFile, path);
+        ASSERT_TRUE(e.cause);
+        EXPECT_EQ(e.cause->value, row.value);
+        EXPECT_EQ(lines(*file), "sn: 1\n");
+    }
+}
+
+TEST_F(LDIF_File_modify, NoNameIsTheEmptyOne) {
+    const auto file = store_with("sn: 1\n");
+    modifications mods({{del, "", {}}});
+    mods.record(0).mod_type = nullptr;
+    const LDIF_Exception e = failure_of([&] { file->modify(dn_of("cn=a,o=b"), mods.records()); });
+    EXPECT_EQ(summary(e), "16/16 Target attribute of MOD_DELETE not found");
+    EXPECT_EQ(e.attribute, "");
+    mods.record(0).mod_op = add;
+    file->modify(dn_of("cn=a,o=b"), mods.records());
+    EXPECT_EQ(lines(*file), "sn: 1\n");
+}
+
+TEST_F(LDIF_File_modify, UnknownOperationIsReportedWithItsFlag) {
+    const struct {
+        int operation;
+        const char* message;
+    } rows[] = {
+        {3, "Unknown mod_op: 3"},
+        {3 | binary, "Unknown mod_op: 131"},
+        {0x100, "Unknown mod_op: 256"},
+        {0x101, "Unknown mod_op: 257"},
+        {-1, "Unknown mod_op: 4294967295"},
+        {std::numeric_limits<int>::min(), "Unknown mod_op: 2147483648"},
+    };
+    for (const auto& row : rows) {
+        for (const std::vector<std::string>& values : {std::vector<std::string>{}, {"2"}}) {
+            const auto file = store_with("sn: 1\n");
+            const LDIF_Exception e = failure_to_modify(*file, {{row.operation, "sn", values}});
+            EXPECT_EQ(summary(e), "89/1010 "s + row.message);
+            EXPECT_EQ(e.entryDn, "CN=A, o=b");
+            EXPECT_EQ(e.configFile, path);
+            EXPECT_EQ(lines(*file), "sn: 1\n");
+        }
+    }
+}
+
+TEST_F(LDIF_File_modify, ModificationsBeforeTheOneThatFailsStay) {
+    const struct {
+        change failing;
+        int code;
+    } rows[] = {
+        {{del, "ou", {}}, 16},
+        {{7, "ou", {}}, 89},
+        {{add, "oru-slapdPort", {"x"}}, 21},
+        {{add, "cn", {"b"}}, 19},
+    };
+    for (const auto& row : rows) {
+        const auto file = store_with("cn: a\nsn: 1\n");
+        const LDIF_Exception e =
+            failure_to_modify(*file, {{add, "sn", {"2"}}, row.failing, {add, "sn", {"3"}}});
+        EXPECT_EQ(e.ldapErr, row.code);
+        EXPECT_EQ(lines(*file), "cn: a\nsn: 1\nsn: 2\n");
+    }
+}
+
+TEST_F(LDIF_File_modify, SecondValueOfASingleValuedAttributeIsRefused) {
+    const struct {
+        const char* what;
+        const char* before;
+        change refused;
+        const char* value;
+    } rows[] = {
+        {"add to one", "oru-slapdPort: 389\n", {add, "oru-slapdPort", {"636"}}, "636"},
+        {"add two to one", "oru-slapdPort: 389\n", {add, "oru-slapdPort", {"389", "636"}}, "636"},
+        {"add two to none", "", {add, "oru-slapdPort", {"389", "636"}}, "636"},
+        {"add binary ones", "", {add | binary, "oru-slapdPort", {"389", "0636"}}, "636"},
+        {"replace one by two",
+         "oru-slapdPort: 1\n",
+         {replace, "oru-slapdPort", {"389", "636"}},
+         "636"},
+        {"replace none by two", "", {replace, "oru-slapdPort", {"389", "636"}}, "636"},
+        {"the old one counts as new",
+         "oru-slapdPort: 1\n",
+         {replace, "oru-slapdPort", {"2", "1"}},
+         "1"},
+        {"another name's spelling", "oru-slapdPort: 389\n", {add, "ORU-SLAPDPORT", {"636"}}, "636"},
+        // A load takes what a change would not.
+        {"add to two", "cn: a\ncn: b\n", {add, "cn", {"b", "c"}}, "c"},
+    };
+    for (const auto& row : rows) {
+        SCOPED_TRACE(row.what);
+        const auto file = store_with(row.before);
+        const LDIF_Exception e = failure_to_modify(*file, {row.refused});
+        EXPECT_EQ(summary(e), "19/1006 Attribute may not have multiple values.");
+        EXPECT_EQ(e.entryDn, "CN=A, o=b");
+        EXPECT_EQ(e.configFile, path);
+        EXPECT_EQ(e.attribute, row.refused.name);
+        EXPECT_EQ(e.value, row.value);
+        EXPECT_EQ(e.attrType, getAttrType(row.refused.name.c_str()));
+        ASSERT_TRUE(e.cause);
+        EXPECT_EQ(e.cause->attrType, e.attrType);
+        EXPECT_EQ(lines(*file), row.before);
+    }
+}
+
+TEST_F(LDIF_File_modify, SameValueAgainIsNoSecondOne) {
+    const auto file = store_with("cn: a\noru-slapdPort: 389\n");
+    modify(*file, {{add, "oru-slapdPort", {"0389", "389"}},
+                   {add, "cn", {"A"}},
+                   {replace, "cn", {"b", "B"}},
+                   {replace, "oru-slapdMaxOpPerTransaction", {"5", "05"}}});
+    EXPECT_EQ(lines(*file), "cn: b\noru-slapdMaxOpPerTransaction: 5\noru-slapdPort: 389\n");
+}
+
+TEST_F(LDIF_File_modify, ValuesThatAreThereAlreadyMayBeAddedToTwo) {
+    const auto file = store_with("cn: a\ncn: b\n");
+    modify(*file, {{add, "cn", {"B", "a"}}});
+    EXPECT_EQ(lines(*file), "cn: a\ncn: b\n");
+}
+
+TEST_F(LDIF_File_modify, ValueThatTheSyntaxRefusesIsReported) {
+    const struct {
+        change refused;
+        const char* expected;
+        const char* value;
+    } rows[] = {
+        {{add, "oru-slapdPort", {"x"}}, "21/1016 Value is not valid integer syntax", "x"},
+        {{add, "oru-slapdPort", {"0"}}, "21/1015 Integer value out of range", "0"},
+        {{add | binary, "oru-slapdPort", {"65536"}}, "21/1015 Integer value out of range", "65536"},
+        {{add, "oru-slapdReadOnly", {"perhaps"}},
+         "21/1017 value not one of attrType.enumValues",
+         "perhaps"},
+        {{replace, "oru-slapdAdminDN", {"cn"}}, "34/1013 Missing RDN value: cn", "cn"},
+    };
+    for (const auto& row : rows) {
+        SCOPED_TRACE(row.refused.name);
+        const auto file = store_with("sn: 1\n");
+        const LDIF_Exception e = failure_to_modify(*file, {row.refused});
+        EXPECT_EQ(summary(e), row.expected);
+        EXPECT_EQ(e.entryDn, "CN=A, o=b");
+        EXPECT_EQ(e.configFile, path);
+        EXPECT_EQ(e.attribute, row.refused.name);
+        EXPECT_EQ(e.value, row.value);
+        EXPECT_EQ(e.attrType, getAttrType(row.refused.name.c_str()));
+        EXPECT_EQ(e.srcFile, "src/libraries/cfg32stl/LDIF_File");
+        EXPECT_EQ(first_cause(e).srcFile.find("src/libraries/cfg32stl/LDIF_"), 0u);
+        EXPECT_NE(first_cause(e).srcFile, e.srcFile) << "the chain begins where it was refused";
+        EXPECT_EQ(summary(first_cause(e)), row.expected);
+        EXPECT_EQ(lines(*file), "sn: 1\n");
+    }
+}
+
+TEST_F(LDIF_File_modify, ValueToDeleteIsCheckedBySyntaxToo) {
+    const auto file = store_with("oru-slapdPort: 389\n");
+    const LDIF_Exception e = failure_to_modify(*file, {{del, "oru-slapdPort", {"x"}}});
+    EXPECT_EQ(summary(e), "21/1016 Value is not valid integer syntax");
+    EXPECT_EQ(e.value, "x");
+    EXPECT_EQ(lines(*file), "oru-slapdPort: 389\n");
+}
+
+// The old values go before the new ones are looked at by their syntax.
+TEST_F(LDIF_File_modify, ReplacementThatTheSyntaxRefusesLeavesTheAttributeWithoutValues) {
+    const auto file = store_with("# c\noru-slapdPort: 389\nsn: 1\n");
+    EXPECT_EQ(failure_to_modify(*file, {{replace, "oru-slapdPort", {"636", "x"}}}).extErr, 1016);
+    const auto found = attributes(*file).find("oru-slapdPort");
+    ASSERT_NE(found, attributes(*file).end());
+    EXPECT_TRUE(found->values().empty());
+    modify(*file, {{add, "oru-slapdPort", {"636"}}});
+    EXPECT_EQ(lines(*file), "# c\noru-slapdPort: 636\nsn: 1\n");
+}
+
+TEST_F(LDIF_File_modify, AttributeWithoutValuesIsDeletedWhateverIsToBeDeletedOfIt) {
+    const auto file = store_with("oru-slapdPort: 389\nsn: 1\n");
+    failure_to_modify(*file, {{replace, "oru-slapdPort", {"x"}}});
+    modify(*file, {{del, "oru-slapdPort", {"no number"}}});
+    EXPECT_EQ(attributes(*file).find("oru-slapdPort"), attributes(*file).end());
+    EXPECT_EQ(lines(*file), "sn: 1\n");
+}
+
+TEST_F(LDIF_File_modify, WhatWouldNotReadBackIsRefused) {
+    const struct {
+        const char* what;
+        std::string name;
+        std::string value;
+    } rows[] = {
+        {"no name", "", "x"},
+        {"a colon in the name", "a:b", "x"},
+        {"a name like a comment's line", "#x", "x"},
+        {"a blank after the name", "x ", "x"},
+        {"a blank before the name", " x", "x"},
+        {"the name of DN lines", "dn", "x"},
+        {"the name of DN lines in capitals", "DN", "x"},
+        {"a line feed in the name", "a\nb", "x"},
+        {"a carriage return in the name", "a\rb", "x"},
+        {"a line feed", "sn", "a\nb"},
+        {"a line feed at the end", "sn", "a\n"},
+        {"a line feed alone", "sn", "\n"},
+        {"a continuation", "sn", "a\n b"},
+        {"a carriage return", "sn", "a\rb"},
+        {"a carriage return at the end", "sn", "a\r"},
+        {"a blank before", "sn", " a"},
+        {"a blank behind", "sn", "a "},
+        {"a tab before", "sn", "\ta"},
+        {"a blank alone", "sn", " "},
+    };
+    for (const auto& row : rows) {
+        SCOPED_TRACE(row.what);
+        for (const int operation : {add, replace}) {
+            const auto file = store_with("sn: 1\n");
+            const LDIF_Exception e =
+                failure_to_modify(*file, {{operation, row.name, {"good", row.value}}});
+            // Of a bad name the first value is named.
+            const bool is_bad_value = row.name == "sn";
+            EXPECT_EQ(summary(e), "21/1005 Attribute would not read back as it is written");
+            EXPECT_EQ(e.entryDn, "CN=A, o=b");
+            EXPECT_EQ(e.configFile, path);
+            EXPECT_EQ(e.attribute, row.name);
+            EXPECT_EQ(e.value, is_bad_value ? row.value : "good");
+            EXPECT_EQ(e.attrType, getAttrType(row.name.c_str()));
+            EXPECT_EQ(lines(*file), "sn: 1\n");
+        }
+        EXPECT_EQ(
+            failure_of([&] {
+                const auto file = store_with("");
+                file->add(dn_of("cn=new"), modifications({{add, row.name, {row.value}}}).records());
+            }).extErr,
+            1005);
+    }
+}
+
+TEST_F(LDIF_File_modify, OddNamesAndValuesThatReadBackAreTaken) {
+    const auto file = store_with("");
+    modify(*file,
+           {{add, "a b", {"x: y", ":x", "# z", "dn: cn=x", "a\tb", "-"}}, {add, "dnx", {"x"}}});
+    file->flush();
+    EXPECT_EQ(text_of(LDIF_File(path, "", nullptr)), text_of(*file));
+    EXPECT_EQ(lines(*file),
+              "a b: x: y\na b: :x\na b: # z\na b: dn: cn=x\na b: a\tb\na b: -\ndnx: x\n");
+}
+
+TEST_F(LDIF_File_modify, RootHasTheEmptyName) {
+    const auto file = store_with("sn: 1\n");
+    modify(*file, {{replace, "charset", {"y"}}}, "");
+    EXPECT_EQ(text_of(*file), "charset: y\nversion: 1\n\ndn: o=b\n\ndn: cn=a, o=b\nsn: 1\n\n");
+    const LDIF_Exception e = failure_to_modify(*file, {{add, "version", {"2"}}}, "");
+    EXPECT_EQ(e.ldapErr, 21);
+    EXPECT_EQ(e.entryDn, "");
+    EXPECT_EQ(e.configFile, path);
+}
+
+TEST_F(LDIF_File_modify, ChildrenStayBelowAModifiedEntry) {
+    const auto file = store(head + "dn: o=b\n\ndn: cn=a, o=b\n\ndn: o=c\n\n");
+    modify(*file, {{add, "sn", {"1"}}}, "o=b");
+    EXPECT_EQ(text_of(*file), head + "dn: o=b\nsn: 1\n\ndn: cn=a, o=b\n\ndn: o=c\n\n");
+}
+
+namespace {
+
+/// Fails one allocation of the body after the other, until none is left to fail. prepare makes the
+/// body's store anew each time. Returns the messages of the reports.
+template <class Prepare, class Body>
+std::vector<std::string> reports_of_exhausted_memory(const std::string& path, Prepare prepare,
+                                                     Body body) {
+    std::vector<std::string> messages;
+    for (long which = 0;; ++which) {
+        const auto file = prepare();
+        try {
+            failing_allocation failing(which);
+            body(*file);
+            if (!failing.happened()) {
+                return messages;
+            }
+            ADD_FAILURE() << "allocation " << which << " failed and nothing was reported";
+        } catch (const LDIF_Exception& e) {
+            EXPECT_EQ(e.ldapErr, 80) << which;
+            EXPECT_EQ(e.extErr, 1000) << which;
+            EXPECT_EQ(e.sysErrno, ENOMEM) << which;
+            EXPECT_EQ(e.entryDn, "cn=a, o=b") << which;
+            EXPECT_EQ(e.configFile, path) << which;
+            EXPECT_THAT(e.msg, StartsWith("System error in ")) << which;
+            messages.push_back(e.msg);
+        }
+    }
+}
+
+}  // namespace
+
+TEST_F(LDIF_File_modify, ExhaustedMemoryIsASystemErrorOfTheOperation) {
+    const LDIF_DN dn = dn_of("cn=a,o=b");
+    const std::string long_name = "an-attribute-" + std::string(50, 'x');
+    const std::string lines_before = "sn: 1\n" + long_name + ": 1\n";
+    const struct {
+        const char* operation;
+        std::vector<change> changes;
+    } rows[] = {
+        {"LDIF_File::modify()", {{add, long_name, {"2", "3"}}}},
+        {"LDIF_File::modify()", {{replace, long_name, {"2", "3"}}}},
+        {"LDIF_File::modify()", {{del, long_name, {"1"}}}},
+        {"LDIF_File::add()", {{add, long_name, {"2"}}}},
+        {"LDIF_File::erase()", {}},
+    };
+    for (const auto& row : rows) {
+        modifications mods(row.changes);
+        const std::string operation = row.operation;
+        const auto run = [&](LDIF_File& file) {
+            if (operation == "LDIF_File::modify()") {
+                file.modify(dn, mods.records());
+            } else if (operation == "LDIF_File::add()") {
+                file.add(dn, mods.records());
+            } else {
+                file.erase(dn, false);
+            }
+        };
+        const auto messages = reports_of_exhausted_memory(
+            path, [&] { return store_with(lines_before); }, run);
+        EXPECT_THAT(messages, testing::Contains("System error in " + operation));
+    }
+}
