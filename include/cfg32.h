@@ -34,9 +34,9 @@
  *     stay. A process that is killed in the middle leaves a file that no call loads (80/1002):
  *     copy the backup over it. When a call returns anything else than 0, the file is what it was,
  *     except as said below of codes 80 and 91 at cfg_modify_s(). The copy in memory is not rolled
- *     back: modifications before the one that was refused, and a change that could not be
- *     written, are seen by searches of this handle and are written with its next change. To drop
- *     them, unbind.
+ *     back: modifications before the one that was refused, and a change that failed because the
+ *     file could not be backed up or opened, are seen by searches of this handle and are written
+ *     with its next change. To drop them, unbind.
  *  6. Many programs. Every program that uses this library sees the changes of the others at its
  *     next call, and no change is lost when several make one at the same time: each keeps the
  *     others away (flock(2) on the file itself) while it changes the file, and while it reads it. A

@@ -71,7 +71,7 @@ struct disk : testing::Test {
         struct stat status;
         unique_fd file =
             open_regular(folder.file(name).c_str(), status, O_WRONLY | O_CREAT, owner_only);
-        return file && reserve(file.get(), static_cast<size_t>(status.st_size), text) &&
+        return file && reserve(file.get(), static_cast<size_t>(status.st_size), text.size()) &&
                overwrite(file.get(), text) && file.close();
     }
 
@@ -260,6 +260,16 @@ TEST_F(disk, FileThatMayNotGrowTakesATextThatFits) {
     EXPECT_EQ(folder.read("f"), std::string(30, 'x'));
 }
 
+TEST_F(disk, MarkIsGoneWhenTheTextIsComplete) {
+    const std::string mark = "# unfinished\n";
+    for (const size_t size : {size_t{0}, mark.size() - 1, mark.size(), mark.size() + 1, 9000ul}) {
+        const std::string text(size, 'x');
+        const unique_fd file = opened(folder.write("f", "before"), O_RDWR);
+        EXPECT_TRUE(overwrite(file.get(), text, mark));
+        EXPECT_TRUE(folder.read("f") == text) << size;
+    }
+}
+
 TEST_F(disk, FailureToWriteIsReportedAndChangesNothing) {
     const unique_fd file(open(folder.write("f", "before").c_str(), O_RDONLY));
     EXPECT_FALSE(overwrite(file.get(), "after"));
@@ -277,28 +287,28 @@ TEST_F(disk, FullDeviceIsReported) {
 
 TEST_F(disk, TextThatFitsNeedsNoRoom) {
     const unique_fd file = opened(folder.write("f", "before"), O_RDONLY);
-    for (const char* text : {"", "short", "before"}) {
-        EXPECT_TRUE(reserve(file.get(), 6, text)) << text;
+    for (const size_t size : {0, 5, 6}) {
+        EXPECT_TRUE(reserve(file.get(), 6, size)) << size;
     }
 }
 
 TEST_F(disk, RoomIsTakenBehindTheContent) {
     constexpr blkcnt_t block_unit = 512;
     const std::string before = "before";
-    const std::string after(1 << 20, 'x');
+    constexpr size_t size = 1 << 20;
     const unique_fd file = opened(folder.write("f", before), O_RDWR);
-    ASSERT_TRUE(reserve(file.get(), before.size(), after));
+    ASSERT_TRUE(reserve(file.get(), before.size(), size));
     struct stat status {};
     ASSERT_EQ(fstat(file.get(), &status), 0);
-    EXPECT_GE(status.st_blocks * block_unit, static_cast<off_t>(after.size()));
-    // Where a file system can't reserve, the part beyond the end is there already.
+    EXPECT_GE(status.st_blocks * block_unit, static_cast<off_t>(size));
+    // Where a file system can't reserve, blank lines take the room.
     const std::string now = folder.read("f");
-    EXPECT_TRUE(now == before || now == before + after.substr(before.size()));
+    EXPECT_TRUE(now == before || now == before + std::string(size - before.size(), '\n'));
 }
 
 TEST_F(disk, RoomThatCannotBeTakenIsReportedAndChangesNothing) {
     const unique_fd file = opened(folder.write("f", "before"), O_RDONLY);
-    EXPECT_FALSE(reserve(file.get(), 6, "longer than before"));
+    EXPECT_FALSE(reserve(file.get(), 6, 7));
     EXPECT_EQ(errno, EBADF);
     EXPECT_EQ(folder.read("f"), "before");
 }
@@ -307,8 +317,8 @@ TEST_F(disk, LimitOfTheProcessIsKeptToTheByte) {
     const unique_fd file = opened(folder.write("f", "before"), O_RDWR);
     const auto child = [&] {
         limit_file_size(30);
-        const bool fits = reserve(file.get(), 6, std::string(30, 'x'));
-        const bool is_refused = !reserve(file.get(), 6, std::string(31, 'x')) && errno == EFBIG;
+        const bool fits = reserve(file.get(), 6, 30);
+        const bool is_refused = !reserve(file.get(), 6, 31) && errno == EFBIG;
         _exit(fits && is_refused ? 0 : 1);
     };
     EXPECT_EXIT(child(), testing::ExitedWithCode(0), "");

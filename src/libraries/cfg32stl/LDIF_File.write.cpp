@@ -189,7 +189,7 @@ void LDIF_File::create() {
 void LDIF_File::overwrite(unique_fd file, const struct stat& status, const std::string& content) {
     std::string before;
     if (!read_all(file.get(), static_cast<size_t>(status.st_size), before) ||
-        !reserve(file.get(), before.size(), content)) {
+        !reserve(file.get(), before.size(), content.size())) {
         raise_with(not_written, {}, name_file_and_errno(errno));
     }
     is_loaded_ = false;  // until it is known what the file has become

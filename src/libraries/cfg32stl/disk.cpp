@@ -51,13 +51,14 @@ bool is_within_limit(size_t size) {
     return true;
 }
 
-/// Takes room by writing what goes beyond the end of the file: for file systems that can't reserve.
-bool write_tail(int file, size_t present, std::string_view text) {
-    if (write_all(file, text.substr(present), present)) {
+/// Takes room by writing, for file systems that can't reserve: line feeds, of which no file gets
+/// another meaning at its end.
+bool write_blank_lines(int file, size_t from, size_t to) {
+    if (write_all(file, std::string(to - from, '\n'), from)) {
         return true;
     }
     const int error = errno;
-    resize(file, present);
+    resize(file, from);
     errno = error;
     return false;
 }
@@ -121,18 +122,18 @@ bool read_all(int file, size_t expected, std::string& text) {
     }
 }
 
-bool reserve(int file, size_t present, std::string_view text) {
-    if (!is_within_limit(text.size())) {
+bool reserve(int file, size_t present, size_t wanted) {
+    if (!is_within_limit(wanted)) {
         return false;
     }
-    if (text.size() <= present) {
+    if (wanted <= present) {
         return true;
     }
-    const auto missing = static_cast<off_t>(text.size() - present);
+    const auto missing = static_cast<off_t>(wanted - present);
     const int result = retry_interrupted(
         [=] { return fallocate(file, FALLOC_FL_KEEP_SIZE, static_cast<off_t>(present), missing); });
     const bool is_possible = result == 0 || (errno != EOPNOTSUPP && errno != ENOSYS);
-    return is_possible ? result == 0 : write_tail(file, present, text);
+    return is_possible ? result == 0 : write_blank_lines(file, present, wanted);
 }
 
 bool overwrite(int file, std::string_view text, std::string_view mark) {

@@ -12,9 +12,9 @@ namespace cfg32 {
 /// Reads the whole file. expected is a hint of how much there is.
 bool read_all(int file, size_t expected, std::string& text);
 
-/// Takes the room that the text needs beyond the end of the file, which is `present` bytes long.
-/// After a failure the file is what it was.
-bool reserve(int file, size_t present, std::string_view text);
+/// Takes the room that a text of `wanted` bytes needs beyond the end of the file, which is
+/// `present` bytes long. After a failure the file is what it was.
+bool reserve(int file, size_t present, size_t wanted);
 
 /// Makes the text the file's whole content, on the disk. Until it is complete the file begins with
 /// the mark, if there is one; a text that is shorter than the mark does without.
