@@ -135,10 +135,12 @@ CFG32_PLATFORM_API void initLocaleMutex(void) CFG32_PLATFORM_NOEXCEPT;
  * @param target the copy's name. An existing regular file is replaced, and so is a symbolic link:
  *               the link itself, not the file it points to. Anything else (directory, FIFO, device,
  *               or a link to one) is refused. The target's directory must be readable.
- * @param owner  the copy's owner by name; null leaves the owner that the new file has by itself
- * @param group  the copy's group by name; null leaves the group likewise
+ * @param owner  the copy's owner by name; null for the source's, where the caller may give it
+ * @param group  the copy's group by name; null for the source's, and for no access of the group
+ *               where the caller may not give it
  * @param mode   the copy's permission bits; only the bits in 07777 count, the umask doesn't. Access
- *               control lists are not copied, and none is inherited from the directory.
+ *               control lists are not copied, and none is inherited from the directory; the copy of
+ *               a file with such a list gives its group no access.
  * @return true on success; false on any failure, with errno saying why. In particular: EINVAL for a
  *         null name, an owner or group that doesn't exist, a source that is not a regular file, a
  *         target that can't be replaced, or when both names mean the same file (by name, hard or

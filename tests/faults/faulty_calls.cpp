@@ -160,12 +160,12 @@ std::string listed(const std::vector<seen_call>& calls) {
 
 const std::vector<std::string>& wrapped_names() {
     static const std::vector<std::string> names = {
-        "close",     "copy_file_range", "fallocate",  "fchmod",     "fchown",     "fdatasync",
-        "flock",     "fremovexattr",    "fstat",      "fstat64",    "fsync",      "ftruncate",
-        "futimens",  "getgrgid_r",      "getgrnam_r", "getpwnam_r", "getpwuid_r", "getrandom",
-        "getrlimit", "nanosleep",       "open",       "open64",     "openat",     "openat64",
-        "pread",     "pwrite",          "read",       "renameat",   "stat",       "stat64",
-        "unlinkat",  "write",
+        "close",     "copy_file_range", "fallocate",    "fchmod",     "fchown",     "fdatasync",
+        "flock",     "fgetxattr",       "fremovexattr", "fstat",      "fstat64",    "fsync",
+        "ftruncate", "futimens",        "getgrgid_r",   "getgrnam_r", "getpwnam_r", "getpwuid_r",
+        "getrandom", "getrlimit",       "nanosleep",    "open",       "open64",     "openat",
+        "openat64",  "pread",           "pwrite",       "read",       "renameat",   "stat",
+        "stat64",    "unlinkat",        "write",
     };
     return names;
 }
@@ -322,6 +322,10 @@ int fchown(int file, uid_t owner, gid_t group) noexcept {
     return simple("fchown", about(file), [=] { return real(file, owner, group); });
 }
 
+ssize_t fgetxattr(int file, const char* name, void* value, size_t size) noexcept {
+    static const auto real = next<decltype(&::fgetxattr)>("fgetxattr");
+    return simple("fgetxattr", about(file), [=] { return real(file, name, value, size); });
+}
 int fremovexattr(int file, const char* name) noexcept {
     static const auto real = next<decltype(&::fremovexattr)>("fremovexattr");
     return simple("fremovexattr", about(file), [=] { return real(file, name); });

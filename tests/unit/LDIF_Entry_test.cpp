@@ -422,9 +422,12 @@ TEST(LDIF_Entry, LineCountIsTheNumberOfLinesOfItsText) {
     }
 }
 
-TEST(LDIF_Entry, ReportsShowNothingForANameThatCannotBePrinted) {
-    EXPECT_EQ(cfg32::shown(dn_of("cn=")), "");
+TEST(LDIF_Entry, ReportsShowWhatTheyCanOfANameThatCannotBePrinted) {
+    EXPECT_EQ(cfg32::shown(dn_of("")), "");
+    EXPECT_EQ(cfg32::shown(dn_of("cn=")), "cn=");
+    EXPECT_EQ(cfg32::shown(dn_of("cn=\"\", ou=b, o=")), "cn=, ou=b, o=");
     EXPECT_EQ(cfg32::shown(dn_of("cn=a")), "cn=a");
+    EXPECT_EQ(cfg32::shown(dn_of("cn=a\\,b, o=c")), "cn=a\\,b, o=c");
     EXPECT_EQ(cfg32::shown(entry_of("cn=")), "");
     EXPECT_EQ(cfg32::shown(entry_of("cn=a")), "dn: cn=a\n\n");
 }

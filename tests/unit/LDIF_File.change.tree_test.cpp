@@ -123,17 +123,23 @@ TEST_F(LDIF_File_add, EntryThatIsThereTakesOverTheAttributes) {
                                   "dn: o=b\n\n");
 }
 
-TEST_F(LDIF_File_add, RootTakesOverWhatIsAddedUnderTheEmptyName) {
+TEST_F(LDIF_File_add, RootTakesNothingUnderTheEmptyNameThatNoFileHasThere) {
     const auto file = store_of({"o=a"});
-    add_entry(*file, "", {{add, "sn", {"1"}}});
-    EXPECT_EQ(text_of(*file), "charset: x\nsn: 1\nversion: 1\n\ndn: o=a\n\n");
-    const LDIF_Exception e = failure_of([&] { add_entry(*file, "", {{add, "charset", {"y"}}}); });
-    EXPECT_EQ(summary(e), "19/1006 Attribute may not have multiple values.");
-    EXPECT_EQ(e.entryDn, "");
-    // No file could hold it.
-    EXPECT_EQ(failure_of([&] { file->flush(); }).extErr, 1005);
-    file->refresh();
-    EXPECT_EQ(text_of(*file), folder.read("conf"));
+    const std::string before = text_of(*file);
+    add_entry(*file, "", {{add, "charset", {"x"}}});
+    const struct {
+        change refused;
+        const char* expected;
+    } rows[] = {
+        {{add, "charset", {"y"}}, "19/1006 Attribute may not have multiple values."},
+        {{add, "sn", {"1"}}, "21/1005 Attribute would not read back as it is written"},
+    };
+    for (const auto& row : rows) {
+        const LDIF_Exception e = failure_of([&] { add_entry(*file, "", {row.refused}); });
+        EXPECT_EQ(summary(e), row.expected);
+        EXPECT_EQ(e.entryDn, "");
+        EXPECT_EQ(text_of(*file), before);
+    }
 }
 
 TEST_F(LDIF_File_add, RefusedEntryChangesNothing) {

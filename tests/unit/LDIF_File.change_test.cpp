@@ -216,11 +216,11 @@ TEST_F(LDIF_File_modify, MissingEntryIsReported) {
     EXPECT_EQ(text_of(*file), before);
 }
 
-TEST_F(LDIF_File_modify, NameThatCannotBePrintedIsReportedAsNothing) {
+TEST_F(LDIF_File_modify, NameThatCannotBePrintedIsReportedAllTheSame) {
     const auto file = store_with("");
     const LDIF_Exception e = failure_to_modify(*file, {{add, "sn", {"1"}}}, "cn=");
     EXPECT_EQ(summary(e), "32/32 Entry not found");
-    EXPECT_EQ(e.entryDn, "");
+    EXPECT_EQ(e.entryDn, "cn=");
 }
 
 // Where a value is expected, the attribute's name stands again.

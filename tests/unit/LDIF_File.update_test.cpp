@@ -178,13 +178,18 @@ TEST_F(LDIF_File_update, FileThatOthersPutInItsPlaceSinceTheRefreshIsNotOverwrit
     }
 }
 
-TEST_F(LDIF_File_update, FileThatIsNotTheLockedOneIsNotOverwritten) {
+// Nobody keeps its writers away while it is read.
+TEST_F(LDIF_File_update, FileThatIsNotTheLockedOneIsNeitherReadNorOverwritten) {
     const auto file = store(content);
-    const LDIF_File::update lock(*file);
-    replace(others);
-    file->refresh();
-    EXPECT_EQ(summary(failure_of([&] { file->flush(); })), changed_meanwhile);
-    EXPECT_EQ(folder.read("conf"), others);
+    {
+        const LDIF_File::update lock(*file);
+        replace(others);
+        EXPECT_EQ(summary(failure_of([&] { file->refresh(); })), changed_meanwhile);
+        EXPECT_EQ(summary(failure_of([&] { file->flush(); })), changed_meanwhile);
+        EXPECT_EQ(folder.read("conf"), others);
+    }
+    EXPECT_EQ(file->refresh(), 1);
+    EXPECT_EQ(text_of(*file), others);
 }
 
 TEST_F(LDIF_File_update, StoreThatWasNotRefreshedInItIsNotWritten) {

@@ -244,18 +244,27 @@ LDIF_Entry LDIF_Entry::header() const {
 namespace {
 
 template <class Printable>
-std::string text_or_nothing(const Printable& printable) {
+std::string text_or(const Printable& printable, const std::string& otherwise) {
     try {
         return printable.str();
     } catch (const LDIF_Exception&) {
-        return {};
+        return otherwise;
     }
 }
 
 }  // namespace
 
-std::string cfg32::shown(const LDIF_DN& dn) { return text_or_nothing(dn); }
-std::string cfg32::shown(const LDIF_Entry& entry) { return text_or_nothing(entry); }
+std::string cfg32::shown(const LDIF_DN& dn) {
+    std::string text;
+    for (auto rdn = dn.rdns().rbegin(); rdn != dn.rdns().rend(); ++rdn) {
+        // An empty value is what can't be printed.
+        text += text_or(*rdn, rdn->pairs().front().attribute.str() + "=") + ", ";
+    }
+    text.resize(text.empty() ? 0 : text.size() - 2);
+    return text;
+}
+
+std::string cfg32::shown(const LDIF_Entry& entry) { return text_or(entry, {}); }
 
 std::ostream& operator<<(std::ostream& out, const LDIF_Entry& top) {
     for_each_in_preorder(top, [&](const LDIF_Entry& entry) { out << entry.str(); });

@@ -104,7 +104,7 @@ std::ostream& operator<<(std::ostream& out, const LDIF_Entry& entry);
 
 namespace cfg32 {
 
-// For reports: the text, or "" for a name that can't be printed.
+// For reports: the text; of a name that can't be printed what can be, of such an entry "".
 std::string shown(const LDIF_DN& dn);
 std::string shown(const LDIF_Entry& entry);
 

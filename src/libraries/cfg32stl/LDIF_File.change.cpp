@@ -1,6 +1,7 @@
 // Changing the store.
 
 #include <cerrno>
+#include <iterator>
 #include <string>
 #include <vector>
 
@@ -50,7 +51,7 @@ modification::modification(const ldapmod& mod)
 }
 
 /// True when the line of a value reads back, below another, as that value of that attribute.
-bool reads_back(const cisString& name, const std::string& value) {
+bool line_reads_back(const cisString& name, const std::string& value) {
     const std::string text = "cn: x\n" + name.text() + ": " + value + "\n";
     line_source source(text);
     LDIF_Line above;
@@ -73,7 +74,7 @@ auto naming(const LDIF_Attribute& attribute, const LDIF_Value& value) {
 void require_readable(const LDIF_Attribute& attribute) {
     for (const LDIF_Value& value : attribute.values()) {
         const auto body = [&] {
-            if (!reads_back(attribute.name(), value.str())) {
+            if (!line_reads_back(attribute.name(), value.str())) {
                 raise(not_readable);
             }
         };
@@ -81,37 +82,47 @@ void require_readable(const LDIF_Attribute& attribute) {
     }
 }
 
-/// Throws when the attribute, merged into the present one, would give a single-valued attribute
-/// another value than it has. What is there already is no second value.
-void require_single(const LDIF_Attribute& added, const LDIF_Attribute* present) {
-    if (!added.values().type()->isSingle) {
+/// Takes out of the attribute what the present one has already.
+void drop_duplicates(LDIF_Attribute& added, const LDIF_Attribute& present) {
+    LDIF_Values& values = added.values();
+    for (auto value = values.begin(); value != values.end();) {
+        const bool is_there =
+            with_context([&] { return present.values().find(*value) != present.values().end(); },
+                         naming(added, *value));
+        value = is_there ? values.erase(value) : std::next(value);
+    }
+}
+
+/// Throws when the entry may not have the values besides the present ones of that attribute, of
+/// which there are so many.
+void require_fit(const LDIF_Attribute& added, size_t present, const LDIF_Entry& entry) {
+    const LDIF_Values& values = added.values();
+    const bool is_one = present + values.size() <= 1;
+    if (values.empty()) {
         return;
     }
-    bool has_one = present && !present->values().empty();
-    for (const LDIF_Value& value : added.values()) {
-        if (present && present->values().find(value.str()) != present->values().end()) {
-            continue;
-        }
-        if (has_one) {
-            raise_with(second_value, {}, naming(added, value));
-        }
-        has_one = true;
+    if (values.type()->isSingle && !is_one) {
+        const auto second = std::next(values.begin(), present == 0 ? 1 : 0);
+        raise_with(second_value, {}, naming(added, *second));
+    }
+    if (entry.is_root() && !(is_of_root(added) && is_one)) {
+        raise_with(not_readable, {}, naming(added, *values.begin()));
     }
 }
 
-/// The attribute of that name, or null.
-LDIF_Attribute* find(LDIF_Attributes& attributes, const cisString& name) {
-    const auto found = attributes.find(name);
-    return found == attributes.end() ? nullptr : &*found;
-}
-
-void erase(LDIF_Attributes& attributes, const LDIF_Attribute& attribute) {
-    attributes.erase(attributes.find(attribute.name()));
+/// Prepares the attribute to be merged into the entry. Throws when it does not fit.
+void fit(LDIF_Attribute& added, const LDIF_Entry& entry) {
+    const auto present = entry.attributes().find(added.name());
+    const bool is_there = present != entry.attributes().end();
+    if (is_there) {
+        drop_duplicates(added, *present);
+    }
+    require_fit(added, is_there ? present->values().size() : 0, entry);
 }
 
 void delete_values(LDIF_Attributes& attributes, const modification& mod) {
-    LDIF_Attribute* found = find(attributes, cisString(mod.name));
-    if (!found) {
+    const auto found = attributes.find(cisString(mod.name));
+    if (found == attributes.end()) {
         raise_with(no_attribute, {}, [&](LDIF_Exception& e) {
             e.attribute = mod.name;
             // KEPT: where a value is expected, the name of the attribute stands again.
@@ -123,7 +134,7 @@ void delete_values(LDIF_Attributes& attributes, const modification& mod) {
         present -= mod.values[i];
     }
     if (mod.values.empty() || present.empty()) {
-        erase(attributes, *found);
+        attributes.erase(found);
     }
 }
 
@@ -142,30 +153,34 @@ void add_values(LDIF_Entry& entry, const modification& mod, aes_key_data* key) {
     }
     LDIF_Attribute attribute = attribute_of(mod, key);
     require_readable(attribute);
-    require_single(attribute, find(entry.attributes(), attribute.name()));
+    fit(attribute, entry);
     entry += std::move(attribute);
 }
 
+/// The values that are to take the place of the present ones. KEPT: when their syntax refuses one,
+/// the present ones are gone already.
+LDIF_Attribute replacement_of(LDIF_Values& present, const modification& mod, aes_key_data* key) {
+    try {
+        return attribute_of(mod, key);
+    } catch (const LDIF_Exception&) {
+        present.clear();
+        throw;
+    }
+}
+
 void replace_values(LDIF_Entry& entry, const modification& mod, aes_key_data* key) {
-    LDIF_Attribute* present = find(entry.attributes(), cisString(mod.name));
-    if (!present) {
+    const auto found = entry.attributes().find(cisString(mod.name));
+    if (found == entry.attributes().end()) {
         return add_values(entry, mod, key);
     }
     if (mod.values.empty()) {
-        return erase(entry.attributes(), *present);
+        entry.attributes().erase(found);
+        return;
     }
-    const auto attribute = [&] {
-        try {
-            return attribute_of(mod, key);
-        } catch (const LDIF_Exception&) {
-            // KEPT: the old values go before the new ones are looked at by their syntax.
-            present->values().clear();
-            throw;
-        }
-    }();
+    const LDIF_Attribute attribute = replacement_of(found->values(), mod, key);
     require_readable(attribute);
-    require_single(attribute, nullptr);
-    present->values().clear();
+    require_fit(attribute, 0, entry);
+    found->values().clear();
     entry += attribute;
 }
 
@@ -229,9 +244,9 @@ void LDIF_File::add(const LDIF_DN& dn, ldapmod** mods) {
             add_values(added, modification(**mods), key_);
         }
         // An entry that is there already takes over the attributes.
-        if (LDIF_Entry* present = root_.find(dn)) {
-            for (const LDIF_Attribute& attribute : added.attributes()) {
-                require_single(attribute, find(present->attributes(), attribute.name()));
+        if (const LDIF_Entry* present = root_.find(dn)) {
+            for (LDIF_Attribute& attribute : added.attributes()) {
+                fit(attribute, *present);
             }
         }
         root_ += std::move(added);

@@ -19,9 +19,6 @@ constexpr failure no_name{91, 1001, "Config filename is NULL!"};
 constexpr failure no_status{91, 1003, "_stat()"};
 constexpr failure not_opened{91, 1004, "ifstream()"};
 constexpr failure not_read{80, 1000, "System error reading file"};
-constexpr failure unfinished{80, 1002,
-                             "Configuration file was not written to its end; "
-                             "its backup is the complete version"};
 constexpr failure second_version{19, 1006, "More than 1 \"version\" attribute not allowed"};
 constexpr failure second_charset{19, 1006, "More than 1 \"charset\" attribute not allowed"};
 constexpr failure not_of_root{65, 1007, "\""};
@@ -172,11 +169,11 @@ void loader::add_root_attribute(LDIF_Attribute&& attribute) {
         e.attribute = attribute.name().text();
         e.value = attribute.values().begin()->str();
     };
-    const bool is_version = attribute == "version";
-    if (!is_version && !(attribute == "charset")) {
+    if (!is_of_root(attribute)) {
         raise_with(not_of_root,
                    attribute.name().text() + "\" attribute not allowed in <root> object", details);
     }
+    const bool is_version = attribute == "version";
     bool& seen = is_version ? version_seen_ : charset_seen_;
     if (seen) {
         raise_with(is_version ? second_version : second_charset, {}, details);
@@ -194,6 +191,10 @@ void loader::close_entry() {
 
 }  // namespace
 
+bool cfg32::is_of_root(const LDIF_Attribute& attribute) {
+    return attribute == "version" || attribute == "charset";
+}
+
 LDIF_File::LDIF_File(const std::string& fileName, const std::string& backupFileName,
                      aes_key_data* key)
     : file_name_(fileName), backup_file_name_(backupFileName), key_(key) {
@@ -204,9 +205,7 @@ LDIF_File::LDIF_File(const std::string& fileName, const std::string& backupFileN
 }
 
 bool LDIF_File::is_current(const struct stat& status) const {
-    return is_loaded_ && is_same_file(status, status_) &&
-           status.st_mtim.tv_sec == status_.st_mtim.tv_sec &&
-           status.st_mtim.tv_nsec == status_.st_mtim.tv_nsec;
+    return is_loaded_ && is_same_version(status, status_);
 }
 
 int LDIF_File::refresh() {
@@ -221,6 +220,22 @@ int LDIF_File::refresh() {
     return is_loaded ? 1 : 0;
 }
 
+/// Nobody shall write while the file is read. In an update nobody does: it has the lock.
+locked_file LDIF_File::locked_for_reading() {
+    if (!is_updated_) {
+        return locked(O_RDONLY, LOCK_SH);
+    }
+    locked_file file = locked(O_RDONLY, without_lock);
+    if (file && !lock_) {
+        errno = lock_error_;
+        return {};
+    }
+    if (file && !is_same_file(file.status(), lock_.status())) {
+        raise_changed();
+    }
+    return file;
+}
+
 bool LDIF_File::load_if_changed() {
     struct stat status;
     if (stat(file_name_.c_str(), &status) != 0) {
@@ -229,8 +244,7 @@ bool LDIF_File::load_if_changed() {
     if (is_current(status)) {
         return false;
     }
-    // Nobody shall write while it is read. In an update nobody does.
-    const locked_file file = locked(O_RDONLY, is_updated_ ? LOCK_UN : LOCK_SH);
+    const locked_file file = locked_for_reading();
     if (!file) {
         raise_with(not_opened, {}, name_file_and_errno(errno));
     }
@@ -243,9 +257,7 @@ bool LDIF_File::load_if_changed() {
         if (!read_all(file.get(), static_cast<size_t>(file.status().st_size), text)) {
             raise_with(not_read, {}, name_file_and_errno(errno));
         }
-        if (text.starts_with(unfinished_mark)) {
-            raise(unfinished);
-        }
+        require_finished(text);
         load.run(text);
     };
     with_boundary([] { return "reading file"; }, body,

@@ -4,6 +4,7 @@
 
 #include <set>
 #include <string>
+#include <string_view>
 
 #include "LDIF_Comment.h"
 #include "LDIF_Entry.h"
@@ -56,8 +57,8 @@ class LDIF_File {
     /// Copies the file to the backup name, if there is one, and writes the store over it. When it
     /// returns, both are on the disk. A failure before the writing leaves the file untouched; after
     /// one in the middle the old content is put back, if that is possible. Within an update the
-    /// file must be the one that was refreshed (51/51 otherwise). A store that can't be written,
-    /// or would not read back as it is written (21/1005), is forgotten: the next refresh() reads.
+    /// file must be the one that was refreshed (51/51 otherwise). A store whose text can't be
+    /// made, or would not read back (21/1005), is forgotten: the next refresh() reads the file.
     void flush();
 
     /// Changes an entry's attributes. Modifications before one that is refused stay applied.
@@ -100,13 +101,18 @@ class LDIF_File {
     bool is_current(const struct stat& status) const;
     bool load_if_changed();
     cfg32::locked_file locked(int flags, int operation) const;
+    cfg32::locked_file locked_for_reading();
+    [[noreturn]] void raise_changed();
+    void require_finished(std::string_view text) const;
     int authenticate(const char* dn, const char* password, int method) const;
     std::string text() const;
     void back_up() const;
     void write(const std::string& content, bool is_refreshed);
     cfg32::unique_fd open_for_writing(struct stat& status);
     void create();
-    void overwrite(cfg32::unique_fd file, const struct stat& status, const std::string& content);
+    void overwrite(cfg32::unique_fd file, struct stat& status, const std::string& content);
+    void require_own(const struct stat& status, bool is_refreshed);
+    void require_complete(bool is_refreshed);
 
     // What is filled in of a failure.
     void name_file(LDIF_Exception& e) const { e.configFile = file_name_; }
@@ -135,6 +141,9 @@ class LDIF_File {
 };
 
 namespace cfg32 {
+
+/// The only attributes above the first entry, with one value each: version and charset.
+bool is_of_root(const LDIF_Attribute& attribute);
 
 /// What a file with a backup begins with while it is written.
 inline constexpr std::string_view unfinished_mark =

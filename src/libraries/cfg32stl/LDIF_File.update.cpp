@@ -1,4 +1,5 @@
-// Keeping others away from the configuration file while it is changed.
+// Keeping others away from the configuration file while it is changed, and noticing those who don't
+// ask.
 
 #include <cerrno>
 
@@ -10,6 +11,10 @@ using namespace cfg32;
 namespace {
 
 constexpr failure busy{51, 51, "Configuration file is in use by another process"};
+constexpr failure changed{51, 51, "Configuration file was changed meanwhile"};
+constexpr failure unfinished{80, 1002,
+                             "Configuration file was not written to its end; "
+                             "its backup is the complete version"};
 
 }  // namespace
 
@@ -39,5 +44,18 @@ LDIF_File::update::~update() {
     if (is_outermost_) {
         file_.lock_ = locked_file();
         file_.is_updated_ = false;
+    }
+}
+
+/// The next refresh reads what the file has become.
+void LDIF_File::raise_changed() {
+    is_loaded_ = false;
+    raise_with(changed, {}, name_file_and_errno(0));
+}
+
+/// Throws when a writer did not come to the end of the text.
+void LDIF_File::require_finished(std::string_view text) const {
+    if (text.starts_with(unfinished_mark)) {
+        raise_with(unfinished, {}, name_file_and_errno(0));
     }
 }

@@ -26,7 +26,6 @@ constexpr failure not_written{80, 1000, "System error writing file"};
 constexpr failure no_status{91, 1003, "_stat()"};
 constexpr failure not_readable{21, 1005, "Entry would not read back as it is written"};
 constexpr failure not_whole{80, 1000, "Configuration file was not read to its end"};
-constexpr failure changed_meanwhile{51, 51, "Configuration file was changed meanwhile"};
 constexpr failure not_put_back{80, 1000, "The old content could not be put back"};
 
 constexpr size_t name_buffer_size = 2048;
@@ -77,7 +76,7 @@ bool can_be_loaded(const LDIF_Entry& entry) {
     }
     const LDIF_Attributes& attributes = entry.attributes();
     return std::all_of(attributes.begin(), attributes.end(), [](const LDIF_Attribute& attribute) {
-        return (attribute == "version" || attribute == "charset") && attribute.values().size() == 1;
+        return is_of_root(attribute) && attribute.values().size() <= 1;
     });
 }
 
@@ -96,6 +95,7 @@ void LDIF_File::flush() {
         const bool is_refreshed = is_updated_;
         const update lock(*this);
         if (!backup_file_name_.empty()) {
+            with_context([&] { require_complete(is_refreshed); }, forgetting);
             back_up();
         }
         write(content, is_refreshed);
@@ -109,13 +109,17 @@ std::string LDIF_File::text() const {
         raise(not_whole);
     }
     std::string out;
-    for_each_in_preorder(root_, [&](const LDIF_Entry& entry) {
+    const auto append = [&](const LDIF_Entry& entry) {
         const size_t begin = out.size();
         entry.append_to(out);
         if (!can_be_loaded(entry) ||
             !reads_back(std::string_view(out).substr(begin), entry.line_count())) {
-            raise_with(not_readable, {}, [&](LDIF_Exception& e) { e.entryDn = shown(entry.dn()); });
+            raise(not_readable);
         }
+    };
+    for_each_in_preorder(root_, [&](const LDIF_Entry& entry) {
+        with_context([&] { append(entry); },
+                     [&](LDIF_Exception& e) { e.entryDn = shown(entry.dn()); });
     });
     trailing_comment_.append_to(out);
     return out;
@@ -141,21 +145,38 @@ void LDIF_File::back_up() const {
     }
 }
 
-/// Makes content the file's, in place: links to it, its owner and its mode stay. What was refreshed
-/// in this update and is another file now, or has changed, is not overwritten.
+/// Makes content the file's, in place: links to it, its owner and its mode stay.
 void LDIF_File::write(const std::string& content, bool is_refreshed) {
     struct stat status;
     unique_fd file = open_for_writing(status);
-    if (!is_same_file(status, lock_.status()) || (is_refreshed && !is_current(status))) {
-        raise_with(changed_meanwhile, {}, [&](LDIF_Exception& e) { name_file(e); });
-    }
+    require_own(status, is_refreshed);
     overwrite(std::move(file), status, content);
-    if (stat(file_name_.c_str(), &status) != 0) {
+    struct stat named;
+    if (stat(file_name_.c_str(), &named) != 0) {
         raise_with(no_status, {}, name_file_and_errno(errno));
+    }
+    if (!is_same_version(named, status)) {  // somebody did not ask for the lock
+        raise_changed();
     }
     status_ = status;
     is_loaded_ = true;
     has_invalid_lines_ = false;
+}
+
+/// What is written over is the file that is locked and, in an update, what was refreshed.
+void LDIF_File::require_own(const struct stat& status, bool is_refreshed) {
+    if (!is_same_file(status, lock_.status()) || (is_refreshed && !is_current(status))) {
+        raise_changed();
+    }
+}
+
+/// The same before the backup is made: it is replaced by nothing but a complete version.
+void LDIF_File::require_complete(bool is_refreshed) {
+    struct stat status;
+    if (lock_ && stat(file_name_.c_str(), &status) == 0) {
+        require_finished(first_bytes(lock_.get(), unfinished_mark.size()));
+        require_own(status, is_refreshed);
+    }
 }
 
 unique_fd LDIF_File::open_for_writing(struct stat& status) {
@@ -185,8 +206,9 @@ void LDIF_File::create() {
     lock_error_ = lock_ ? 0 : errno;
 }
 
-/// Makes content the open file's, or puts back what was there.
-void LDIF_File::overwrite(unique_fd file, const struct stat& status, const std::string& content) {
+/// Makes content the open file's, or puts back what was there. Takes the new status.
+void LDIF_File::overwrite(unique_fd file, struct stat& status, const std::string& content) {
+    const timespec time = status.st_mtim;
     std::string before;
     if (!read_all(file.get(), static_cast<size_t>(status.st_size), before) ||
         !reserve(file.get(), before.size(), content.size())) {
@@ -196,15 +218,20 @@ void LDIF_File::overwrite(unique_fd file, const struct stat& status, const std::
     // A process that is killed in the middle leaves a file that no load takes for a complete one:
     // it would repair what can't be read, and let the backup be overwritten by it.
     const std::string_view mark = backup_file_name_.empty() ? "" : unfinished_mark;
-    if (cfg32::overwrite(file.get(), content, mark) && make_later(file.get(), status.st_mtim) &&
-        file.close()) {
+    if (replace_content(file.get(), content, mark) && make_later(file.get(), time, status) &&
+        sync_content(file.get()) && file.close()) {
         return;
     }
+    const int error = errno;
+    const int put_back_to = file ? file.get() : lock_.get();
+    const bool is_put_back =
+        replace_content(put_back_to, before, mark) && sync_content(put_back_to);
+    const int second_error = errno;
     LDIF_Exception e = make_exception(not_written);
-    name_file_and_errno(errno)(e);
-    if (!cfg32::overwrite(lock_.get(), before, mark)) {
+    name_file_and_errno(error)(e);
+    if (!is_put_back) {
         e.cause = std::make_unique<LDIF_Exception>(make_exception(not_put_back));
-        name_file_and_errno(errno)(*e.cause);
+        name_file_and_errno(second_error)(*e.cause);
     }
     throw e;
 }

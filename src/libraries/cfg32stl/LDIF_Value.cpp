@@ -198,10 +198,9 @@ LDIF_Values& LDIF_Values::operator+=(const LDIF_Values& other) {
 
 LDIF_Values& LDIF_Values::operator-=(const std::string& text) {
     const auto body = [&]() -> LDIF_Values& {
-        const list::iterator value = find(text);
+        const list::const_iterator value = find(text);
         if (value != values_.end()) {
-            forget(value);
-            values_.erase(value);
+            erase(value);
         }
         return *this;
     };
@@ -247,6 +246,15 @@ LDIF_Values::list::const_iterator LDIF_Values::find(const std::string& text) con
     return const_cast<LDIF_Values*>(this)->find(text);
 }
 
+LDIF_Values::list::const_iterator LDIF_Values::find(const LDIF_Value& value) const {
+    return const_cast<LDIF_Values*>(this)->position_of(value);
+}
+
+LDIF_Values::list::const_iterator LDIF_Values::erase(list::const_iterator value) {
+    forget(value);
+    return values_.erase(value);
+}
+
 /// The first value that is equal by the syntax.
 LDIF_Values::list::iterator LDIF_Values::position_of(const LDIF_Value& value) {
     if (values_.size() <= longest_scan) {
@@ -274,7 +282,7 @@ void LDIF_Values::index_values() {
 }
 
 /// Takes a value out of the index.
-void LDIF_Values::forget(list::iterator value) {
+void LDIF_Values::forget(list::const_iterator value) {
     if (!index_) {
         return;
     }

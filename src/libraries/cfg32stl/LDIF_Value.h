@@ -84,6 +84,10 @@ class LDIF_Values {
 
     list::const_iterator find(const std::string& text) const;
     list::iterator find(const std::string& text);
+    /// The value that is equal by the syntax.
+    list::const_iterator find(const LDIF_Value& value) const;
+    /// Returns the value that followed.
+    list::const_iterator erase(list::const_iterator value);
     list::const_iterator begin() const { return values_.begin(); }
     list::const_iterator end() const { return values_.end(); }
     bool empty() const { return values_.empty(); }
@@ -104,7 +108,7 @@ class LDIF_Values {
     void complete(LDIF_Exception& e, const std::string& text) const;
     list::iterator position_of(const LDIF_Value& value);
     void index_values();
-    void forget(list::iterator value);
+    void forget(list::const_iterator value);
 
     list values_;
     cisString name_;

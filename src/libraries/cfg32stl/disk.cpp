@@ -5,6 +5,7 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <cerrno>
 #include <chrono>
 #include <thread>
@@ -54,13 +55,32 @@ bool is_within_limit(size_t size) {
 /// Takes room by writing, for file systems that can't reserve: line feeds, of which no file gets
 /// another meaning at its end.
 bool write_blank_lines(int file, size_t from, size_t to) {
-    if (write_all(file, std::string(to - from, '\n'), from)) {
-        return true;
-    }
-    const int error = errno;
-    resize(file, from);
-    errno = error;
-    return false;
+    return write_all(file, std::string(to - from, '\n'), from) && sync_content(file);
+}
+
+/// Asks the file system for room from one place to another.
+bool allocate(int file, int mode, size_t from, size_t to) {
+    return retry_interrupted([=] {
+               return fallocate(file, FALLOC_FL_KEEP_SIZE | mode, static_cast<off_t>(from),
+                                static_cast<off_t>(to - from));
+           }) == 0;
+}
+
+bool is_unsupported(int error) { return error == EOPNOTSUPP || error == ENOSYS || error == EINVAL; }
+
+/// A copy of the file may share its blocks: the backup does, where the file system can. What is
+/// overwritten then takes new ones.
+bool unshare(int file, size_t size) {
+    return size == 0 || allocate(file, FALLOC_FL_UNSHARE_RANGE, 0, size) || is_unsupported(errno);
+}
+
+bool extend(int file, size_t from, size_t to) {
+    return from >= to || allocate(file, 0, from, to) ||
+           (is_unsupported(errno) && write_blank_lines(file, from, to));
+}
+
+bool is_equal(const timespec& left, const timespec& right) {
+    return left.tv_sec == right.tv_sec && left.tv_nsec == right.tv_nsec;
 }
 
 bool is_later(const timespec& time, const timespec& than) {
@@ -73,27 +93,18 @@ timespec later(const timespec& time, std::chrono::nanoseconds step) {
     return {time.tv_sec + nanoseconds / second, nanoseconds % second};
 }
 
-bool has_later_time(int file, const timespec& before, bool& is_so) {
-    struct stat status;
-    if (fstat(file, &status) != 0) {
-        return false;
-    }
-    is_so = is_later(status.st_mtim, before);
-    return true;
-}
-
 /// For files of somebody else: only their owner may choose the time, but who may write may set it
 /// to the present one.
-bool wait_for_later_time(int file, const timespec& before) {
+bool wait_for_another_time(int file, const timespec& before, struct stat& status) {
     constexpr auto coarsest_clock = 2s;  // of FAT
     const auto deadline = std::chrono::steady_clock::now() + coarsest_clock;
-    for (bool done = false; !done;) {
+    while (is_equal(status.st_mtim, before)) {
         if (std::chrono::steady_clock::now() > deadline) {
             errno = EPERM;
             return false;
         }
         std::this_thread::sleep_for(1ms);
-        if (futimens(file, nullptr) != 0 || !has_later_time(file, before, done)) {
+        if (futimens(file, nullptr) != 0 || fstat(file, &status) != 0) {
             return false;
         }
     }
@@ -122,52 +133,61 @@ bool read_all(int file, size_t expected, std::string& text) {
     }
 }
 
+std::string first_bytes(int file, size_t count) {
+    std::string bytes(count, '\0');
+    const ssize_t got =
+        retry_interrupted([&] { return pread(file, bytes.data(), bytes.size(), 0); });
+    bytes.resize(got < 0 ? 0 : static_cast<size_t>(got));
+    return bytes;
+}
+
 bool reserve(int file, size_t present, size_t wanted) {
     if (!is_within_limit(wanted)) {
         return false;
     }
-    if (wanted <= present) {
+    if (unshare(file, std::min(present, wanted)) && extend(file, present, wanted)) {
         return true;
     }
-    const auto missing = static_cast<off_t>(wanted - present);
-    const int result = retry_interrupted(
-        [=] { return fallocate(file, FALLOC_FL_KEEP_SIZE, static_cast<off_t>(present), missing); });
-    const bool is_possible = result == 0 || (errno != EOPNOTSUPP && errno != ENOSYS);
-    return is_possible ? result == 0 : write_blank_lines(file, present, wanted);
+    const int error = errno;
+    resize(file, present);  // gives back what was got
+    errno = error;
+    return false;
 }
 
-bool overwrite(int file, std::string_view text, std::string_view mark) {
-    if (text.size() < mark.size()) {
-        mark = {};
-    }
-    // The mark is less than what the system writes at once: it is there, or it isn't.
-    return write_all(file, mark, 0) && write_all(file, text.substr(mark.size()), mark.size()) &&
-           resize(file, text.size()) && write_all(file, text.substr(0, mark.size()), 0) &&
-           retry_interrupted([=] { return fdatasync(file); }) == 0;
+bool replace_content(int file, std::string_view text, std::string_view mark) {
+    // The mark, and what takes its place, is less than the system writes at once: it is there, or
+    // it isn't. Blank lines fill the place when the text is shorter.
+    std::string head(text.substr(0, mark.size()));
+    head.resize(mark.size(), '\n');
+    const std::string_view rest = text.substr(std::min(text.size(), mark.size()));
+    return write_all(file, mark, 0) && write_all(file, rest, mark.size()) &&
+           resize(file, std::max(text.size(), mark.size())) && write_all(file, head, 0) &&
+           (text.size() >= mark.size() || resize(file, text.size()));
 }
 
-bool make_later(int file, const timespec& before) {
-    bool done = false;
-    if (!has_later_time(file, before, done)) {
+bool sync_content(int file) {
+    return retry_interrupted([=] { return fdatasync(file); }) == 0;
+}
+
+bool make_later(int file, const timespec& before, struct stat& status) {
+    if (fstat(file, &status) != 0) {
         return false;
     }
     // File systems round times down, some of them to two seconds.
     for (const std::chrono::nanoseconds step : {1ns, 1'000ns, 1'000'000'000ns, 2'000'000'000ns}) {
-        if (done) {
+        if (is_later(status.st_mtim, before)) {
             return true;
         }
         const timespec times[2] = {{0, UTIME_OMIT}, later(before, step)};
         if (futimens(file, times) != 0) {
-            return errno == EPERM && wait_for_later_time(file, before);
+            return errno == EPERM && wait_for_another_time(file, before, status);
         }
-        if (!has_later_time(file, before, done)) {
+        if (fstat(file, &status) != 0) {
             return false;
         }
     }
-    if (!done) {
-        errno = EOVERFLOW;
-    }
-    return done;
+    errno = EOVERFLOW;
+    return is_later(status.st_mtim, before);
 }
 
 }  // namespace cfg32

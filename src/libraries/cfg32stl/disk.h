@@ -2,6 +2,8 @@
 
 // Reading and writing whole open files. Failures are false, with the reason in errno.
 
+#include <sys/stat.h>
+
 #include <cstddef>
 #include <ctime>
 #include <string>
@@ -12,15 +14,22 @@ namespace cfg32 {
 /// Reads the whole file. expected is a hint of how much there is.
 bool read_all(int file, size_t expected, std::string& text);
 
-/// Takes the room that a text of `wanted` bytes needs beyond the end of the file, which is
-/// `present` bytes long. After a failure the file is what it was.
+/// What the file begins with: so many bytes, or fewer where there are no more.
+std::string first_bytes(int file, size_t count);
+
+/// Takes the room that a text of `wanted` bytes needs in the place of the file's present content.
+/// After a failure the file is what it was.
 bool reserve(int file, size_t present, size_t wanted);
 
-/// Makes the text the file's whole content, on the disk. Until it is complete the file begins with
-/// the mark, if there is one; a text that is shorter than the mark does without.
-bool overwrite(int file, std::string_view text, std::string_view mark = {});
+/// Makes the text the file's whole content. Until it is complete the file begins with the mark, if
+/// there is one.
+bool replace_content(int file, std::string_view text, std::string_view mark = {});
 
-/// Makes the file's modification time a later one than `before`, if it isn't.
-bool make_later(int file, const timespec& before);
+/// Makes the file's modification time a later one than `before`, if it isn't; of a file of somebody
+/// else, another one. Takes the status.
+bool make_later(int file, const timespec& before, struct stat& status);
+
+/// Waits until the content is on the disk.
+bool sync_content(int file);
 
 }  // namespace cfg32

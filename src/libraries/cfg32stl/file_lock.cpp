@@ -35,7 +35,7 @@ locked_file::locked_file(const char* path, int flags, int operation,
     const auto end = std::chrono::steady_clock::now() + wait;
     while (!take(path, flags, operation)) {
         if (errno != EWOULDBLOCK || std::chrono::steady_clock::now() >= end) {
-            file_ = unique_fd();
+            give_back();
             return;
         }
         std::this_thread::sleep_for(between_attempts);
@@ -54,7 +54,7 @@ bool locked_file::take(const char* path, int flags, int operation) {
         return false;
     }
     if (!is_same_file(named, status_)) {
-        file_ = unique_fd();
+        give_back();
         errno = EWOULDBLOCK;
         return false;
     }
@@ -63,11 +63,14 @@ bool locked_file::take(const char* path, int flags, int operation) {
     return is_locked;
 }
 
+locked_file::~locked_file() { give_back(); }
+
 /// Closing the file would leave the lock to a child process that was forked meanwhile.
-locked_file::~locked_file() {
+void locked_file::give_back() {
     if (file_) {
         const int saved = errno;
         flock(file_.get(), LOCK_UN);
+        file_.close();
         errno = saved;
     }
 }

@@ -69,6 +69,9 @@ bool may_replace(const char* target, const struct stat& source) {
 bool write_all(int fd, const char* data, std::size_t size) {
     while (size > 0) {
         const ssize_t written = retry_interrupted([=] { return ::write(fd, data, size); });
+        if (written == 0) {
+            return fail(EIO);
+        }
         if (written < 0) {
             return false;
         }
@@ -98,6 +101,12 @@ bool copy_content(int from, int to) {
     }
 }
 
+// In the permission bits of a file with an access control list, the group's are the list's mask:
+// what any of those whom it names may do at most, and not what the group may (acl(5)).
+mode_t without_mask(int from, mode_t mode) {
+    return ::fgetxattr(from, "system.posix_acl_access", nullptr, 0) > 0 ? mode & ~S_IRWXG : mode;
+}
+
 // The directory's default access control list would let others in as soon as the group bits, which
 // are its mask, are set (acl(5)).
 bool drop_inherited_access_list(int fd) {
@@ -120,6 +129,16 @@ bool give_owner(int fd, uid_t owner, gid_t group) {
         return true;
     }
     return ::fchown(fd, owner, group) == 0;
+}
+
+// Keeps an owner and a group that have no name by their numbers, where that is allowed. A group
+// that can't be kept leaves its access to no other. Returns the permission bits that remain.
+mode_t keep_unnamed(int fd, const struct stat& source, bool owner, bool group, mode_t mode) {
+    const bool has_group = !group || give_owner(fd, unchanged_owner, source.st_gid);
+    if (owner) {
+        give_owner(fd, source.st_uid, unchanged_group);
+    }
+    return has_group ? mode : mode & ~S_IRWXG;
 }
 
 // The permission bits come last: chown(2) clears the set-ID bits, and until the owner is right
@@ -161,8 +180,11 @@ bool copy_file(const char* source, const char* target, const char* owner, const 
     }
 
     temporary_file copy(directory.get());
-    return copy && copy_content(from.get(), copy.fd()) &&
-           give_access(copy.fd(), owner_id, group_id, mode) &&
+    if (!copy || !copy_content(from.get(), copy.fd())) {
+        return false;
+    }
+    mode = keep_unnamed(copy.fd(), source_status, owner == nullptr, group == nullptr, mode);
+    return give_access(copy.fd(), owner_id, group_id, without_mask(from.get(), mode)) &&
            retry_interrupted([&copy] { return ::fsync(copy.fd()); }) == 0 &&
            copy.move_to(name.base) && sync_directory(directory.get());
 }
