@@ -104,7 +104,7 @@ static int compare(const char *backup_name, const char *file_name) {
 static int draw_tree(CfgHandle *handle) {
     const char *tree = cfg_tree_view(handle, CFG_TREE_ASCII); /* the handle's: not to be freed */
     if (!tree) {
-        fprintf(stderr, "draw the tree: out of memory\n");
+        fprintf(stderr, "the tree can't be drawn\n");
         return 0;
     }
     printf("%s", tree);

@@ -28,19 +28,24 @@
  *     outlives the handle that it came from. Text returned as const char * is not the caller's.
  *     Arguments stay the caller's and are not kept, save for the key of CFG_OPT_KEY_DATA.
  *  5. Changes. When a call that changes the configuration returns 0, the new file is on the disk,
- *     and so is, if CFG_OPT_BACKUP_FILE names one, a copy of the file of before. The backup is
- *     complete before the first byte of the file changes: at every moment one of the two is a
- *     complete version. The file is overwritten in place; links to it, its owner and its mode
- *     stay. A process that is killed in the middle leaves a file that no call loads (80/1002):
- *     copy the backup over it. When a call returns anything else than 0, the file is what it was,
- *     except as said below of codes 80 and 91 at cfg_modify_s(). The copy in memory is not rolled
- *     back: modifications before the one that was refused, and a change that failed because the
- *     file could not be backed up or opened, are seen by searches of this handle and are written
- *     with its next change. To drop them, unbind.
+ *     overwritten in place; links to it, its owner and its mode stay. If CFG_OPT_BACKUP_FILE names
+ *     a backup, the file of before is on the disk as well, complete before the first byte of the
+ *     file changes: at every moment one of the two is a complete version. A process that is killed
+ *     in the middle then leaves a file that no call loads (80/1002): copy the backup over it.
+ *     Without a backup it may leave a mixture of both versions.
+ *     When a call returns a failure, the file holds what it held, save for unusable lines that it
+ *     found and kept in their own way (see cfg_bind_s()) and for what is said of codes 80 and 91
+ *     at cfg_modify_s(). This handle's copy in memory is not rolled back: what was carried out
+ *     before the refusal (earlier modifications, earlier values of a deletion), and a change that
+ *     failed before the file was touched (no backup, no permission, no room), is seen by its
+ *     searches and written with its next change. The copy is dropped, and read again, when the
+ *     failure came later, when the text could not be made, and when somebody else changes the
+ *     file; to drop it yourself, unbind.
  *  6. Many programs. Every program that uses this library sees the changes of the others at its
  *     next call, and no change is lost when several make one at the same time: each keeps the
  *     others away (flock(2) on the file itself) while it changes the file, and while it reads it. A
- *     call that has to wait for longer than ten seconds gives up with CFG_BUSY (51).
+ *     call that has to wait for longer than ten seconds gives up with CFG_BUSY (51). An editor does
+ *     not ask: a call that notices that it changed the file meanwhile gives up with 51, too.
  *  7. Secrets. Passwords that a search decoded are wiped when their result is freed. Copies made by
  *     cfg_get_values() are the caller's to wipe. The report of a failure holds the value that was
  *     refused, or a whole entry, with which may come a password: don't log it where others read.
@@ -166,12 +171,13 @@ enum {
 /** Text, at first null: the configuration file that the next cfg_bind_s() loads. A bound handle
  * keeps the file it has, but while this is null its calls return 89. */
 #define CFG_OPT_CONFIG_FILE 1005
-/** Text, at first null: where the next cfg_bind_s() has the file copied before each change, with
- * its owner, group and mode. Null makes no backup. */
+/** Text, at first null: where the next cfg_bind_s(), and then every change, has the file copied
+ * before it is written, with its owner, group and mode. Another name than the file's. Null makes no
+ * backup. */
 #define CFG_OPT_BACKUP_FILE 1006
 /** struct aes_key_data *, at first null: key for encoded passwords. The next cfg_bind_s() loads the
- * file with it, and searches decode with it at once. It stays the caller's and must outlive the
- * handle. */
+ * file with it, and changes encode with the key of the bind; searches decode with the present one.
+ * Without a key passwords are only masked. It stays the caller's and must outlive the handle. */
 #define CFG_OPT_KEY_DATA 1007
 
 /** Values for the boolean options of cfg_set_option(); every pointer but null means on. */
@@ -212,7 +218,8 @@ CFG32_API CfgHandle *cfg_init(void) CFG32_NOEXCEPT;
  *
  * Lines that can't be used (without a ":", or with a value that their attribute does not allow) do
  * not stop the load: each becomes an attribute oru-slapdInvalidLine of its entry and the file is
- * rewritten at once, after a backup if CFG_OPT_BACKUP_FILE names one.
+ * rewritten at once, after a backup if CFG_OPT_BACKUP_FILE names one. Writing a file encodes its
+ * passwords, and so does every later change.
  *
  * @param handle    a created handle
  * @param dn        the administrator's DN, or null with a null password for an anonymous bind;
@@ -431,32 +438,42 @@ CFG32_API void cfg_memfree(void *text) CFG32_NOEXCEPT;
  * char *port[] = {"1389", NULL};
  * LDAPMod replace = {.mod_op = LDAP_MOD_REPLACE, .mod_type = "oru-slapdPort", .mod_values = port};
  * LDAPMod *changes[] = {&replace, NULL};
- * if (cfg_modify_s(handle, "cn=Front End, cn=Configuration", changes) != CFG_SUCCESS)
- *     fprintf(stderr, "%s\n", cfg_dump_exception(handle));
+ * int code = cfg_modify_s(handle, "cn=Front End, cn=Configuration", changes);
+ * if (code != CFG_SUCCESS) {
+ *     const char *report = cfg_dump_exception(handle);
+ *     fprintf(stderr, "%s\n", report ? report : cfg_err2string(code));
+ * }
  * @endcode
  *
  * @param handle  a bound handle
- * @param dn      the entry
+ * @param dn      the entry; "" for the lines above all entries, version and charset
  * @param mods    ended by null; null or empty writes the file as it is, whether there is such an
  *                entry or not. Values are texts ended by NUL, binary ones as well. They stay the
  *                caller's.
  * @return 0;
  *         16 (No such attribute) when an attribute to delete from is not there;
+ *         18, 21, 34, 83 or 84 for a value that the attribute's syntax does not allow;
  *         19 (Constraint violation) for a second, different value of a single-valued attribute:
  *         that modification changes nothing;
- *         18, 21, 34, 83 or 84 for a value that the attribute's syntax does not allow; 21 also for
- * a name or value that would not read back as it is written (a line feed, blanks at its ends),
- * which is forgotten; 32 (No such object) when there is no such entry; 34 (Invalid DN syntax) for a
- * malformed dn; 50 (Insufficient access) when the file can't be backed up or opened for writing; 51
- * (DSA is busy) when another program kept the file for ten seconds, or one that does not ask
- * changed it during this call: try again; 80 for a failure of the system (the report tells the
- * errno: a full disk, for example) or of the library. When the file had been written to, the old
- * content was put back; if that failed as well, the report says so, and the complete version is the
- * backup; 89 for a handle that is null or not bound, a null dn, or an unknown operation; 90 when
- * memory is exhausted; 91 (Connection error) when the file is missing. "_stat()" without a "No such
- * file" means that the file was written, but could not be looked at afterwards; 162 for text that
- * is not of the locale's character set; or what cfg_bind_s() returns when the file has to be read
- * again.
+ *         21 (Invalid syntax) also for a name or value that would not read back as it is written
+ *         (a line feed, blanks at its ends): that modification changes nothing;
+ *         21 or 34 also when an entry of the file, whichever, can't be written: the change is
+ *         forgotten;
+ *         32 (No such object) when there is no such entry;
+ *         34 (Invalid DN syntax) for a malformed dn;
+ *         50 (Insufficient access) when the file can't be backed up or opened for writing;
+ *         51 (DSA is busy) when another program kept the file for ten seconds, or one that does
+ *         not ask changed it during this call: try again;
+ *         80 for a failure of the system (exhausted memory included; the report tells the errno,
+ *         of a full disk for example) or of the library, or for a file that was not written to its
+ *         end. When the file had been written to, the old content was put back; if that failed as
+ *         well, the report says so, and the backup is the complete version;
+ *         89 for a handle that is null or not bound, a null dn, or an unknown operation;
+ *         90 when memory is exhausted and not even the report can be kept;
+ *         91 (Connection error) when the file is missing. With the message "_stat()" after the file
+ *         was written, it could not be looked at afterwards;
+ *         162 (Unusable input character) for text that is not of the locale's character set;
+ *         or what cfg_bind_s() returns when the file has to be read again.
  */
 CFG32_API int cfg_modify_s(CfgHandle *handle, const char *dn, struct ldapmod **mods) CFG32_NOEXCEPT;
 
@@ -469,7 +486,7 @@ CFG32_API int cfg_modify_s(CfgHandle *handle, const char *dn, struct ldapmod **m
  * @param dn    the entry's DN; the attribute of its first part is not added by itself
  * @param mods  the attributes with their values, ended by null; may be null. The operation is not
  *              looked at, save for LDAP_MOD_BVALUES; an attribute without values is passed over
- * @return as cfg_modify_s(), save 16 and 32.
+ * @return as cfg_modify_s(), save 16, 32 and the unknown operation. A refused entry leaves nothing.
  */
 CFG32_API int cfg_add_s(CfgHandle *handle, const char *dn, struct ldapmod **mods) CFG32_NOEXCEPT;
 
@@ -477,16 +494,17 @@ CFG32_API int cfg_add_s(CfgHandle *handle, const char *dn, struct ldapmod **mods
  * Deletes an entry, with the comment lines before it, and writes the file. With
  * CFG_OPT_DELETE_NON_LEAVES everything below the entry goes with it.
  *
- * @return as cfg_modify_s(), and 66 (Operation not allowed on nonleaf) for an entry with others
- *         below it while CFG_OPT_DELETE_NON_LEAVES is off.
+ * @return as cfg_modify_s(), of 0, 21, 32, 34, 50, 51, 80, 89, 90, 91 and 162; 66 (Operation not
+ *         allowed on nonleaf) for an entry with others below it while CFG_OPT_DELETE_NON_LEAVES is
+ *         off.
  */
 CFG32_API int cfg_delete_s(CfgHandle *handle, const char *dn) CFG32_NOEXCEPT;
 
 /**
  * Writes the file as it is: in its canonical form, after a backup. No other call needs this one.
  *
- * @return as cfg_modify_s(), of 50, 51, 80, 89, 91 and what cfg_bind_s() returns when the file has
- *         to be read again.
+ * @return as cfg_modify_s(), of 0, 21, 34, 50, 51, 80, 89, 90 and 91, and what cfg_bind_s() returns
+ *         when the file has to be read again.
  */
 CFG32_API int cfg_flush_s(CfgHandle *handle) CFG32_NOEXCEPT;
 
@@ -532,11 +550,11 @@ CFG32_API const char *cfg_dump_exception(CfgHandle *handle) CFG32_NOEXCEPT;
  */
 
 /**
- * Returns the configuration file of the last failure; when there was none, of the bind; before a
- * bind, the one of CFG_OPT_CONFIG_FILE or the default one.
+ * Returns the configuration file of the last failure; when it tells none, of the bind; of a handle
+ * that is not bound (or whose CFG_OPT_CONFIG_FILE is null), that option's or the default one.
  *
  * @return null for a null handle, or when no name is known. The default name is valid until the
- *         next call of this function in the same thread.
+ *         next call in the same thread that asks for it.
  */
 CFG32_API const char *cfg_get_file_name(CfgHandle *handle) CFG32_NOEXCEPT;
 

@@ -47,7 +47,7 @@ void load_lines(const struct fixture *f, const char *lines);
 
 /** The file has this text. */
 void assert_file(const char *path, const char *expected);
-/** The configuration file has these entries, and not a byte else. */
+/** The configuration file has these entries, and not a byte more. */
 void assert_entries(const struct fixture *f, const char *expected);
 void assert_lines(const struct fixture *f, const char *expected);
 /** The lines of an entry as searches of the handle see it; an attribute without values is its name
