@@ -20,6 +20,7 @@ namespace cfg32::platform {
 namespace {
 
 constexpr mode_t permission_bits = 07777;
+constexpr mode_t group_bits = S_IRWXG;
 
 bool fail(int error) {
     errno = error;
@@ -104,7 +105,7 @@ bool copy_content(int from, int to) {
 // In the permission bits of a file with an access control list, the group's are the list's mask:
 // what any of those whom it names may do at most, and not what the group may (acl(5)).
 mode_t without_mask(int from, mode_t mode) {
-    return ::fgetxattr(from, "system.posix_acl_access", nullptr, 0) > 0 ? mode & ~S_IRWXG : mode;
+    return ::fgetxattr(from, "system.posix_acl_access", nullptr, 0) > 0 ? mode & ~group_bits : mode;
 }
 
 // The directory's default access control list would let others in as soon as the group bits, which
@@ -138,7 +139,7 @@ mode_t keep_unnamed(int fd, const struct stat& source, bool owner, bool group, m
     if (owner) {
         give_owner(fd, source.st_uid, unchanged_group);
     }
-    return has_group ? mode : mode & ~S_IRWXG;
+    return has_group ? mode : mode & ~group_bits;
 }
 
 // The permission bits come last: chown(2) clears the set-ID bits, and until the owner is right
