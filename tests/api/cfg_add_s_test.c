@@ -1,3 +1,5 @@
+/* cfg_add_s makes an entry, or adds to one; see update_calls_test.c for what the calls share. */
+
 #include <string.h>
 
 #include "changes.h"

@@ -1,3 +1,5 @@
+/* cfg_delete_s takes an entry away, and only what goes with it; see update_calls_test.c. */
+
 #include <stdlib.h>
 
 #include "changes.h"

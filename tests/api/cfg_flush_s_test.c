@@ -63,6 +63,39 @@ static void a_flush_writes_what_a_refused_change_left_in_memory(void **state) {
     assert_lines(f, "note: a\nnote: b\n");
 }
 
+static void what_can_not_be_written_as_text_is_reported_with_its_entry(void **state) {
+    static const struct {
+        const char *entry;
+        int code;
+        int extended;
+        const char *dn;
+    } rows[] = {
+        {ENTRY("cn=\"\"", "note: n\n"), CFG_INVALID_DN_SYNTAX, 1013, "cn=, " TOP},
+        {ENTRY("cn=#", "note: n\n"), CFG_INVALID_DN_SYNTAX, 1013, "cn=, " TOP},
+        {ENTRY("cn=a\\0Ab", "note: n\n"), CFG_INVALID_SYNTAX, 1005, "cn=a\nb, " TOP},
+        {ENTRY("cn=a\\0Db", "note: n\n"), CFG_INVALID_SYNTAX, 1005, "cn=a\rb, " TOP},
+        /* Each comment keeps the line below it apart; together the two would be one. */
+        {ENTRY("cn=X", "# c\n foo: a\n# d\n foo: b\n"), CFG_INVALID_SYNTAX, 1005, "cn=X, " TOP},
+    };
+    struct fixture *f = *state;
+    char *backup = set_backup(f, "backup.conf");
+    for (size_t i = 0; i < LENGTH(rows); ++i) {
+        load_entries(f, rows[i].entry);
+        /* What was loaded stays what it is, however often. */
+        for (int attempt = 0; attempt < 2; ++attempt) {
+            assert_int_equal(cfg_flush_s(f->handle), rows[i].code);
+            assert_int_equal(cfg_get_exterror(f->handle), rows[i].extended);
+            assert_string_equal(cfg_get_entry(f->handle), rows[i].dn);
+            assert_report_has(f->handle, rows[i].code, "\nentry dn: ");
+            assert_report_has(f->handle, rows[i].code, rows[i].dn);
+            assert_string_equal(cfg_get_file_name(f->handle), f->config);
+            assert_entries(f, rows[i].entry);
+            assert_false(file_exists(backup));
+        }
+    }
+    free(backup);
+}
+
 static void a_large_file_is_written_whole_and_may_shrink_again(void **state) {
     enum { values = 20000 };
     struct fixture *f = *state;
@@ -86,6 +119,7 @@ int main(void) {
         CREATED(a_flush_without_changes_writes_the_file_nevertheless),
         CREATED(an_empty_file_gets_no_entries),
         CREATED(a_flush_writes_what_a_refused_change_left_in_memory),
+        CREATED(what_can_not_be_written_as_text_is_reported_with_its_entry),
         CREATED(a_large_file_is_written_whole_and_may_shrink_again),
     };
     return cmocka_run_group_tests_name("cfg_flush_s", tests, NULL, NULL);

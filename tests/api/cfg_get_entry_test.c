@@ -25,11 +25,6 @@ static void assert_place(CfgHandle *handle, struct place expected) {
     assert_text(cfg_get_value(handle), expected.value);
 }
 
-static int search(CfgHandle *handle, const char *base, const char *filter) {
-    CfgMessage *result = NULL;
-    return cfg_search_s(handle, base, CFG_SCOPE_SUBTREE, filter, NULL, 0, &result);
-}
-
 /* Leaves a failure with an entry, an attribute and a value. */
 static void provoke_a_failure(CfgHandle *handle) {
     assert_int_equal(modify_one(handle, FRONT_END, LDAP_MOD_ADD, "oru-slapdSysLogLevel", "loud"),
@@ -67,7 +62,7 @@ static void a_report_without_a_place_has_an_empty_entry_and_value_but_no_attribu
     assert_int_equal(cfg_bind_s(f->handle, NULL, NULL, 0), CFG_AUTH_UNKNOWN);
     assert_place(f->handle, unknown);
     assert_int_equal(bind_administrator(f->handle), CFG_SUCCESS);
-    assert_int_equal(search(f->handle, "cn=none", NULL), CFG_NO_SUCH_OBJECT);
+    assert_int_equal(search_below(f->handle, "cn=none", NULL), CFG_NO_SUCH_OBJECT);
     assert_place(f->handle, unknown);
 }
 
@@ -151,7 +146,7 @@ static void an_attribute_without_a_name_is_null(void **state) {
 
 static void a_refused_filter_gives_the_whole_text_of_the_base(void **state) {
     struct fixture *f = *state;
-    assert_int_equal(search(f->handle, FRONT_END, "oru-slapdPort=many"), CFG_INVALID_SYNTAX);
+    assert_int_equal(search_below(f->handle, FRONT_END, "oru-slapdPort=many"), CFG_INVALID_SYNTAX);
     assert_text(cfg_get_attribute(f->handle), "oru-slapdPort");
     assert_text(cfg_get_value(f->handle), "many");
     assert_text(cfg_get_entry(f->handle), "dn: " FRONT_END
@@ -277,7 +272,7 @@ static void the_next_call_that_resets_forgets_the_place(void **state) {
 static void the_next_failure_has_a_place_of_its_own(void **state) {
     struct fixture *f = *state;
     provoke_a_failure(f->handle);
-    assert_int_equal(search(f->handle, "cn=none", NULL), CFG_NO_SUCH_OBJECT);
+    assert_int_equal(search_below(f->handle, "cn=none", NULL), CFG_NO_SUCH_OBJECT);
     assert_place(f->handle, unknown);
 }
 

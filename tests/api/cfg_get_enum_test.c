@@ -38,11 +38,6 @@ static void assert_constraints(CfgHandle *handle, struct constraints expected) {
     assert_int_equal(cfg_get_is_single(handle), expected.is_single);
 }
 
-static int search(CfgHandle *handle, const char *base, const char *filter) {
-    CfgMessage *result = NULL;
-    return cfg_search_s(handle, base, CFG_SCOPE_SUBTREE, filter, NULL, 0, &result);
-}
-
 static int add_value(CfgHandle *handle, const char *name, const char *value) {
     return modify_one(handle, FRONT_END, LDAP_MOD_ADD, name, value);
 }
@@ -81,7 +76,7 @@ static void a_failure_that_violates_no_attribute_has_none(void **state) {
     struct fixture *f = *state;
     assert_int_equal(cfg_bind_s(f->handle, NULL, NULL, 0), CFG_AUTH_UNKNOWN);
     assert_constraints(f->handle, none);
-    assert_int_equal(search(f->handle, "cn=none", NULL), CFG_NO_SUCH_OBJECT);
+    assert_int_equal(search_below(f->handle, "cn=none", NULL), CFG_NO_SUCH_OBJECT);
     assert_constraints(f->handle, none);
     assert_int_equal(modify_one(f->handle, FRONT_END, LDAP_MOD_DELETE, "oru-slapdSysLogLevel", "m"),
                      CFG_NO_SUCH_ATTRIBUTE);
@@ -162,7 +157,7 @@ static void a_list_that_is_not_enforced_is_told_all_the_same(void **state) {
 
 static void a_refused_filter_tells_them(void **state) {
     struct fixture *f = *state;
-    assert_int_equal(search(f->handle, BASE, "oru-slapdPort=0"), CFG_INVALID_SYNTAX);
+    assert_int_equal(search_below(f->handle, BASE, "oru-slapdPort=0"), CFG_INVALID_SYNTAX);
     assert_constraints(f->handle, (struct constraints){NULL, 0, 1, 65535, 1});
 }
 
@@ -211,7 +206,7 @@ static void the_next_call_that_resets_forgets_them(void **state) {
     assert_int_equal(search_all(f->handle), CFG_SUCCESS);
     assert_constraints(f->handle, none);
     provoke_a_failure(f->handle);
-    assert_int_equal(search(f->handle, "cn=none", NULL), CFG_NO_SUCH_OBJECT);
+    assert_int_equal(search_below(f->handle, "cn=none", NULL), CFG_NO_SUCH_OBJECT);
     assert_constraints(f->handle, none);
 }
 

@@ -10,11 +10,6 @@
 
 #define BASE "cn=Configuration"
 
-static int search_base(CfgHandle *handle, const char *base) {
-    CfgMessage *result = NULL;
-    return cfg_search_s(handle, base, CFG_SCOPE_BASE, NULL, NULL, 0, &result);
-}
-
 static void a_null_handle_gives_null(void **state) {
     (void)state;
     assert_null(cfg_get_file_name(NULL));
@@ -166,7 +161,7 @@ static void a_missing_file_is_named(void **state) {
 static void a_failure_that_names_no_file_was_in_the_bound_one(void **state) {
     struct fixture *f = *state;
     cfg_set_option(f->handle, CFG_OPT_CONFIG_FILE, "/another.conf");
-    assert_int_equal(search_base(f->handle, "cn=none"), CFG_NO_SUCH_OBJECT);
+    assert_int_equal(search_below(f->handle, "cn=none", NULL), CFG_NO_SUCH_OBJECT);
     assert_null(strstr(cfg_dump_exception(f->handle), f->config));
     assert_text(cfg_get_file_name(f->handle), f->config);
 }

@@ -1,5 +1,6 @@
 /* Passwords are stored encoded, whoever brings them. */
 
+#include <stdio.h>
 #include <stdlib.h>
 #include <string.h>
 
@@ -8,19 +9,6 @@
 
 static int bind_with_password(CfgHandle *handle, const char *password) {
     return cfg_bind_s(handle, ADMINISTRATOR, password, CFG_AUTH_SIMPLE);
-}
-
-/* One modification with one value. */
-static int change(CfgHandle *handle, const char *dn, int operation, const char *attribute,
-                  const char *value) {
-    char name[64];
-    char *text = strdup(value);
-    char *values[] = {text, NULL};
-    LDAPMod mod = {operation, strcpy(name, attribute), {values}};
-    LDAPMod *mods[] = {&mod, NULL};
-    const int code = cfg_modify_s(handle, dn, mods);
-    free(text);
-    return code;
 }
 
 static char *repeated(char letter, size_t count) {
@@ -90,7 +78,7 @@ static void an_encoded_password_is_stored_as_it_comes(void **state) {
     struct fixture *f = *state;
     load_lines(f, "cn: A\n");
     for (size_t i = 0; i < LENGTH(rows); ++i) {
-        assert_int_equal(change(f->handle, A, LDAP_MOD_REPLACE, "oru-slapdPeerPW", rows[i]),
+        assert_int_equal(modify_one(f->handle, A, LDAP_MOD_REPLACE, "oru-slapdPeerPW", rows[i]),
                          CFG_SUCCESS);
         char *value = stored(f, "oru-slapdPeerPW");
         assert_string_equal(value, rows[i]);
@@ -139,21 +127,36 @@ static void a_stored_password_that_can_not_be_decoded_can_only_be_replaced(void 
     assert_lines(f, "cn: A\n");
 }
 
+static void a_comparison_that_fails_is_reported_with_attribute_type_and_new_value(void **state) {
+    struct fixture *f = *state;
+    load_lines(f, "cn: A\noru-slapdPeerPW: {SSHA}c2VjcmV0\n");
+    assert_int_equal(modify(f->handle, A, "add oru-slapdPeerPW=secret"), CFG_DECODING_ERROR);
+    assert_string_equal(cfg_get_entry(f->handle), A);
+    assert_string_equal(cfg_get_attribute(f->handle), "oru-slapdPeerPW");
+    assert_int_equal(cfg_get_is_single(f->handle), 1);
+    assert_int_equal(cfg_get_minimum(f->handle), 1);
+    assert_int_equal(cfg_get_maximum(f->handle), 1024);
+    assert_report_has(f->handle, CFG_DECODING_ERROR, "\nConstraints for oru-slapdPeerPW\n");
+    assert_int_equal(strncmp(cfg_get_value(f->handle), "{iMASK}>", 8), 0);
+}
+
 static void the_length_of_a_password_is_bounded(void **state) {
     struct fixture *f = *state;
     char *longest = repeated('x', 1024);
     char *too_long = repeated('x', 1025);
     load_lines(f, "cn: A\n");
-    assert_int_equal(change(f->handle, A, LDAP_MOD_ADD, "oru-slapdPeerPW", too_long),
+    assert_int_equal(modify_one(f->handle, A, LDAP_MOD_ADD, "oru-slapdPeerPW", too_long),
                      CFG_INVALID_SYNTAX);
     assert_int_equal(cfg_get_exterror(f->handle), 1018);
     assert_report_has(f->handle, 21, "Password length must be 1 to 1024 characters");
     assert_string_equal(cfg_get_value(f->handle), too_long);
-    assert_int_equal(change(f->handle, A, LDAP_MOD_ADD, "oru-slapdPeerPW", ""), CFG_INVALID_SYNTAX);
+    assert_int_equal(modify_one(f->handle, A, LDAP_MOD_ADD, "oru-slapdPeerPW", ""),
+                     CFG_INVALID_SYNTAX);
     assert_int_equal(cfg_get_exterror(f->handle), 1018);
     assert_lines(f, "cn: A\n");
-    assert_int_equal(change(f->handle, A, LDAP_MOD_ADD, "oru-slapdPeerPW", longest), CFG_SUCCESS);
-    assert_int_equal(change(f->handle, A, LDAP_MOD_DELETE, "oru-slapdPeerPW", longest),
+    assert_int_equal(modify_one(f->handle, A, LDAP_MOD_ADD, "oru-slapdPeerPW", longest),
+                     CFG_SUCCESS);
+    assert_int_equal(modify_one(f->handle, A, LDAP_MOD_DELETE, "oru-slapdPeerPW", longest),
                      CFG_SUCCESS);
     assert_lines(f, "cn: A\n");
     free(longest);
@@ -177,7 +180,7 @@ static void a_password_that_is_too_long_when_encoded_gives_83(void **state) {
     struct fixture *f = *state;
     char *clear = random_letters(1020);
     load_lines(f, "cn: A\n");
-    assert_int_equal(change(f->handle, A, LDAP_MOD_ADD, "oru-slapdPeerPW", clear), 83);
+    assert_int_equal(modify_one(f->handle, A, LDAP_MOD_ADD, "oru-slapdPeerPW", clear), 83);
     assert_int_equal(cfg_get_exterror(f->handle), 1000);
     assert_report_has(f->handle, 83, "format_password();");
     assert_lines(f, "cn: A\n");
@@ -208,6 +211,58 @@ static void the_backup_has_the_password_of_before(void **state) {
     free(backup);
 }
 
+/* ---- a key that is set after the bind ---- */
+
+static void encode(char *out, size_t size, struct aes_key_data *key, const char *clear) {
+    assert_int_equal(format_password(CFG32_PASSWORD_SELECTOR, CFG32_PASSWORD_FLAG, key, clear,
+                                     (int)strlen(clear), out, (int)size),
+                     1);
+}
+
+/* What a search that asks for the supplier's password gives. */
+static int search_password(CfgHandle *handle, CfgMessage **result) {
+    char name[] = "oru-slapdMasterPW";
+    char *wanted[] = {name, NULL};
+    return cfg_search_s(handle, A, CFG_SCOPE_BASE, "cn=*", wanted, 0, result);
+}
+
+static void assert_decodable(CfgHandle *handle, int is_decodable) {
+    CfgMessage *result = NULL;
+    assert_int_equal(search_password(handle, &result),
+                     is_decodable ? CFG_SUCCESS : CFG_DECODING_ERROR);
+    if (is_decodable) {
+        assert_values(handle, result, "oru-slapdMasterPW", "open sesame");
+    }
+    cfg_msgfree(result);
+}
+
+static void searches_use_a_new_key_at_once_and_changes_from_the_next_bind_on(void **state) {
+    static const unsigned char bytes[32] = {7};
+    struct fixture *f = *state;
+    struct aes_key_data *key = aes_key_data_from_bytes(bytes, sizeof bytes);
+    char stored_password[512];
+    char lines[1024];
+    encode(stored_password, sizeof stored_password, key, "open sesame");
+    snprintf(lines, sizeof lines, "cn: A\noru-slapdMasterPW: %s\n", stored_password);
+    for (int is_bound_with_key = 0; is_bound_with_key <= 1; ++is_bound_with_key) {
+        struct aes_key_data *const bound = is_bound_with_key ? key : NULL;
+        struct aes_key_data *const later = is_bound_with_key ? NULL : key;
+        cfg_set_option(f->handle, CFG_OPT_KEY_DATA, bound);
+        load_lines(f, lines);
+        assert_decodable(f->handle, bound != NULL);
+        cfg_set_option(f->handle, CFG_OPT_KEY_DATA, later);
+        assert_decodable(f->handle, later != NULL);
+        must_modify(f->handle, A, "replace oru-slapdPeerPW=secret");
+        assert_stored_as(f, "oru-slapdPeerPW", bound ? "{AES256}" : "{iMASK}>");
+        assert_int_equal(bind_administrator(f->handle), CFG_SUCCESS);
+        must_modify(f->handle, A, "replace oru-slapdPeerPW=secret");
+        assert_stored_as(f, "oru-slapdPeerPW", later ? "{AES256}" : "{iMASK}>");
+    }
+    cfg_unbind(f->handle);
+    f->handle = NULL;
+    aes_key_data_free(key);
+}
+
 int main(void) {
     const struct CMUnitTest tests[] = {
         CREATED(the_administrators_new_password_is_stored_encoded_and_lets_in),
@@ -216,10 +271,12 @@ int main(void) {
         CREATED(the_same_password_again_is_no_second_value),
         CREATED(a_password_is_deleted_by_its_clear_text),
         CREATED(a_stored_password_that_can_not_be_decoded_can_only_be_replaced),
+        CREATED(a_comparison_that_fails_is_reported_with_attribute_type_and_new_value),
         CREATED(the_length_of_a_password_is_bounded),
         CREATED(a_password_that_is_too_long_when_encoded_gives_83),
         CREATED(clear_passwords_of_the_file_are_encoded_by_the_first_change),
         CREATED(the_backup_has_the_password_of_before),
+        CREATED(searches_use_a_new_key_at_once_and_changes_from_the_next_bind_on),
     };
     return cmocka_run_group_tests_name("cfg_modify_s_passwords", tests, NULL, NULL);
 }

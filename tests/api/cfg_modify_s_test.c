@@ -1,3 +1,5 @@
+/* cfg_modify_s makes its modifications in their order; see update_calls_test.c. */
+
 #include <stdlib.h>
 #include <string.h>
 
@@ -259,6 +261,18 @@ static void modifications_before_the_refused_one_stay_and_those_after_it_are_not
     assert_lines(f, "cn: A\nnote: a\nnote: b\nzeta: z\n");
 }
 
+static void values_deleted_before_a_refused_one_are_gone_in_memory_alone(void **state) {
+    static const char lines[] = "cn: A\noru-slapdSuffix: o=A\noru-slapdSuffix: o=B\n";
+    struct fixture *f = *state;
+    load_lines(f, lines);
+    assert_int_equal(modify(f->handle, A, "delete oru-slapdSuffix=o=A|="), CFG_INVALID_DN_SYNTAX);
+    assert_lines(f, lines);
+    assert_lines_in_memory(f->handle, A, "cn: A\noru-slapdSuffix: o=B\n");
+    /* The next change writes that. */
+    must_modify(f->handle, A, "add zeta=z");
+    assert_lines(f, "cn: A\noru-slapdSuffix: o=B\nzeta: z\n");
+}
+
 static void what_was_not_written_is_dropped_by_unbinding(void **state) {
     struct fixture *f = *state;
     load_lines(f, "cn: A\nnote: a\n");
@@ -294,6 +308,7 @@ int main(void) {
         CREATED(an_entry_that_is_not_there_gives_32),
         CREATED(the_report_names_the_entry_in_its_canonical_form),
         CREATED(modifications_before_the_refused_one_stay_and_those_after_it_are_not_made),
+        CREATED(values_deleted_before_a_refused_one_are_gone_in_memory_alone),
         CREATED(what_was_not_written_is_dropped_by_unbinding),
         CREATED(what_was_not_written_is_dropped_when_the_file_has_changed),
     };

@@ -1,5 +1,8 @@
 /* Which values a modification may bring. */
 
+#include <stdlib.h>
+#include <string.h>
+
 #include "changes.h"
 
 struct row {
@@ -83,6 +86,33 @@ static void the_value_that_is_there_is_no_second_one(void **state) {
         load_lines(f, rows[i].lines);
         must_modify(f->handle, A, rows[i].mods);
         assert_lines(f, rows[i].lines);
+    }
+}
+
+/* Its canonical form would read back as another name, which counts only once it was read. */
+static void a_name_of_several_pairs_that_is_there_is_no_second_value(void **state) {
+    static const struct {
+        const char *attribute;
+        const char *mods;
+    } rows[] = {
+        {"oru-slapdMasterDN", "add oru-slapdMasterDN=cn=x+ou=y"},
+        {"oru-slapdMasterDN", "add oru-slapdMasterDN=cn=x+ou=y|CN=X+OU=Y"},
+        {"oru-slapdSuffix", "add oru-slapdSuffix=cn=x+ou=y"},
+        {"oru-slapdSuffix", "add oru-slapdSuffix=cn=x+ou=y|CN=X+OU=Y"},
+    };
+    struct fixture *f = *state;
+    for (size_t i = 0; i < LENGTH(rows); ++i) {
+        load_lines(f, "cn: A\n");
+        must_modify(f->handle, A, rows[i].mods);
+        char *once = read_file(f->config);
+        must_modify(f->handle, A, rows[i].mods);
+        assert_file(f->config, once);
+        free(once);
+        CfgMessage *entry = found(f->handle, A, CFG_SCOPE_BASE, "cn=*", NULL);
+        char **values = cfg_get_values(f->handle, entry, rows[i].attribute);
+        assert_int_equal(cfg_count_values(values), 1);
+        cfg_value_free(values);
+        cfg_msgfree(entry);
     }
 }
 
@@ -204,6 +234,19 @@ static void an_attribute_without_values_is_deleted_whatever_values_are_named(voi
     }
 }
 
+static void an_attribute_that_was_emptied_takes_one_value_but_not_two(void **state) {
+    static const struct refusal expected = {19, 1006, SECOND, "oru-slapdPort", "2"};
+    struct fixture *f = *state;
+    load_lines(f, "cn: A\noru-slapdPort: 389\n");
+    assert_int_equal(modify(f->handle, A, "replace oru-slapdPort=many"), CFG_INVALID_SYNTAX);
+    assert_int_equal(modify(f->handle, A, "add oru-slapdPort=1|2"), CFG_CONSTRAINT_VIOLATION);
+    assert_refused(f, A, &expected);
+    assert_lines_in_memory(f->handle, A, "cn: A\noru-slapdPort\n");
+    assert_lines(f, "cn: A\noru-slapdPort: 389\n");
+    must_modify(f->handle, A, "add oru-slapdPort=1");
+    assert_lines(f, "cn: A\noru-slapdPort: 1\n");
+}
+
 /* ---- what would not read back ---- */
 
 #define NOT_READABLE "Attribute would not read back as it is written"
@@ -306,11 +349,52 @@ static void what_no_file_has_above_its_entries_is_refused(void **state) {
     }
 }
 
+/* The text above the administrator's entry. */
+static void assert_lines_above_all_entries(const struct fixture *f, const char *expected) {
+    char *text = read_file(f->config);
+    char *end = strstr(text, "\ndn: " TOP "\n");
+    assert_non_null(end);
+    *end = '\0';
+    assert_string_equal(text, expected);
+    free(text);
+}
+
+static void one_of_them_is_refused_by_the_modification_that_brings_it(void **state) {
+    static const struct refusal expected = {21, 1005, NOT_READABLE, "note", "x"};
+    struct fixture *f = *state;
+    load_lines(f, "cn: A\n");
+    assert_int_equal(
+        modify(f->handle, "", "replace charset=ISO-8859-1; add note=x; replace charset=US-ASCII"),
+        CFG_INVALID_SYNTAX);
+    assert_refused(f, "", &expected);
+    assert_lines(f, "cn: A\n");
+    /* The modification before it was made, and those after it were not. */
+    must_modify(f->handle, A, "add note=n");
+    assert_lines_above_all_entries(f, "charset: ISO-8859-1\nversion: 1\n");
+}
+
+static void a_refused_version_leaves_none_and_hinders_no_later_change(void **state) {
+    static const struct refusal expected = {21, 1015, OUT_OF_RANGE, "version", "2"};
+    struct fixture *f = *state;
+    load_lines(f, "cn: A\n");
+    assert_int_equal(modify(f->handle, "", "replace version=2"), CFG_INVALID_SYNTAX);
+    assert_refused(f, "", &expected);
+    assert_lines(f, "cn: A\n");
+    must_modify(f->handle, A, "add note=n");
+    assert_lines_above_all_entries(f, "charset: UTF-8\n");
+    assert_lines_in_memory(f->handle, A, "cn: A\nnote: n\n");
+    /* The file can be loaded without one. */
+    assert_int_equal(bind_administrator(f->handle), CFG_SUCCESS);
+    must_modify(f->handle, A, "delete note");
+    assert_lines_in_memory(f->handle, A, "cn: A\n");
+}
+
 int main(void) {
     const struct CMUnitTest tests[] = {
         CREATED(a_second_value_of_a_single_valued_attribute_is_refused),
         CREATED(the_report_of_a_second_value_has_the_constraint),
         CREATED(the_value_that_is_there_is_no_second_one),
+        CREATED(a_name_of_several_pairs_that_is_there_is_no_second_value),
         CREATED(a_single_value_may_go_before_another_comes),
         CREATED(a_file_with_two_values_of_a_single_valued_attribute_keeps_them),
         CREATED(an_added_value_that_its_syntax_refuses_changes_nothing),
@@ -318,11 +402,14 @@ int main(void) {
         CREATED(
             a_replacement_that_its_syntax_refuses_leaves_the_attribute_without_values_in_memory),
         CREATED(an_attribute_without_values_is_deleted_whatever_values_are_named),
+        CREATED(an_attribute_that_was_emptied_takes_one_value_but_not_two),
         CREATED(a_name_or_value_that_would_not_read_back_is_refused_and_forgotten),
         CREATED(names_and_values_that_do_read_back_are_taken),
         CREATED(a_value_that_begins_with_a_colon_reads_back),
         CREATED(text_of_another_character_set_is_refused),
         CREATED(what_no_file_has_above_its_entries_is_refused),
+        CREATED(one_of_them_is_refused_by_the_modification_that_brings_it),
+        CREATED(a_refused_version_leaves_none_and_hinders_no_later_change),
     };
     return cmocka_run_group_tests_name("cfg_modify_s_values", tests, NULL, NULL);
 }

@@ -1,3 +1,5 @@
+/* cfg_tree_view draws every entry, and those that are missing above one. */
+
 #include <stdlib.h>
 #include <string.h>
 
@@ -84,11 +86,6 @@ static const char boxed_gaps[] = "\n" DASH
 /* An entry that can be loaded, but has no DN that could be printed. */
 static const char unprintable[] =
     CONFIGURATION_HEAD "\ndn: cn=\"\", cn=Configuration\nobjectclass: top\n";
-
-static int fail_to_find(CfgHandle *handle) {
-    CfgMessage *result = NULL;
-    return cfg_search_s(handle, "cn=none", CFG_SCOPE_BASE, NULL, NULL, 0, &result);
-}
 
 /* ---- the drawing ---- */
 
@@ -225,7 +222,7 @@ static void the_next_call_that_resets_forgets_the_text(void **state) {
     assert_text(cfg_tree_view(f->handle, CFG_TREE_ASCII), plain_standard_tree);
     assert_int_equal(search_all(f->handle), CFG_SUCCESS);
     assert_text(cfg_tree_view(f->handle, CFG_TREE_CP437), boxed_standard_tree);
-    assert_int_equal(fail_to_find(f->handle), CFG_NO_SUCH_OBJECT);
+    assert_int_equal(search_below(f->handle, "cn=none", NULL), CFG_NO_SUCH_OBJECT);
     assert_text(cfg_tree_view(f->handle, CFG_TREE_ASCII), plain_standard_tree);
     assert_int_equal(bind_administrator(f->handle), CFG_SUCCESS);
     assert_text(cfg_tree_view(f->handle, CFG_TREE_CP437), boxed_standard_tree);
@@ -236,7 +233,7 @@ static void the_next_call_that_resets_forgets_the_text(void **state) {
 static void the_calls_that_reset_nothing_keep_the_text(void **state) {
     struct fixture *f = *state;
     int flag = 0;
-    assert_int_equal(fail_to_find(f->handle), CFG_NO_SUCH_OBJECT);
+    assert_int_equal(search_below(f->handle, "cn=none", NULL), CFG_NO_SUCH_OBJECT);
     const char *tree = cfg_tree_view(f->handle, CFG_TREE_ASCII);
     cfg_get_errno(f->handle);
     cfg_get_exterror(f->handle);

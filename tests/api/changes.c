@@ -298,6 +298,31 @@ void must_succeed(CfgHandle *handle, const struct update_call *call) {
     assert_no_report(handle, CFG_SUCCESS);
 }
 
+void must_change(const struct fixture *f, const struct update_call *call) {
+    must_succeed(f->handle, call);
+    assert_entries(f, call->after);
+}
+
+void must_fail(const struct fixture *f, const struct update_call *call, int code, int extended,
+               const char *message, int error) {
+    char expected[512];
+    if (call->run(f->handle) != code) {
+        fail_msg("%s: %d %s", call->name, cfg_get_errno(f->handle), cfg_dump_exception(f->handle));
+    }
+    assert_int_equal(cfg_get_exterror(f->handle), extended);
+    assert_string_equal(cfg_get_file_name(f->handle), f->config);
+    snprintf(expected, sizeof expected, "\nmsg     %s", message);
+    assert_report_has(f->handle, code, expected);
+    snprintf(expected, sizeof expected, "\nerrno %d: ", error);
+    assert_report_has(f->handle, code, expected);
+}
+
+char *set_backup(const struct fixture *f, const char *name) {
+    char *backup = path_of(f, name);
+    assert_int_equal(cfg_set_option(f->handle, CFG_OPT_BACKUP_FILE, backup), CFG_SUCCESS);
+    return backup;
+}
+
 CfgHandle *second_handle(const struct fixture *f) {
     CfgHandle *handle = cfg_init();
     assert_int_equal(cfg_set_option(handle, CFG_OPT_CONFIG_FILE, f->config), CFG_SUCCESS);

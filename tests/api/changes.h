@@ -84,6 +84,14 @@ extern const struct update_call update_calls[4];
 /** Makes the call, which must succeed. */
 void must_succeed(CfgHandle *handle, const struct update_call *call);
 
+/** The same; the configuration file has then what the call leaves. */
+void must_change(const struct fixture *f, const struct update_call *call);
+/** Makes the call, which must fail like this. */
+void must_fail(const struct fixture *f, const struct update_call *call, int code, int extended,
+               const char *message, int error);
+
+/** Names a file of the folder as the backup, from the next bind on; its path, to be freed. */
+char *set_backup(const struct fixture *f, const char *name);
 /** Another handle for the fixture's file, bound as administrator. */
 CfgHandle *second_handle(const struct fixture *f);
 

@@ -157,13 +157,16 @@ CfgMessage *found(CfgHandle *handle, const char *base, int scope, const char *fi
     return result;
 }
 
-int search_all(CfgHandle *handle) {
+int search_below(CfgHandle *handle, const char *base, const char *filter) {
     CfgMessage *result = NULL;
-    const int code = cfg_search_s(handle, "cn=Configuration", CFG_SCOPE_SUBTREE, "objectclass=*",
-                                  NULL, 0, &result);
+    const int code = cfg_search_s(handle, base, CFG_SCOPE_SUBTREE, filter, NULL, 0, &result);
     assert_true(code == CFG_SUCCESS || !result);
     cfg_msgfree(result);
     return code;
+}
+
+int search_all(CfgHandle *handle) {
+    return search_below(handle, "cn=Configuration", "objectclass=*");
 }
 
 int modify_one(CfgHandle *handle, const char *dn, int operation, const char *name,

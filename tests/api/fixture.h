@@ -79,7 +79,9 @@ int bind_administrator(CfgHandle *handle);
 void load(const struct fixture *f, const char *text);
 /** A search that must succeed. */
 CfgMessage *found(CfgHandle *handle, const char *base, int scope, const char *filter, char **attrs);
-/** The result code of a subtree search of the whole configuration. */
+/** The result code of a subtree search; what it finds is freed. */
+int search_below(CfgHandle *handle, const char *base, const char *filter);
+/** The same of the whole configuration. */
 int search_all(CfgHandle *handle);
 /** cfg_modify_s with one modification, of one value; a null value is none. */
 int modify_one(CfgHandle *handle, const char *dn, int operation, const char *name,

@@ -122,8 +122,7 @@ static void no_other_file_is_left_behind(void **state) {
 
 static void the_backup_is_the_file_of_before(void **state) {
     struct fixture *f = *state;
-    char *backup = path_of(f, "backup.conf");
-    cfg_set_option(f->handle, CFG_OPT_BACKUP_FILE, backup);
+    char *backup = set_backup(f, "backup.conf");
     FOR_EACH_UPDATE_CALL(call) {
         struct stat status;
         load_entries(f, update_entries);
@@ -166,19 +165,6 @@ static void the_backup_name_counts_from_the_next_bind_on(void **state) {
     assert_int_equal(bind_administrator(f->handle), CFG_SUCCESS);
     assert_int_equal(cfg_flush_s(f->handle), CFG_SUCCESS);
     assert_true(file_exists(backup));
-    free(backup);
-}
-
-static void a_refused_change_makes_no_backup(void **state) {
-    struct fixture *f = *state;
-    char *backup = path_of(f, "backup.conf");
-    cfg_set_option(f->handle, CFG_OPT_BACKUP_FILE, backup);
-    load_entries(f, update_entries);
-    assert_int_equal(modify(f->handle, A, "delete none"), CFG_NO_SUCH_ATTRIBUTE);
-    assert_int_equal(add(f->handle, "cn=New, " TOP, "add cn=a|b"), CFG_CONSTRAINT_VIOLATION);
-    assert_int_equal(cfg_delete_s(f->handle, "cn=None"), CFG_NO_SUCH_OBJECT);
-    assert_false(file_exists(backup));
-    assert_entries(f, update_entries);
     free(backup);
 }
 
@@ -294,80 +280,6 @@ static void an_anonymous_bind_may_change_the_file_too(void **state) {
     }
 }
 
-/* ---- the entry's name ---- */
-
-static int modify_nothing(CfgHandle *handle, const char *dn) {
-    return cfg_modify_s(handle, dn, NULL);
-}
-static int modify_note(CfgHandle *handle, const char *dn) {
-    return modify(handle, dn, "replace note=x");
-}
-static int add_nothing(CfgHandle *handle, const char *dn) { return cfg_add_s(handle, dn, NULL); }
-
-static int (*const entry_calls[])(CfgHandle *, const char *) = {modify_note, modify_nothing,
-                                                                add_nothing, cfg_delete_s};
-
-static void a_null_name_gives_89_without_a_report(void **state) {
-    struct fixture *f = *state;
-    load_entries(f, update_entries);
-    for (size_t i = 0; i < LENGTH(entry_calls); ++i) {
-        assert_int_equal(entry_calls[i](f->handle, NULL), CFG_PARAM_ERROR);
-        assert_no_report(f->handle, CFG_PARAM_ERROR);
-    }
-    assert_entries(f, update_entries);
-}
-
-static void a_malformed_name_gives_34(void **state) {
-    static const struct {
-        const char *dn;
-        int extended;
-        const char *message;
-    } rows[] = {
-        {"=x", 1012, "Invalid attribute sytax: "},
-        {"cn", 1013, "Missing RDN value: cn"},
-        {"cn=a\\", 1014, "Invalid escape sequence: \\"},
-        {"cn=a,", 1011, "Missing RDN attribute"},
-        {"cn=a=b", 1014, "Invalid character in RDN value: ="},
-    };
-    struct fixture *f = *state;
-    load_entries(f, update_entries);
-    for (size_t call = 0; call < LENGTH(entry_calls); ++call) {
-        for (size_t i = 0; i < LENGTH(rows); ++i) {
-            assert_int_equal(entry_calls[call](f->handle, rows[i].dn), 34);
-            assert_int_equal(cfg_get_exterror(f->handle), rows[i].extended);
-            assert_report_has(f->handle, 34, rows[i].message);
-        }
-    }
-    assert_entries(f, update_entries);
-}
-
-static void a_name_of_another_character_set_gives_162(void **state) {
-    REQUIRE_UTF8();
-    struct fixture *f = *state;
-    load_entries(f, update_entries);
-    for (size_t call = 0; call < LENGTH(entry_calls); ++call) {
-        assert_int_equal(entry_calls[call](f->handle, "cn=\xff"), 162);
-        assert_non_null(cfg_dump_exception(f->handle));
-    }
-    assert_entries(f, update_entries);
-}
-
-static void an_entry_is_found_by_every_form_of_its_name(void **state) {
-    static const char *const rows[] = {A, "CN=a,CN=CONFIGURATION", " cn = A;cn=Configuration",
-                                       "cn=\"A\", cn=#436F6E66696775726174696F6E",
-                                       "cn=\\41, cn=Configuration"};
-    struct fixture *f = *state;
-    for (size_t i = 0; i < LENGTH(rows); ++i) {
-        load_lines(f, "note: old\n");
-        assert_int_equal(modify(f->handle, rows[i], "replace note=new"), CFG_SUCCESS);
-        assert_lines(f, "note: new\n");
-        assert_int_equal(add(f->handle, rows[i], "add note=more"), CFG_SUCCESS);
-        assert_lines(f, "note: new\nnote: more\n");
-        assert_int_equal(cfg_delete_s(f->handle, rows[i]), CFG_SUCCESS);
-        assert_entries(f, "");
-    }
-}
-
 int main(void) {
     const struct CMUnitTest tests[] = {
         cmocka_unit_test(a_null_handle_gives_89),
@@ -380,7 +292,6 @@ int main(void) {
         CREATED(the_backup_is_the_file_of_before),
         CREATED(each_call_backs_up_what_the_one_before_wrote),
         CREATED(the_backup_name_counts_from_the_next_bind_on),
-        CREATED(a_refused_change_makes_no_backup),
         CREATED(what_another_handle_wrote_is_taken_in),
         CREATED(what_an_editor_wrote_is_taken_in),
         CREATED(what_a_call_wrote_is_not_read_again),
@@ -388,10 +299,6 @@ int main(void) {
         CREATED(a_file_that_can_not_be_read_again_gives_the_loaders_code),
         CREATED(a_success_clears_the_failure_of_before),
         CREATED(an_anonymous_bind_may_change_the_file_too),
-        CREATED(a_null_name_gives_89_without_a_report),
-        CREATED(a_malformed_name_gives_34),
-        CREATED(a_name_of_another_character_set_gives_162),
-        CREATED(an_entry_is_found_by_every_form_of_its_name),
     };
     return cmocka_run_group_tests_name("update_calls", tests, NULL, NULL);
 }

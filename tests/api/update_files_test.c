@@ -1,10 +1,10 @@
-/* The calls that change the configuration, and files as they come in life. */
+/* The calls that change the configuration, and files as they come in life: links, other files in
+ * the place of the one that was bound, and no room for more. */
 
 #include <errno.h>
 #include <fcntl.h>
 #include <stdio.h>
 #include <stdlib.h>
-#include <string.h>
 #include <sys/resource.h>
 #include <sys/stat.h>
 #include <unistd.h>
@@ -12,219 +12,6 @@
 #include "changes.h"
 
 enum { nobody = 65534 };
-
-static int is_root;
-
-/* Permissions mean nothing to root: from here on the process is nobody, and owns the files. Skips
- * the test where that is not possible. */
-static void become_nobody(const struct fixture *f) {
-    if (!is_root) {
-        return;
-    }
-    if (chown(f->folder, nobody, nobody) != 0 || chown(f->config, nobody, nobody) != 0 ||
-        setegid(nobody) != 0 || seteuid(nobody) != 0 || access(f->folder, X_OK) != 0) {
-        skip();
-    }
-}
-
-static void become_root(void) {
-    if (is_root) {
-        assert_int_equal(seteuid(0), 0);
-        assert_int_equal(setegid(0), 0);
-    }
-}
-
-static int tear_down_as_root(void **state) {
-    const struct fixture *f = *state;
-    become_root();
-    chmod(f->folder, 0700);
-    return tear_down(state);
-}
-
-#define AS_NOBODY(test) cmocka_unit_test_setup_teardown(test, set_up, tear_down_as_root)
-
-/* ---- expectations ---- */
-
-static void must_change(const struct fixture *f, const struct update_call *call) {
-    must_succeed(f->handle, call);
-    assert_entries(f, call->after);
-}
-
-/* The call fails like this: the message is followed by the file's name in quotes, if it is one of
- * those. */
-static void must_fail(const struct fixture *f, const struct update_call *call, int code,
-                      int extended, const char *message, int error) {
-    char expected[512];
-    if (call->run(f->handle) != code) {
-        fail_msg("%s: %d %s", call->name, cfg_get_errno(f->handle), cfg_dump_exception(f->handle));
-    }
-    assert_int_equal(cfg_get_exterror(f->handle), extended);
-    assert_string_equal(cfg_get_file_name(f->handle), f->config);
-    snprintf(expected, sizeof expected, "\nmsg     %s", message);
-    assert_report_has(f->handle, code, expected);
-    snprintf(expected, sizeof expected, "\nerrno %d: ", error);
-    assert_report_has(f->handle, code, expected);
-}
-
-static char *quoted_message(const struct fixture *f, const char *text, const char *end) {
-    const size_t size = strlen(text) + strlen(f->config) + strlen(end) + 3;
-    char *message = malloc(size);
-    assert_non_null(message);
-    snprintf(message, size, "%s\"%s\"%s", text, f->config, end);
-    return message;
-}
-
-static void must_not_be_backed_up(const struct fixture *f, const struct update_call *call,
-                                  int error) {
-    char *message = quoted_message(f, "Unable to backup the configuration file: ", " \n");
-    must_fail(f, call, CFG_INSUFFICIENT_ACCESS, 1004, message, error);
-    assert_entries(f, update_entries);
-    free(message);
-}
-
-static void must_not_be_opened(const struct fixture *f, const struct update_call *call) {
-    char *message = quoted_message(f, "Unable to open: ", "\n");
-    must_fail(f, call, CFG_INSUFFICIENT_ACCESS, 1004, message, EACCES);
-    free(message);
-}
-
-/* The failed change is still in the handle; once the obstacle is gone, the next call writes it. */
-static void must_be_written_now(const struct fixture *f, const struct update_call *call) {
-    assert_int_equal(cfg_flush_s(f->handle), CFG_SUCCESS);
-    assert_entries(f, call->after);
-}
-
-static char *set_backup(const struct fixture *f, const char *name) {
-    char *backup = path_of(f, name);
-    assert_int_equal(cfg_set_option(f->handle, CFG_OPT_BACKUP_FILE, backup), CFG_SUCCESS);
-    return backup;
-}
-
-/* ---- permissions ---- */
-
-static void a_file_that_may_not_be_written_gives_50_and_stays(void **state) {
-    struct fixture *f = *state;
-    become_nobody(f);
-    FOR_EACH_UPDATE_CALL(call) {
-        load_entries(f, update_entries);
-        assert_int_equal(chmod(f->config, 0444), 0);
-        must_not_be_opened(f, call);
-        assert_entries(f, update_entries);
-        assert_int_equal(chmod(f->config, 0644), 0);
-        must_be_written_now(f, call);
-    }
-}
-
-static void its_backup_is_made_nevertheless(void **state) {
-    struct fixture *f = *state;
-    become_nobody(f);
-    char *backup = set_backup(f, "backup.conf");
-    char *expected = configuration_of(update_entries);
-    FOR_EACH_UPDATE_CALL(call) {
-        load_entries(f, update_entries);
-        assert_int_equal(chmod(f->config, 0444), 0);
-        must_not_be_opened(f, call);
-        assert_entries(f, update_entries);
-        assert_file(backup, expected);
-        assert_int_equal(remove(backup), 0);
-        assert_int_equal(chmod(f->config, 0644), 0);
-    }
-    free(expected);
-    free(backup);
-}
-
-static void a_file_without_any_permission_gives_50_and_stays(void **state) {
-    struct fixture *f = *state;
-    become_nobody(f);
-    FOR_EACH_UPDATE_CALL(call) {
-        load_entries(f, update_entries);
-        assert_int_equal(chmod(f->config, 0), 0);
-        must_not_be_opened(f, call);
-        assert_int_equal(chmod(f->config, 0644), 0);
-        assert_entries(f, update_entries);
-        must_be_written_now(f, call);
-    }
-}
-
-static void a_changed_file_that_may_not_be_read_gives_91_and_stays(void **state) {
-    struct fixture *f = *state;
-    become_nobody(f);
-    FOR_EACH_UPDATE_CALL(call) {
-        load_entries(f, "");
-        write_entries(f, update_entries);
-        assert_int_equal(chmod(f->config, 0200), 0);
-        must_fail(f, call, CFG_CONNECT_ERROR, 1004, "ifstream()\n", EACCES);
-        assert_int_equal(chmod(f->config, 0600), 0);
-        assert_entries(f, update_entries);
-        must_change(f, call);
-    }
-}
-
-static void a_folder_that_may_not_be_written_is_no_obstacle_without_a_backup(void **state) {
-    struct fixture *f = *state;
-    become_nobody(f);
-    assert_int_equal(chmod(f->folder, 0555), 0);
-    FOR_EACH_UPDATE_CALL(call) {
-        load_entries(f, update_entries);
-        must_change(f, call);
-    }
-}
-
-static void a_folder_that_may_not_be_written_refuses_the_backup(void **state) {
-    struct fixture *f = *state;
-    become_nobody(f);
-    char *backup = set_backup(f, "backup.conf");
-    assert_int_equal(chmod(f->folder, 0555), 0);
-    FOR_EACH_UPDATE_CALL(call) {
-        load_entries(f, update_entries);
-        must_not_be_backed_up(f, call, EACCES);
-        assert_false(file_exists(backup));
-        assert_int_equal(chmod(f->folder, 0755), 0);
-        must_be_written_now(f, call);
-        assert_int_equal(remove(backup), 0);
-        assert_int_equal(chmod(f->folder, 0555), 0);
-    }
-    free(backup);
-}
-
-/* ---- backups ---- */
-
-static void a_backup_in_a_missing_folder_gives_50_and_the_file_stays(void **state) {
-    struct fixture *f = *state;
-    char *folder = path_of(f, "none");
-    char *backup = set_backup(f, "none/backup.conf");
-    FOR_EACH_UPDATE_CALL(call) {
-        load_entries(f, update_entries);
-        must_not_be_backed_up(f, call, ENOENT);
-        assert_int_equal(mkdir(folder, 0700), 0);
-        must_be_written_now(f, call);
-        assert_int_equal(remove(backup), 0);
-        assert_int_equal(rmdir(folder), 0);
-    }
-    free(backup);
-    free(folder);
-}
-
-static void a_folder_in_the_place_of_the_backup_gives_50_and_the_file_stays(void **state) {
-    struct fixture *f = *state;
-    char *backup = set_backup(f, "backup.conf");
-    assert_int_equal(mkdir(backup, 0700), 0);
-    FOR_EACH_UPDATE_CALL(call) {
-        load_entries(f, update_entries);
-        must_not_be_backed_up(f, call, EISDIR);
-    }
-    free(backup);
-}
-
-static void the_file_is_not_its_own_backup(void **state) {
-    struct fixture *f = *state;
-    char *backup = set_backup(f, "oruslapd.conf");
-    FOR_EACH_UPDATE_CALL(call) {
-        load_entries(f, update_entries);
-        must_not_be_backed_up(f, call, EINVAL);
-    }
-    free(backup);
-}
 
 /* ---- links ---- */
 
@@ -288,7 +75,7 @@ static void hard_links_owner_and_mode_stay(void **state) {
         char *text = configuration_of(call->after);
         load_entries(f, update_entries);
         assert_int_equal(chmod(f->config, 0664), 0);
-        assert_true(!is_root || chown(f->config, nobody, 0) == 0);
+        assert_true(geteuid() != 0 || chown(f->config, nobody, 0) == 0);
         assert_int_equal(stat(f->config, &before), 0);
         must_change(f, call);
         assert_int_equal(stat(f->config, &after), 0);
@@ -384,8 +171,8 @@ static void a_folder_or_fifo_in_its_place_gives_91_without_waiting(void **state)
 
 /* ---- no room ---- */
 
-static void a_file_that_may_not_grow_gives_80_and_stays(void **state) {
-    struct fixture *f = *state;
+/* Adds an entry while the file may not become longer than it is, which must fail. */
+static void add_without_room(const struct fixture *f) {
     struct rlimit unlimited;
     struct stat status;
     load_entries(f, update_entries);
@@ -393,29 +180,42 @@ static void a_file_that_may_not_grow_gives_80_and_stays(void **state) {
     assert_int_equal(getrlimit(RLIMIT_FSIZE, &unlimited), 0);
     const struct rlimit limit = {(rlim_t)status.st_size, unlimited.rlim_max};
     assert_int_equal(setrlimit(RLIMIT_FSIZE, &limit), 0);
-    const int code = add(f->handle, "cn=C, " TOP, "add note=c");
+    const int code = add(f->handle, "cn=C, " TOP, "add cn=C; add note=c");
     assert_int_equal(setrlimit(RLIMIT_FSIZE, &unlimited), 0);
     assert_int_equal(code, CFG_OTHER);
+}
+
+static void a_file_that_may_not_grow_gives_80_and_stays(void **state) {
+    struct fixture *f = *state;
+    add_without_room(f);
     assert_int_equal(cfg_get_exterror(f->handle), 1000);
     assert_report_has(f->handle, CFG_OTHER, "\nmsg     System error writing file\nerrno 27: ");
     assert_string_equal(cfg_get_file_name(f->handle), f->config);
     assert_entries(f, update_entries);
-    must_modify(f->handle, A, "replace note=new");
-    assert_entries(f, ENTRY("cn=A", "cn: A\nnote: new\n") ENTRY("cn=B", "cn: B\nnote: b\n")
-                          ENTRY("cn=C", "note: c\n"));
+}
+
+static const char with_the_entry[] = ENTRY("cn=A", "cn: A\nnote: old\n")
+    ENTRY("cn=B", "cn: B\nnote: b\n") ENTRY("cn=C", "cn: C\nnote: c\n");
+
+static void what_there_was_no_room_for_stays_in_memory_and_is_written_by_the_next_flush(
+    void **state) {
+    struct fixture *f = *state;
+    add_without_room(f);
+    assert_lines_in_memory(f->handle, "cn=C, " TOP, "cn: C\nnote: c\n");
+    assert_entries(f, update_entries);
+    assert_int_equal(cfg_flush_s(f->handle), CFG_SUCCESS);
+    assert_entries(f, with_the_entry);
+}
+
+static void what_there_was_no_room_for_is_written_by_the_next_change(void **state) {
+    struct fixture *f = *state;
+    add_without_room(f);
+    must_modify(f->handle, A, "replace note=old");
+    assert_entries(f, with_the_entry);
 }
 
 int main(void) {
     const struct CMUnitTest tests[] = {
-        AS_NOBODY(a_file_that_may_not_be_written_gives_50_and_stays),
-        AS_NOBODY(its_backup_is_made_nevertheless),
-        AS_NOBODY(a_file_without_any_permission_gives_50_and_stays),
-        AS_NOBODY(a_changed_file_that_may_not_be_read_gives_91_and_stays),
-        AS_NOBODY(a_folder_that_may_not_be_written_is_no_obstacle_without_a_backup),
-        AS_NOBODY(a_folder_that_may_not_be_written_refuses_the_backup),
-        CREATED(a_backup_in_a_missing_folder_gives_50_and_the_file_stays),
-        CREATED(a_folder_in_the_place_of_the_backup_gives_50_and_the_file_stays),
-        CREATED(the_file_is_not_its_own_backup),
         CREATED(a_symbolic_link_stays_and_its_file_is_changed),
         CREATED(a_link_to_another_file_is_followed_at_the_next_call),
         CREATED(hard_links_owner_and_mode_stay),
@@ -425,7 +225,8 @@ int main(void) {
         CREATED(a_link_that_leads_nowhere_gives_91_and_no_file_is_made),
         CREATED(a_folder_or_fifo_in_its_place_gives_91_without_waiting),
         CREATED(a_file_that_may_not_grow_gives_80_and_stays),
+        CREATED(what_there_was_no_room_for_stays_in_memory_and_is_written_by_the_next_flush),
+        CREATED(what_there_was_no_room_for_is_written_by_the_next_change),
     };
-    is_root = geteuid() == 0;
     return cmocka_run_group_tests_name("update_files", tests, NULL, NULL);
 }

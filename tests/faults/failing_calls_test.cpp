@@ -23,7 +23,7 @@ namespace {
 const int errors[] = {EIO, ENOSPC, EINTR, EDQUOT, EACCES, EMFILE, EOPNOTSUPP};
 
 /// The descriptors that are open in this process.
-std::set<std::string> open_descriptors() {
+std::set<std::string> descriptors_of_this_process() {
     std::set<std::string> names;
     for (const auto& file : std::filesystem::directory_iterator("/proc/self/fd")) {
         std::error_code ignored;
@@ -143,12 +143,12 @@ struct failing_calls : testing::TestWithParam<scenario> {
 TEST_P(failing_calls, AreToldAndLeaveACompleteVersionAndNothingElse) {
     for_each_fault([&](const fault& planned) {
         stage on(setting);
-        const auto descriptors = open_descriptors();
+        const auto descriptors = descriptors_of_this_process();
         const int code = on.play({planned});
         const std::string description = told("one fault", planned.error, on);
         expect_told(on, planned, code, description);
         expect_complete(on, planned, code, description);
-        EXPECT_EQ(open_descriptors(), descriptors) << description;
+        EXPECT_EQ(descriptors_of_this_process(), descriptors) << description;
         EXPECT_THAT(on.folder().other_files(), IsEmpty()) << description;
     });
 }

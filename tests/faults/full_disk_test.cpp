@@ -25,9 +25,9 @@ using testing::IsEmpty;
 
 namespace {
 
-const change growth = {
+const attribute_change growth = {
     LDAP_MOD_REPLACE, "cn=Configuration", "description", {std::string(60'000, 'D')}};
-const change shrinkage = {LDAP_MOD_REPLACE, "cn=Configuration", "description", {"short"}};
+const attribute_change shrinkage = {LDAP_MOD_REPLACE, "cn=Configuration", "description", {"short"}};
 
 std::string file_of_some_pages() {
     return as_written(configuration_head + "description: " + std::string(20'000, 'd') + "\n");

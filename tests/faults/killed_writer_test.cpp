@@ -30,7 +30,7 @@ std::string mark_of(unsigned long version) {
            std::string(20 + version * 977 % 3000, static_cast<char>('a' + version % 26));
 }
 
-change change_to(unsigned long version) {
+attribute_change change_to(unsigned long version) {
     return {LDAP_MOD_REPLACE, "cn=Configuration", "description", {mark_of(version)}};
 }
 

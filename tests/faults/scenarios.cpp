@@ -31,7 +31,7 @@ std::string configuration(const std::string& lines) {
     return text;
 }
 
-change replacement(const std::string& attribute, const std::string& value) {
+attribute_change replacement(const std::string& attribute, const std::string& value) {
     return {LDAP_MOD_REPLACE, front_end, attribute, {value}};
 }
 
@@ -52,7 +52,8 @@ const std::vector<scenario>& scenarios() {
         std::vector<scenario> made;
         const std::string whole = as_written(configuration(""));
         const std::string broken = configuration("oru-slapdIdleTimeOut: x\noru-slapdPort: many\n");
-        const change growth = replacement("description", description + std::string(3000, 'D'));
+        const attribute_change growth =
+            replacement("description", description + std::string(3000, 'D'));
         const std::vector<fault> without_reservation = {
             {0, effect::fails, EOPNOTSUPP, "fallocate"}};
         add_both(made, "growing", "growing_without_backup", {"", true, whole, growth, {}});

@@ -15,7 +15,7 @@ struct scenario {
     const char* name;
     bool has_backup;
     std::string before;                ///< what the file holds before the call
-    change what;                       ///< the call, which can be repeated
+    attribute_change what;             ///< the call, which can be repeated
     std::vector<fault> circumstances;  ///< faults that are there in any case
 };
 

@@ -34,8 +34,8 @@ session::~session() { cfg_unbind(handle_); }
 
 int session::bind() { return cfg_bind_s(handle_, "cn=root", "correct horse", CFG_AUTH_SIMPLE); }
 
-int session::modify(const change& what) {
-    change copy = what;  // the records take what they could change
+int session::modify(const attribute_change& what) {
+    attribute_change copy = what;  // the records take what they could change
     std::vector<char*> values;
     for (std::string& value : copy.values) {
         values.push_back(value.data());
@@ -94,7 +94,7 @@ std::string as_written(const std::string& text) {
     return folder.text();
 }
 
-std::string as_written_after(const std::string& text, const change& what) {
+std::string as_written_after(const std::string& text, const attribute_change& what) {
     const configuration_folder folder(text);
     session writer(folder.config());
     EXPECT_EQ(writer.bind(), CFG_SUCCESS) << writer.report();

@@ -14,7 +14,7 @@ namespace cfg32::tests {
 extern const std::string configuration_head;
 
 /// A modification of one attribute.
-struct change {
+struct attribute_change {
     int operation;
     std::string dn;
     std::string attribute;
@@ -31,7 +31,7 @@ class session {
 
     // Each returns what the library's call returned.
     int bind();
-    int modify(const change& what);
+    int modify(const attribute_change& what);
     int search(const std::string& base, const std::string& attribute,
                std::set<std::string>& values);
     int flush();
@@ -68,7 +68,7 @@ class configuration_folder {
 std::string as_written(const std::string& text);
 
 /// The text as the library writes it after a change.
-std::string as_written_after(const std::string& text, const change& what);
+std::string as_written_after(const std::string& text, const attribute_change& what);
 
 /// The number of a variable of the environment, or what is usual.
 unsigned long number_from_environment(const char* name, unsigned long usual);

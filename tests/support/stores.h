@@ -8,11 +8,13 @@
 #include <string>
 
 #include "LDIF_File.h"
+#include "dn_of.h"
 #include "temporary_folder.h"
 
 namespace cfg32::tests {
 
-inline LDIF_DN dn_of(const std::string& text) { return LDIF_DN(cisString(text)); }
+/// What a file begins with that a rewrite leaves as it is.
+inline const std::string store_head = "charset: x\nversion: 1\n\n";
 
 /// What the store would write now.
 inline std::string text_of(const LDIF_File& file) {

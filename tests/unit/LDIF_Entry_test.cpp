@@ -8,6 +8,7 @@
 #include <utility>
 #include <vector>
 
+#include "dn_of.h"
 #include "failures.h"
 #include "lines.h"
 
@@ -15,8 +16,6 @@ using namespace cfg32::tests;
 using testing::ElementsAre;
 
 namespace {
-
-LDIF_DN dn_of(const std::string& text) { return LDIF_DN(cisString(text)); }
 
 LDIF_Entry entry_of(const std::string& dn) { return LDIF_Entry(dn_of(dn)); }
 

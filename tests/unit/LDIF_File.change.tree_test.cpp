@@ -1,4 +1,4 @@
-// Adding and erasing entries.
+// Entries are added and erased where the rules of the tree put them, and are found again.
 
 #include <gmock/gmock.h>
 
@@ -23,12 +23,10 @@ using testing::IsEmpty;
 
 namespace {
 
-const std::string head = "charset: x\nversion: 1\n\n";
-
 struct LDIF_File_change : store_test {
     /// A store with those entries, in that order.
     std::unique_ptr<LDIF_File> store_of(const std::vector<std::string>& dns) {
-        std::string text = head;
+        std::string text = store_head;
         for (const std::string& dn : dns) {
             text += "dn: " + dn + "\n\n";
         }
@@ -92,7 +90,7 @@ TEST_F(LDIF_File_add, EntryNeedsNoAttributes) {
     const auto file = store_of({});
     add_entry(*file, "o=a");
     file->add(dn_of("o=b"), nullptr);
-    EXPECT_EQ(text_of(*file), head + "dn: o=a\n\ndn: o=b\n\n");
+    EXPECT_EQ(text_of(*file), store_head + "dn: o=a\n\ndn: o=b\n\n");
 }
 
 TEST_F(LDIF_File_add, EntryTakesThePlaceThatItsNameTells) {
@@ -116,9 +114,10 @@ TEST_F(LDIF_File_add, EntriesThatBelongBelowANewOneMoveThere) {
 }
 
 TEST_F(LDIF_File_add, EntryThatIsThereTakesOverTheAttributes) {
-    const auto file = store(head + "# c\ndn: o=a\ncn: 1\nsn: 1\n\ndn: cn=1, o=a\n\ndn: o=b\n\n");
+    const auto file =
+        store(store_head + "# c\ndn: o=a\ncn: 1\nsn: 1\n\ndn: cn=1, o=a\n\ndn: o=b\n\n");
     add_entry(*file, "O=A", {{add, "SN", {"1", "2"}}, {replace, "ou", {"x"}}, {del, "cn", {"1"}}});
-    EXPECT_EQ(text_of(*file), head +
+    EXPECT_EQ(text_of(*file), store_head +
                                   "# c\ndn: o=a\ncn: 1\nou: x\nsn: 1\nsn: 2\n\ndn: cn=1, o=a\n\n"
                                   "dn: o=b\n\n");
 }
@@ -188,7 +187,7 @@ TEST_F(LDIF_File_add, RefusedEntryChangesNothing) {
          "a:b",
          "x"},
     };
-    const std::string before = head +
+    const std::string before = store_head +
                                "dn: o=a\noru-slapdPort: 389\nsn: 1\n\n"
                                "dn: cn=1, o=a\ncn: 1\n\ndn: cn=2, o=new\n\n";
     for (const auto& row : rows) {
@@ -209,10 +208,10 @@ TEST_F(LDIF_File_add, RefusedEntryChangesNothing) {
 }
 
 TEST_F(LDIF_File_add, SameSingleValueAgainIsNoSecondOne) {
-    const auto file = store(head + "dn: o=a\noru-slapdPort: 389\n\n");
+    const auto file = store(store_head + "dn: o=a\noru-slapdPort: 389\n\n");
     add_entry(*file, "o=a", {{add, "oru-slapdPort", {"0389"}}});
     add_entry(*file, "o=b", {{add, "cn", {"x"}}, {add, "cn", {"X"}}});
-    EXPECT_EQ(text_of(*file), head + "dn: o=a\noru-slapdPort: 389\n\ndn: o=b\ncn: x\n\n");
+    EXPECT_EQ(text_of(*file), store_head + "dn: o=a\noru-slapdPort: 389\n\ndn: o=b\ncn: x\n\n");
 }
 
 TEST_F(LDIF_File_erase, LeafGoesWithOrWithoutTheOption) {
@@ -300,10 +299,11 @@ TEST_F(LDIF_File_erase, SiblingsKeepTheirOrder) {
 }
 
 TEST_F(LDIF_File_erase, ErasedEntryCanBeAddedAgainAsANewOne) {
-    const auto file = store(head + "dn: o=a\n\n# c\ndn: cn=1, o=a\nsn: 1\n\ndn: cn=2, o=a\n\n");
+    const auto file =
+        store(store_head + "dn: o=a\n\n# c\ndn: cn=1, o=a\nsn: 1\n\ndn: cn=2, o=a\n\n");
     file->erase(dn_of("cn=1,o=a"), false);
     add_entry(*file, "cn=1,o=a", {{add, "ou", {"x"}}});
-    EXPECT_EQ(text_of(*file), head + "dn: o=a\n\ndn: cn=2, o=a\n\ndn: cn=1, o=a\nou: x\n\n");
+    EXPECT_EQ(text_of(*file), store_head + "dn: o=a\n\ndn: cn=2, o=a\n\ndn: cn=1, o=a\nou: x\n\n");
     file->flush();
     EXPECT_EQ(folder.read("conf"), text_of(*file));
 }

@@ -1,3 +1,5 @@
+// The tree is drawn line by line as its rules say, in both styles.
+
 #include <gmock/gmock.h>
 
 #include <set>

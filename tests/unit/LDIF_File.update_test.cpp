@@ -1,3 +1,5 @@
+// An update keeps others away, and what others wrote all the same is never overwritten.
+
 #include <gmock/gmock.h>
 
 #include <cerrno>

@@ -11,6 +11,7 @@
 #include <vector>
 
 #include "LDIF_Exception.h"
+#include "dn_of.h"
 #include "failures.h"
 #include "temporary_folder.h"
 #include "utf8_locale.h"
@@ -19,8 +20,6 @@ using namespace cfg32::tests;
 using testing::HasSubstr;
 
 namespace {
-
-LDIF_DN dn_of(const std::string& text) { return LDIF_DN(cisString(text)); }
 
 const char* const invalid_at_root =
     "65/1007 \"oru-slapdInvalidLine\" attribute not allowed in <root> object";

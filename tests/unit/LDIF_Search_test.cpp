@@ -8,6 +8,7 @@
 #include <vector>
 
 #include "LDIF_File.h"
+#include "dn_of.h"
 #include "failures.h"
 #include "temporary_folder.h"
 
@@ -19,8 +20,6 @@ using testing::IsEmpty;
 namespace {
 
 using Results = LDIF_Search_Results;
-
-LDIF_DN dn_of(const std::string& text) { return LDIF_DN(cisString(text)); }
 
 /// A filter on one line: the attribute, and "=*" or the value in brackets.
 std::string shown(const LDIF_Filter& filter) {

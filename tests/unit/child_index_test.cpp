@@ -7,6 +7,7 @@
 #include <utility>
 #include <vector>
 
+#include "dn_of.h"
 #include "model_tree.h"
 #include "random_names.h"
 #include "small_stack.h"
@@ -17,8 +18,6 @@ using testing::ElementsAre;
 using testing::IsEmpty;
 
 namespace {
-
-LDIF_DN dn_of(const std::string& text) { return LDIF_DN(cisString(text)); }
 
 void print(const model_entry& entry, std::string& out) {
     out += entry.str();

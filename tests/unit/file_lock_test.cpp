@@ -1,3 +1,5 @@
+// A locked file is the one that its name leads to, and is waited for no longer than asked.
+
 #include "file_lock.h"
 
 #include <gmock/gmock.h>

@@ -83,7 +83,6 @@ bool can_be_loaded(const LDIF_Entry& entry) {
 }  // namespace
 
 void LDIF_File::flush() {
-    const auto details = [&](LDIF_Exception& e) { name_file(e); };
     // What can't be written shall not stand in the way of the next change.
     const auto forgetting = [&](LDIF_Exception& e) {
         name_file(e);
@@ -100,7 +99,7 @@ void LDIF_File::flush() {
         }
         write(content, is_refreshed);
     };
-    with_system_error([] { return "writing file"; }, body, details);
+    with_system_error([] { return "writing file"; }, body, forgetting);
 }
 
 /// The whole file as text.
