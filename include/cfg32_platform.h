@@ -144,7 +144,8 @@ CFG32_PLATFORM_API void initLocaleMutex(void) CFG32_PLATFORM_NOEXCEPT;
  * @return true on success; false on any failure, with errno saying why. In particular: EINVAL for a
  *         null name, an owner or group that doesn't exist, a source that is not a regular file, a
  *         target that can't be replaced, or when both names mean the same file (by name, hard or
- *         symbolic link); EISDIR when either is a directory; EPERM when the owner can't be given.
+ *         symbolic link); EISDIR when either is a directory; EPERM when the owner can't be given;
+ *         EAGAIN when the source was written to meanwhile.
  *         On failure the temporary file is removed and the target is untouched, with one exception:
  *         when syncing the directory fails, the complete copy already bears the target's name, but
  *         it isn't certain that the name survives a crash.

@@ -88,7 +88,7 @@ TEST_P(crash_points, LeaveNoTornFileThatIsTakenForAConfiguration) {
         const std::string text = on.folder().text();
         const std::string backup = on.folder().backup_text();
         session next(on.folder().config(), on.folder().backup());
-        if (next.bind() == CFG_SUCCESS) {
+        if (next.bind_as_anybody() == CFG_SUCCESS) {
             EXPECT_THAT(versions, Contains(as_written(text)));
             return;
         }
@@ -98,6 +98,15 @@ TEST_P(crash_points, LeaveNoTornFileThatIsTakenForAConfiguration) {
         EXPECT_EQ(on.folder().backup_text(), backup);
     });
     EXPECT_GT(refused, 0);
+}
+
+// It tells its reader to copy the backup over the file.
+TEST_P(crash_points, WithoutABackupLeaveNoMarkForThereIsNothingToPointTo) {
+    int marked = 0;
+    for_each_death([&](const stage& on) {
+        marked += on.folder().text().find("This file is being written") != std::string::npos;
+    });
+    EXPECT_EQ(marked > 0, setting.has_backup) << listed(calls);
 }
 
 TEST_P(crash_points, KeepNobodyFromTheNextUpdate) {
@@ -110,7 +119,7 @@ TEST_P(crash_points, KeepNobodyFromTheNextUpdate) {
         }
         EXPECT_LE(on.folder().other_files().size(), 1u);  // the backup that was being made
         session next(on.folder().config(), on.folder().backup());
-        EXPECT_EQ(next.bind(), CFG_SUCCESS) << next.report();
+        EXPECT_EQ(next.bind_as_anybody(), CFG_SUCCESS) << next.report();
         EXPECT_EQ(next.modify(setting.what), CFG_SUCCESS) << next.report();
         EXPECT_EQ(on.folder().text(), versions.back());
     });

@@ -20,6 +20,8 @@
 #include <cstdlib>
 #include <utility>
 
+#include "failing_new.h"
+
 namespace cfg32::tests {
 
 namespace {
@@ -46,10 +48,29 @@ Function next(const char* name) {
     }
 }
 
-std::string about(const char* path) { return current ? path : ""; }
+// What is done here for the list is not what may lack memory.
+
+std::string about(const char* path) {
+    const failing_allocation::pause pause;
+    return current ? path : "";
+}
+
 std::string about(int file) { return current ? std::to_string(file) : ""; }
+
 std::string about(int file, size_t size) {
+    const failing_allocation::pause pause;
     return current ? std::to_string(file) + ", " + std::to_string(size) + " bytes" : "";
+}
+
+/// Lets the planned event happen, unseen.
+void let_happen(const fault& planned) {
+    if (planned.event) {
+        watched_calls* const watching = std::exchange(current, nullptr);
+        const int saved = errno;
+        planned.event();
+        errno = saved;
+        current = watching;
+    }
 }
 
 /// Carries a call out, or lets happen to it what is planned. fail reports an error in the way of
@@ -60,6 +81,15 @@ auto passed(const char* name, const std::string& about, bool is_transfer, Call c
     -> decltype(call(whole)) {
     const fault* planned = current ? current->note(name, about, is_transfer) : nullptr;
     if (!planned) {
+        return call(whole);
+    }
+    if (planned->what == effect::comes_after) {
+        const auto result = call(whole);
+        let_happen(*planned);
+        return result;
+    }
+    let_happen(*planned);
+    if (planned->what == effect::comes_before) {
         return call(whole);
     }
     if (planned->what == effect::fails) {
@@ -133,6 +163,7 @@ watched_calls::~watched_calls() { current = nullptr; }
 
 const fault* watched_calls::note(const char* name, const std::string& about, bool is_transfer) {
     // What is done here for the list shall not be seen itself.
+    const failing_allocation::pause pause;
     current = nullptr;
     seen_.push_back({name, about, is_transfer, false});
     if (seen_.size() > most_calls) {

@@ -1,12 +1,13 @@
 #pragma once
 
 #include <cstddef>
+#include <functional>
 #include <string>
 #include <vector>
 
 // The calls by which the two libraries reach the system lead through the test program, which
-// defines them itself and passes them on to the C library. It can count them, let one fail, and end
-// the process at one, as a crash would.
+// defines them itself and passes them on to the C library. It can count them, let one fail, end the
+// process at one, as a crash would, and do at one what somebody else might do at that moment.
 
 namespace cfg32::tests {
 
@@ -17,6 +18,8 @@ enum class effect {
     kills_before,   ///< SIGKILL instead of the call
     kills_halfway,  ///< SIGKILL after half of what could be transferred
     kills_after,    ///< SIGKILL when the call is done
+    comes_before,   ///< nothing but the event, and then the call
+    comes_after,    ///< the call, and then the event
 };
 
 struct fault {
@@ -24,6 +27,9 @@ struct fault {
     effect what;         ///< what happens to it
     int error = 0;       ///< the errno of one that fails
     std::string name{};  ///< if not empty, only calls of this name
+    /// What happens at the call, after it for comes_after and else before it. Its own calls are not
+    /// seen.
+    std::function<void()> event{};
 };
 
 struct seen_call {

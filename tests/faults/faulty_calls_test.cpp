@@ -184,6 +184,27 @@ TEST(faulty_calls, APlannedFaultHitsOneCall) {
     EXPECT_THAT(names_of(calls.seen()), ElementsAre("stat", "stat", "stat"));
 }
 
+TEST(faulty_calls, AnEventComesBeforeOrAfterACallAndIsNotSeen) {
+    const configuration_folder folder(configuration_head);
+    session user(folder.config());
+    ASSERT_EQ(user.bind(), CFG_SUCCESS);
+    const auto event = [&] { folder.write(folder.text() + "\ndn: cn=a, cn=Configuration\n"); };
+    const struct {
+        effect what;
+        int code;  // of the first search
+    } rows[] = {{effect::comes_before, CFG_SUCCESS}, {effect::comes_after, CFG_NO_SUCH_OBJECT}};
+    for (const auto& row : rows) {
+        folder.write(configuration_head);
+        folder.folder().touch("oruslapd.conf", row.code + 5);
+        std::set<std::string> values;
+        ASSERT_EQ(user.search("cn=Configuration", "cn", values), CFG_SUCCESS);
+        const watched_calls calls({{1, row.what, 0, "", event}});
+        EXPECT_EQ(user.search("cn=a, cn=Configuration", "cn", values), row.code);
+        EXPECT_EQ(calls.seen().size() == 1, row.code == CFG_NO_SUCH_OBJECT) << listed(calls.seen());
+        EXPECT_EQ(user.search("cn=a, cn=Configuration", "cn", values), CFG_SUCCESS);
+    }
+}
+
 TEST(faulty_calls, AnUpdateIsOnTheDiskAndItsBackupBeforeIt) {
     const configuration_folder folder(configuration_head);
     session user(folder.config(), folder.backup());

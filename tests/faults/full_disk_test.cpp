@@ -3,25 +3,22 @@
 
 #include <fcntl.h>
 #include <gmock/gmock.h>
-#include <sched.h>
-#include <sys/mount.h>
 #include <sys/resource.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
 #include <cerrno>
 #include <csignal>
-#include <cstdlib>
-#include <cstring>
-#include <filesystem>
 #include <fstream>
-#include <ostream>
+#include <set>
 
 #include "session.h"
+#include "small_disk.h"
 
 using namespace cfg32::tests;
 using testing::HasSubstr;
 using testing::IsEmpty;
+using testing::Not;
 
 namespace {
 
@@ -33,127 +30,52 @@ std::string file_of_some_pages() {
     return as_written(configuration_head + "description: " + std::string(20'000, 'd') + "\n");
 }
 
-bool write_text(const char* path, const std::string& text) {
-    return static_cast<bool>(std::ofstream(path) << text << std::flush);
-}
-
-/// Gets a namespace of mounts of this process's own, which nobody else sees; a test has a process
-/// of its own. Returns why not, "" if so.
-std::string own_mounts() {
-    const std::string user = std::to_string(geteuid());
-    const std::string group = std::to_string(getegid());
-    if (unshare(CLONE_NEWNS) != 0) {
-        if (unshare(CLONE_NEWUSER | CLONE_NEWNS) != 0) {
-            return std::string("no namespaces: ") + strerror(errno);
-        }
-        if (!write_text("/proc/self/setgroups", "deny") ||
-            !write_text("/proc/self/uid_map", user + " " + user + " 1") ||
-            !write_text("/proc/self/gid_map", group + " " + group + " 1")) {
-            return "no user of that namespace";
-        }
-    }
-    if (mount("none", "/", nullptr, MS_REC | MS_PRIVATE, nullptr) != 0) {
-        return std::string("no mounts of its own: ") + strerror(errno);
-    }
-    return "";
-}
-
-struct small_file_system {
-    const char* name;
-    const char* make;  ///< the command that makes it in a file; null for one in memory
-};
-
-void PrintTo(const small_file_system& one, std::ostream* out) { *out << one.name; }
-
 /// One in memory, one on a disk, and one on a disk that can't reserve room.
-const small_file_system file_systems[] = {
+const file_system file_systems[] = {
     {"tmpfs", nullptr},
     {"ext4", "mkfs.ext4 -q -F -m 0 -b 1024"},
     {"ext2", "mkfs.ext2 -q -F -m 0 -b 1024"},
 };
 
-constexpr off_t disk_size = 1 << 20;
+/// One where a copy shares the blocks of the file until either is written; it is made no smaller.
+const file_system sharing = {"xfs", "mkfs.xfs -q -f -m reflink=1", off_t{320} << 20};
 
-struct full_disk : testing::TestWithParam<small_file_system> {
-    const temporary_folder outside;
-    const std::string place = outside.file("disk");
-    const std::string config = place + "/oruslapd.conf";
-    const std::string backup = place + "/oruslapd.bak";
-    const std::string filler = place + "/filler";
+/// One whose times are of two seconds, and whose files have no owner.
+const file_system coarse = {"vfat", "mkfs.vfat"};
+
+struct on_a_disk : testing::Test {
+    const small_disk disk;
+    const std::string config = disk.config();
+    const std::string backup = disk.backup();
     const std::string before = file_of_some_pages();
-    bool is_mounted = false;
+
+    explicit on_a_disk(const file_system& kind) : disk(kind) {}
 
     void SetUp() override {
-        if (const std::string obstacle = own_mounts(); !obstacle.empty()) {
-            GTEST_SKIP() << obstacle;
+        if (!disk.obstacle().empty()) {
+            GTEST_SKIP() << disk.obstacle();
         }
-        ASSERT_EQ(mkdir(place.c_str(), 0700), 0);
-        if (const std::string obstacle = mount_disk(); !obstacle.empty()) {
-            GTEST_SKIP() << "no " << GetParam().name << " can be mounted: " << obstacle;
-        }
-        is_mounted = true;
         std::ofstream(config, std::ios::binary) << before;
-        ASSERT_EQ(text_of(config), before);
+        ASSERT_EQ(disk.text_of(config), before);
     }
 
-    void TearDown() override {
-        if (is_mounted) {
-            EXPECT_EQ(umount2(place.c_str(), MNT_DETACH), 0);
-        }
+    struct stat status() const {
+        struct stat status {};
+        EXPECT_EQ(stat(config.c_str(), &status), 0);
+        return status;
     }
+};
 
-    std::string mount_disk() const {
-        if (!GetParam().make) {
-            const std::string size = "size=" + std::to_string(disk_size);
-            return mount("none", place.c_str(), "tmpfs", 0, size.c_str()) == 0 ? ""
-                                                                               : strerror(errno);
-        }
-        const std::string image = outside.write("image", "");
-        if (truncate(image.c_str(), disk_size) != 0) {
-            return strerror(errno);
-        }
-        const std::string path = "PATH=$PATH:/sbin:/usr/sbin ";
-        if (system((path + GetParam().make + " " + image + " >/dev/null 2>&1").c_str()) != 0) {
-            return "it can't be made";
-        }
-        const std::string command = path + "mount -o loop " + image + " " + place + " 2>/dev/null";
-        return system(command.c_str()) == 0 ? "" : "the loop device can't be had";
-    }
+struct full_disk : on_a_disk, testing::WithParamInterface<file_system> {
+    full_disk() : on_a_disk(GetParam()) {}
+};
 
-    static std::string text_of(const std::string& path) {
-        std::ifstream in(path, std::ios::binary);
-        return {std::istreambuf_iterator<char>(in), {}};
-    }
+struct sharing_disk : on_a_disk {
+    sharing_disk() : on_a_disk(sharing) {}
+};
 
-    /// Takes all the room that is left, but for so many bytes.
-    void fill(size_t left = 0) const {
-        const int file = open(filler.c_str(), O_WRONLY | O_CREAT | O_CLOEXEC, 0600);
-        ASSERT_GE(file, 0);
-        const std::string block(512, 'f');
-        off_t size = 0;
-        for (ssize_t count; (count = ::write(file, block.data(), block.size())) > 0;) {
-            size += count;
-        }
-        EXPECT_EQ(errno, ENOSPC);
-        EXPECT_EQ(ftruncate(file, size - static_cast<off_t>(left)), 0);
-        EXPECT_EQ(fsync(file), 0);
-        close(file);
-    }
-
-    void make_room() const { ASSERT_EQ(unlink(filler.c_str()), 0); }
-
-    /// The names in the folder, save those that are to be there.
-    std::vector<std::string> other_files() const {
-        std::vector<std::string> names;
-        for (const auto& file : std::filesystem::directory_iterator(place)) {
-            const std::string path = file.path();
-            if (path != config && path != backup && path != filler &&
-                path != place + "/lost+found") {
-                names.push_back(path);
-            }
-        }
-        return names;
-    }
+struct coarse_disk : on_a_disk {
+    coarse_disk() : on_a_disk(coarse) {}
 };
 
 }  // namespace
@@ -161,60 +83,133 @@ struct full_disk : testing::TestWithParam<small_file_system> {
 TEST_P(full_disk, AnUpdateThatDoesNotFitLeavesTheFileAsItWas) {
     session user(config);
     ASSERT_EQ(user.bind(), CFG_SUCCESS) << user.report();
-    fill();
+    disk.fill();
     EXPECT_EQ(user.modify(growth), CFG_OTHER);
     EXPECT_THAT(user.report(), HasSubstr("errno " + std::to_string(ENOSPC) + ":"));
-    EXPECT_EQ(text_of(config), before);
-    make_room();
+    EXPECT_EQ(disk.text_of(config), before);
+    disk.make_room();
     EXPECT_EQ(user.modify(growth), CFG_SUCCESS) << user.report();
-    EXPECT_EQ(text_of(config), as_written_after(before, growth));
+    EXPECT_EQ(disk.text_of(config), as_written_after(before, growth));
 }
 
 TEST_P(full_disk, AnUpdateThatFitsOnlyInPartLeavesTheFileAsItWas) {
     session user(config);
     ASSERT_EQ(user.bind(), CFG_SUCCESS) << user.report();
-    fill(12'000);
+    disk.fill(12'000);
     EXPECT_EQ(user.modify(growth), CFG_OTHER);
     EXPECT_THAT(user.report(), HasSubstr("errno " + std::to_string(ENOSPC) + ":"));
-    EXPECT_EQ(text_of(config), before);
+    EXPECT_EQ(disk.text_of(config), before);
     // A program that comes later finds the old file whole.
     session other(config);
     EXPECT_EQ(other.bind(), CFG_SUCCESS) << other.report();
-    EXPECT_EQ(text_of(config), before);
+    EXPECT_EQ(disk.text_of(config), before);
+}
+
+TEST_P(full_disk, AnUpdateThatFitsOnlyInPartGivesBackTheRoomThatItGot) {
+    session user(config);
+    ASSERT_EQ(user.bind(), CFG_SUCCESS) << user.report();
+    disk.fill(12'000);
+    const int file = open(config.c_str(), O_RDONLY | O_CLOEXEC);
+    ASSERT_GE(file, 0);
+    ASSERT_EQ(fsync(file),
+              0);  // only now is it known where the content lies, and how much it takes
+    close(file);
+    const auto blocks = status().st_blocks;
+    for (int i = 0; i < 3; ++i) {
+        EXPECT_EQ(user.modify(growth), CFG_OTHER);
+        EXPECT_EQ(status().st_blocks, blocks);
+        EXPECT_EQ(disk.text_of(config), before);
+    }
 }
 
 TEST_P(full_disk, AnUpdateThatTakesNoMoreRoomIsDone) {
     session user(config);
     ASSERT_EQ(user.bind(), CFG_SUCCESS) << user.report();
-    fill();
+    disk.fill();
     EXPECT_EQ(user.modify(shrinkage), CFG_SUCCESS) << user.report();
-    EXPECT_EQ(text_of(config), as_written_after(before, shrinkage));
+    EXPECT_EQ(disk.text_of(config), as_written_after(before, shrinkage));
 }
 
 TEST_P(full_disk, ABackupThatDoesNotFitLeavesTheFileAndTheBackupAsTheyWere) {
     session user(config, backup);
     ASSERT_EQ(user.bind(), CFG_SUCCESS) << user.report();
     ASSERT_EQ(user.flush(), CFG_SUCCESS) << user.report();
-    ASSERT_EQ(text_of(backup), before);
+    ASSERT_EQ(disk.text_of(backup), before);
     const std::string changed = as_written_after(before, shrinkage);
     ASSERT_EQ(user.modify(shrinkage), CFG_SUCCESS) << user.report();
     ASSERT_EQ(user.modify(growth), CFG_SUCCESS) << user.report();
-    ASSERT_EQ(text_of(backup), changed);
-    const std::string grown = text_of(config);
-    fill();
+    ASSERT_EQ(disk.text_of(backup), changed);
+    const std::string grown = disk.text_of(config);
+    disk.fill();
     EXPECT_EQ(user.modify(shrinkage), CFG_INSUFFICIENT_ACCESS);
     EXPECT_THAT(user.report(), HasSubstr("errno " + std::to_string(ENOSPC) + ":"));
-    EXPECT_EQ(text_of(config), grown);
-    EXPECT_EQ(text_of(backup), changed);
-    EXPECT_THAT(other_files(), IsEmpty());
-    make_room();
+    EXPECT_EQ(disk.text_of(config), grown);
+    EXPECT_EQ(disk.text_of(backup), changed);
+    EXPECT_THAT(disk.other_files(), IsEmpty());
+    disk.make_room();
     EXPECT_EQ(user.modify(shrinkage), CFG_SUCCESS) << user.report();
-    EXPECT_EQ(text_of(config), changed);
-    EXPECT_EQ(text_of(backup), grown);
+    EXPECT_EQ(disk.text_of(config), changed);
+    EXPECT_EQ(disk.text_of(backup), grown);
 }
 
 INSTANTIATE_TEST_SUITE_P(on, full_disk, testing::ValuesIn(file_systems),
                          [](const auto& info) { return std::string(info.param.name); });
+
+// The backup takes next to no room then, and it is short when the file is written.
+TEST_F(sharing_disk, AnUpdateOfSharedBlocksIsDoneOrLeavesTheFileAsItWas) {
+    constexpr size_t length = 1 << 19;
+    const auto replacement = [](size_t count, char with) {
+        return attribute_change{
+            LDAP_MOD_REPLACE, "cn=Configuration", "description", {std::string(count, with)}};
+    };
+    session user(config, backup);
+    ASSERT_EQ(user.bind(), CFG_SUCCESS) << user.report();
+    std::set<int> codes;
+    for (size_t left = 0; left <= 4 * length && !HasFailure(); left += length / 2) {
+        for (const attribute_change& what :
+             {replacement(length, 'D'), replacement(2 * length, 'D')}) {
+            SCOPED_TRACE(std::to_string(left) + ", " + std::to_string(what.values[0].size()));
+            ASSERT_EQ(user.modify(replacement(length, 'd')), CFG_SUCCESS) << user.report();
+            const std::string now = disk.text_of(config);
+            const std::string last = disk.text_of(backup);
+            disk.fill(left);
+            const int code = user.modify(what);
+            disk.make_room();
+            codes.insert(code);
+            EXPECT_TRUE(disk.text_of(config) ==
+                        (code == CFG_SUCCESS ? as_written_after(now, what) : now));
+            EXPECT_TRUE(disk.text_of(backup) == (code == CFG_INSUFFICIENT_ACCESS ? last : now));
+            if (code != CFG_SUCCESS) {
+                EXPECT_THAT(user.report(), HasSubstr("errno " + std::to_string(ENOSPC) + ":"));
+                EXPECT_THAT(user.report(), Not(HasSubstr("could not be put back")));
+            }
+            EXPECT_THAT(disk.other_files(), IsEmpty());
+        }
+    }
+    // No room for the backup; some for it, but not for the file; room for both.
+    EXPECT_EQ(codes, (std::set<int>{CFG_INSUFFICIENT_ACCESS, CFG_OTHER, CFG_SUCCESS}));
+}
+
+TEST_F(coarse_disk, EveryUpdateGivesTheFileALaterTime) {
+    session user(config, backup);
+    session other(config);
+    ASSERT_EQ(user.bind(), CFG_SUCCESS) << user.report();
+    ASSERT_EQ(other.bind(), CFG_SUCCESS) << other.report();
+    for (int i = 0; i < 5; ++i) {
+        const struct stat last = status();
+        const std::string value = "number " + std::to_string(i);
+        const std::string now = disk.text_of(config);
+        EXPECT_EQ(user.modify({LDAP_MOD_REPLACE, "cn=Configuration", "description", {value}}),
+                  CFG_SUCCESS)
+            << user.report();
+        EXPECT_GT(status().st_mtim.tv_sec, last.st_mtim.tv_sec);
+        EXPECT_EQ(disk.text_of(backup), now);
+        std::set<std::string> values;
+        EXPECT_EQ(other.search("cn=Configuration", "description", values), CFG_SUCCESS);
+        EXPECT_EQ(values, std::set<std::string>{value});
+    }
+    EXPECT_THAT(disk.other_files(), IsEmpty());
+}
 
 namespace {
 

@@ -4,6 +4,8 @@
 
 #include <cerrno>
 
+#include "failing_new.h"
+
 namespace cfg32::tests {
 
 namespace {
@@ -33,6 +35,12 @@ std::string configuration(const std::string& lines) {
 
 attribute_change replacement(const std::string& attribute, const std::string& value) {
     return {LDAP_MOD_REPLACE, front_end, attribute, {value}};
+}
+
+/// A file of few bytes, and a change of it.
+scenario small(const char* name, const std::string& from, const std::string& to) {
+    const std::string text = "charset: x\nversion: 1\n\ndn: cn=a\ncn: a\ndescription: ";
+    return {name, true, text + from + "\n\n", {LDAP_MOD_REPLACE, "cn=a", "description", {to}}, {}};
 }
 
 /// With and without a backup.
@@ -69,6 +77,11 @@ const std::vector<scenario>& scenarios() {
                  {"", true, broken, replacement("oru-slapdTimeLimit", "60"), {}});
         add_both(made, "growing_unreserved", "growing_unreserved_without_backup",
                  {"", true, whole, growth, without_reservation});
+        const std::string long_text(100, 'd');
+        made.push_back(small("small_growing", "d", "some text"));
+        made.push_back(small("small_shrinking", "some text", "d"));
+        made.push_back(small("small_becoming_large", "d", long_text));
+        made.push_back(small("large_becoming_small", long_text, "d"));
         return made;
     }();
     return all;
@@ -103,6 +116,7 @@ int stage::play(const std::vector<fault>& faults) {
     all.insert(all.end(), scenario_.circumstances.begin(), scenario_.circumstances.end());
     watched_calls calls(all);
     const int code = user_.modify(scenario_.what);
+    const failing_allocation::pause pause;
     seen_ = calls.seen();
     return code;
 }

@@ -22,7 +22,8 @@ struct scenario {
 inline void PrintTo(const scenario& one, std::ostream* out) { *out << one.name; }
 
 /// All of them. Files grow, shrink and stay as long as they are; with a backup and without; lines
-/// that can't be used have to be repaired; room can't be reserved.
+/// that can't be used have to be repaired; room can't be reserved; a text is shorter than the mark
+/// of an unfinished file.
 const std::vector<scenario>& scenarios();
 
 /// A scenario's versions of the file: as it was, repaired if it has to be, and changed.
@@ -41,6 +42,7 @@ class stage {
     const scenario& setting() const { return scenario_; }
     const configuration_folder& folder() const { return folder_; }
     std::string report() const { return user_.report(); }
+    session& user() { return user_; }
     /// What play() did.
     const std::vector<seen_call>& seen() const { return seen_; }
 

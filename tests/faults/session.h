@@ -31,6 +31,7 @@ class session {
 
     // Each returns what the library's call returned.
     int bind();
+    int bind_as_anybody();  ///< also to a file without an administrator
     int modify(const attribute_change& what);
     int search(const std::string& base, const std::string& attribute,
                std::set<std::string>& values);

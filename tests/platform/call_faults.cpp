@@ -124,6 +124,13 @@ int __wrap_renameat(int from, const char* from_name, int to, const char* to_name
     return fails(watched_call::rename) ? -1 : __real_renameat(from, from_name, to, to_name);
 }
 
+ssize_t __real_write(int, const void*, size_t);
+ssize_t __wrap_write(int fd, const void* data, size_t size) {
+    if (fails(watched_call::write))
+        return fault.error == 0 ? 0 : -1;
+    return __real_write(fd, data, size);
+}
+
 int __real_fsync(int);
 int __wrap_fsync(int fd) { return fails(watched_call::sync) ? -1 : __real_fsync(fd); }
 

@@ -17,10 +17,11 @@ enum class watched_call {
     random_bytes,
     rename,
     sync,
+    write,
 };
 
 // Lets the nth call (from 1) of its kind fail with this errno for as long as the object lives; 0
-// only counts.
+// only counts. A write that fails with no errno writes nothing and returns 0.
 class call_fault {
   public:
     call_fault(watched_call call, int nth, int error = 0);

@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 #include <pwd.h>
 #include <sys/resource.h>
+#include <sys/wait.h>
 #include <sys/xattr.h>
 
 #include <algorithm>
@@ -162,13 +163,18 @@ TEST_F(CopyFile, GivesThePermissionBitsWhateverTheUmask) {
     }
 }
 
-// The binary form of "user::rwx, user:65534:rw-, group::r-x, mask::rwx, other::r-x" (acl(5)).
-std::vector<unsigned char> open_default_list() {
+// An access control list in its binary form: permissions of the owner, of user 65534, of the group,
+// of all but the owner and others at most, and of others (acl(5)).
+std::vector<unsigned char> access_list(std::uint16_t owner, std::uint16_t user, std::uint16_t group,
+                                       std::uint16_t mask, std::uint16_t others) {
     const struct {
         std::uint16_t tag, permissions;
         std::uint32_t id;
-    } entries[] = {
-        {0x01, 7, ~0u}, {0x02, 6, 65534}, {0x04, 5, ~0u}, {0x10, 7, ~0u}, {0x20, 5, ~0u}};
+    } entries[] = {{0x01, owner, ~0u},
+                   {0x02, user, 65534},
+                   {0x04, group, ~0u},
+                   {0x10, mask, ~0u},
+                   {0x20, others, ~0u}};
     std::vector<unsigned char> list = {2, 0, 0, 0};
     for (const auto& entry : entries) {
         const auto* bytes = reinterpret_cast<const unsigned char*>(&entry);
@@ -178,7 +184,7 @@ std::vector<unsigned char> open_default_list() {
 }
 
 TEST_F(CopyFile, InheritsNoAccessListFromTheDirectory) {
-    const auto list = open_default_list();
+    const auto list = access_list(7, 6, 5, 7, 5);
     if (::setxattr(directory_.path().c_str(), "system.posix_acl_default", list.data(), list.size(),
                    0) != 0)
         GTEST_SKIP() << "the file system has no access control lists";
@@ -189,6 +195,41 @@ TEST_F(CopyFile, InheritsNoAccessListFromTheDirectory) {
     EXPECT_EQ(mode_of(target_), 0640u);
     EXPECT_EQ(::getxattr(target_.c_str(), "system.posix_acl_access", nullptr, 0), -1);
     EXPECT_EQ(errno, ENODATA);
+}
+
+// What one who has nothing but a group may read, in a process of their own.
+bool can_read(gid_t group, const std::string& path) {
+    constexpr uid_t somebody = 23456;
+    const pid_t child = ::fork();
+    if (child == 0) {
+        if (::setgroups(0, nullptr) != 0 || ::setgid(group) != 0 || ::setuid(somebody) != 0)
+            ::_exit(2);
+        ::_exit(::access(path.c_str(), R_OK) == 0 ? 0 : 1);
+    }
+    int status = -1;
+    EXPECT_EQ(::waitpid(child, &status, 0), child);
+    EXPECT_TRUE(WIFEXITED(status) && WEXITSTATUS(status) != 2) << status;
+    return status == 0;
+}
+
+// The mode of the file with the list says rw-rw----, although the group may do nothing.
+TEST_F(CopyFile, OfAFileWithAnAccessListLetsNobodyInWhomTheListRefuses) {
+    const auto list = access_list(6, 6, 0, 6, 0);
+    if (::setxattr(source_.c_str(), "system.posix_acl_access", list.data(), list.size(), 0) != 0)
+        GTEST_SKIP() << "the file system has no access control lists";
+    ASSERT_EQ(mode_of(source_), 0660u);
+    EXPECT_TRUE(copy(status_of(source_).st_mode));
+    EXPECT_EQ(mode_of(target_), 0600u);
+    EXPECT_EQ(::getxattr(target_.c_str(), "system.posix_acl_access", nullptr, 0), -1);
+    if (::geteuid() != 0)
+        GTEST_SKIP() << "only the superuser can be another";
+    constexpr gid_t group = 54321;
+    ASSERT_EQ(::chmod(directory_.path().c_str(), 0755), 0);
+    ASSERT_EQ(::chown(source_.c_str(), 12345, group), 0);
+    EXPECT_TRUE(copy(status_of(source_).st_mode));
+    ASSERT_EQ(status_of(target_).st_gid, group);
+    ASSERT_FALSE(can_read(group, source_));
+    EXPECT_FALSE(can_read(group, target_));
 }
 
 // Owner and group ------------------------------------------------------------------------------
@@ -247,6 +288,23 @@ TEST_F(CopyFile, FailsForAnUnknownOwnerOrGroup) {
     EXPECT_EQ(directory_.names(), (names{"source", "target"}));
 }
 
+TEST_F(CopyFile, KeepsTheNumbersOfAnOwnerAndAGroupWithoutNames) {
+    if (::chown(source_.c_str(), 12345, 54321) != 0)
+        GTEST_SKIP() << "only the superuser gives files away";
+    const passwd* user = ::getpwnam("daemon");
+    ASSERT_NE(user, nullptr);
+    const struct {
+        const char* owner;
+        uid_t uid;
+    } rows[] = {{nullptr, 12345}, {"daemon", user->pw_uid}};
+    for (const auto& row : rows) {
+        EXPECT_TRUE(copy(04664, row.owner, nullptr));
+        EXPECT_EQ(status_of(target_).st_uid, row.uid);
+        EXPECT_EQ(status_of(target_).st_gid, 54321u);
+        EXPECT_EQ(mode_of(target_), 04664u);
+    }
+}
+
 // The superuser acts as an ordinary user for a while; an ordinary user stays what it is.
 class ordinary_user {
   public:
@@ -276,6 +334,23 @@ TEST_F(CopyFile, FailsWhenTheOwnerCannotBeGiven) {
     }
     EXPECT_EQ(content_of(target_), "old");
     EXPECT_EQ(directory_.names(), (names{"own", "source", "target"}));
+}
+
+// The rights of the one group are not those of the other.
+TEST_F(CopyFile, LeavesTheRightsOfAGroupThatCannotBeGivenToNoOther) {
+    if (::chown(source_.c_str(), 12345, 54321) != 0)
+        GTEST_SKIP() << "only the superuser gives files away";
+    ASSERT_EQ(::chmod(directory_.path().c_str(), 0777), 0);
+    ASSERT_EQ(::chmod(source_.c_str(), 0664), 0);
+    {
+        const ordinary_user user;
+        if (::geteuid() == 0)
+            GTEST_SKIP() << "still the superuser";
+        EXPECT_TRUE(copy(0664));
+        EXPECT_EQ(status_of(target_).st_uid, ::geteuid());
+        EXPECT_EQ(status_of(target_).st_gid, ::getegid());
+    }
+    EXPECT_EQ(mode_of(target_), 0604u);
 }
 
 TEST_F(CopyFile, FailsWhenTheSourceCannotBeRead) {
@@ -417,6 +492,19 @@ TEST_F(CopyFile, AFullDiskLeavesTheTargetAndNothingElse) {
     std::signal(SIGXFSZ, handler);
     EXPECT_FALSE(copied);
     EXPECT_EQ(error, EFBIG);
+    EXPECT_EQ(content_of(target_), "old");
+    EXPECT_EQ(directory_.names(), (names{"source", "target"}));
+}
+
+TEST_F(CopyFile, AWriteThatWritesNothingIsAFailureAndNotRepeatedForEver) {
+    const char* proc = "/proc/self/limits";  // no part of it goes past write(2)
+    if (::access(proc, R_OK) != 0)
+        GTEST_SKIP() << "no /proc";
+    directory_.write("target", "old");
+    const call_fault fault(watched_call::write, 1);
+    EXPECT_FALSE(copyFile(proc, target_.c_str(), nullptr, nullptr, 0600));
+    EXPECT_EQ(errno, EIO);
+    EXPECT_EQ(fault.calls(), 1);
     EXPECT_EQ(content_of(target_), "old");
     EXPECT_EQ(directory_.names(), (names{"source", "target"}));
 }

@@ -6,21 +6,43 @@
 #include <cstddef>
 #include <cstdlib>
 #include <new>
+#include <utility>
 
 namespace cfg32::tests {
 
-/// While it lives, the allocation number `which` (from 0) of this thread fails, once.
+/// While it lives, the allocation number `which` (from 0) of this thread fails: once, or with all
+/// that follow.
 class failing_allocation {
   public:
-    explicit failing_allocation(long which) {
+    enum extent { once, from_then_on };
+
+    explicit failing_allocation(long which, extent how_long = once) {
         left_ = which;
+        is_lasting_ = how_long == from_then_on;
+        is_over_ = false;
         count_ = 0;
     }
     failing_allocation(const failing_allocation&) = delete;
     failing_allocation& operator=(const failing_allocation&) = delete;
     ~failing_allocation() { left_ = never; }
 
-    bool happened() const { return left_ == never; }
+    bool happened() const { return is_over_; }
+
+    /// Keeps what a test does itself in the middle of the calls out of it.
+    class pause {
+      public:
+        pause() = default;
+        pause(const pause&) = delete;
+        pause& operator=(const pause&) = delete;
+        ~pause() {
+            left_ = left;
+            count_ = count;
+        }
+
+      private:
+        const long left = std::exchange(left_, never);
+        const long count = count_;
+    };
 
     /// Allocations since the object was made.
     static long count() { return count_; }
@@ -28,9 +50,12 @@ class failing_allocation {
     /// For the operators new.
     static void* allocate(size_t size) {
         ++count_;
-        if (left_ != never && left_-- == 0) {
+        if (left_ == 0) {
+            is_over_ = true;
+            left_ = is_lasting_ ? 0 : never;
             return nullptr;
         }
+        left_ -= left_ != never ? 1 : 0;
         return malloc(size != 0 ? size : 1);
     }
 
@@ -38,6 +63,8 @@ class failing_allocation {
     static constexpr long never = -1;
     static inline thread_local long left_ = never;
     static inline thread_local long count_ = 0;
+    static inline thread_local bool is_lasting_ = false;
+    static inline thread_local bool is_over_ = false;
 };
 
 }  // namespace cfg32::tests

@@ -106,11 +106,12 @@ class LDIF_File {
     void require_finished(std::string_view text) const;
     int authenticate(const char* dn, const char* password, int method) const;
     std::string text() const;
-    void back_up() const;
+    void back_up(bool is_refreshed);
     void write(const std::string& content, bool is_refreshed);
     cfg32::unique_fd open_for_writing(struct stat& status);
     void create();
     void overwrite(cfg32::unique_fd file, struct stat& status, const std::string& content);
+    std::string reserved(int file, const struct stat& status, size_t size);
     void require_own(const struct stat& status, bool is_refreshed);
     void require_complete(bool is_refreshed);
 

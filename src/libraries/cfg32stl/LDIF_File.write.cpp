@@ -95,7 +95,7 @@ void LDIF_File::flush() {
         const update lock(*this);
         if (!backup_file_name_.empty()) {
             with_context([&] { require_complete(is_refreshed); }, forgetting);
-            back_up();
+            back_up(is_refreshed);
         }
         write(content, is_refreshed);
     };
@@ -124,7 +124,7 @@ std::string LDIF_File::text() const {
     return out;
 }
 
-void LDIF_File::back_up() const {
+void LDIF_File::back_up(bool is_refreshed) {
     // Not the remembered status: what was changed meanwhile is still to be noticed.
     struct stat status;
     if (stat(file_name_.c_str(), &status) != 0) {
@@ -138,6 +138,9 @@ void LDIF_File::back_up() const {
     if (!lock_ ||
         !copyFile(file_name_.c_str(), backup_file_name_.c_str(), owner, group, status.st_mode)) {
         const int error = errno;
+        if (lock_ && stat(file_name_.c_str(), &status) == 0) {
+            require_own(status, is_refreshed);  // a copy of what is being written is none
+        }
         raise_with(no_backup,
                    formatted("Unable to backup the configuration file: \"%s\" ", file_name_),
                    name_file_and_errno(error));
@@ -207,19 +210,21 @@ void LDIF_File::create() {
 
 /// Makes content the open file's, or puts back what was there. Takes the new status.
 void LDIF_File::overwrite(unique_fd file, struct stat& status, const std::string& content) {
-    const timespec time = status.st_mtim;
-    std::string before;
-    if (!read_all(file.get(), static_cast<size_t>(status.st_size), before) ||
-        !reserve(file.get(), before.size(), content.size())) {
-        raise_with(not_written, {}, name_file_and_errno(errno));
-    }
-    is_loaded_ = false;  // until it is known what the file has become
     // A process that is killed in the middle leaves a file that no load takes for a complete one:
     // it would repair what can't be read, and let the backup be overwritten by it.
     const std::string_view mark = backup_file_name_.empty() ? "" : unfinished_mark;
+    const std::string before = reserved(file.get(), status, std::max(content.size(), mark.size()));
+    is_loaded_ = false;  // until it is known what the file has become
+    bool is_ours = false;
+    const timespec time = status.st_mtim;
     if (replace_content(file.get(), content, mark) && make_later(file.get(), time, status) &&
-        sync_content(file.get()) && file.close()) {
-        return;
+        is_content(file.get(), content, is_ours)) {
+        if (!is_ours) {
+            raise_changed();
+        }
+        if (sync_content(file.get()) && file.close()) {
+            return;
+        }
     }
     const int error = errno;
     const int put_back_to = file ? file.get() : lock_.get();
@@ -233,4 +238,20 @@ void LDIF_File::overwrite(unique_fd file, struct stat& status, const std::string
         name_file_and_errno(second_error)(*e.cause);
     }
     throw e;
+}
+
+/// Takes room for a text of that size; returns what the file holds.
+std::string LDIF_File::reserved(int file, const struct stat& status, size_t size) {
+    std::string before;
+    struct stat now;
+    if (!read_all(file, static_cast<size_t>(status.st_size), before) || fstat(file, &now) != 0) {
+        raise_with(not_written, {}, name_file_and_errno(errno));
+    }
+    if (!is_same_version(now, status)) {
+        raise_changed();
+    }
+    if (!reserve(file, before.size(), size)) {
+        raise_with(not_written, {}, name_file_and_errno(errno));
+    }
+    return before;
 }

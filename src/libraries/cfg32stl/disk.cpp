@@ -6,6 +6,7 @@
 #include <unistd.h>
 
 #include <algorithm>
+#include <array>
 #include <cerrno>
 #include <chrono>
 #include <thread>
@@ -19,6 +20,7 @@ namespace {
 using namespace std::chrono_literals;
 
 constexpr size_t read_ahead = 4096;
+constexpr size_t compared_at_once = 16384;
 
 bool write_all(int file, std::string_view text, size_t offset) {
     while (!text.empty()) {
@@ -157,12 +159,31 @@ bool reserve(int file, size_t present, size_t wanted) {
 bool replace_content(int file, std::string_view text, std::string_view mark) {
     // The mark, and what takes its place, is less than the system writes at once: it is there, or
     // it isn't. Blank lines fill the place when the text is shorter.
-    std::string head(text.substr(0, mark.size()));
-    head.resize(mark.size(), '\n');
-    const std::string_view rest = text.substr(std::min(text.size(), mark.size()));
-    return write_all(file, mark, 0) && write_all(file, rest, mark.size()) &&
-           resize(file, std::max(text.size(), mark.size())) && write_all(file, head, 0) &&
-           (text.size() >= mark.size() || resize(file, text.size()));
+    std::array<char, longest_mark> head;
+    head.fill('\n');
+    const size_t place = std::min(mark.size(), head.size());
+    const size_t shared = std::min(text.size(), place);
+    text.copy(head.data(), shared);
+    return write_all(file, mark, 0) && write_all(file, text.substr(shared), place) &&
+           resize(file, std::max(text.size(), place)) && write_all(file, {head.data(), place}, 0) &&
+           (text.size() >= place || resize(file, text.size()));
+}
+
+bool is_content(int file, std::string_view text, bool& is_so) {
+    std::array<char, compared_at_once> part;  // no memory is asked for, which might not be there
+    size_t offset = 0;
+    for (is_so = true; is_so;) {
+        const ssize_t count = retry_interrupted(
+            [&] { return pread(file, part.data(), part.size(), static_cast<off_t>(offset)); });
+        if (count <= 0) {
+            is_so = offset == text.size();
+            return count == 0;
+        }
+        const std::string_view expected = text.substr(offset, static_cast<size_t>(count));
+        is_so = std::string_view(part.data(), static_cast<size_t>(count)) == expected;
+        offset += static_cast<size_t>(count);
+    }
+    return true;
 }
 
 bool sync_content(int file) {

@@ -21,9 +21,15 @@ std::string first_bytes(int file, size_t count);
 /// After a failure the file is what it was.
 bool reserve(int file, size_t present, size_t wanted);
 
+/// Marks are not longer than this.
+inline constexpr size_t longest_mark = 128;
+
 /// Makes the text the file's whole content. Until it is complete the file begins with the mark, if
 /// there is one.
 bool replace_content(int file, std::string_view text, std::string_view mark = {});
+
+/// Tells whether the text is the file's whole content.
+bool is_content(int file, std::string_view text, bool& is_so);
 
 /// Makes the file's modification time a later one than `before`, if it isn't; of a file of somebody
 /// else, another one. Takes the status.

@@ -102,6 +102,18 @@ bool copy_content(int from, int to) {
     }
 }
 
+// A source that was written to meanwhile may have been copied in half.
+bool is_unchanged(int fd, const struct stat& before) {
+    struct stat now;
+    if (::fstat(fd, &now) != 0) {
+        return false;
+    }
+    const bool same = now.st_size == before.st_size &&
+                      now.st_mtim.tv_sec == before.st_mtim.tv_sec &&
+                      now.st_mtim.tv_nsec == before.st_mtim.tv_nsec;
+    return same || fail(EAGAIN);
+}
+
 // In the permission bits of a file with an access control list, the group's are the list's mask:
 // what any of those whom it names may do at most, and not what the group may (acl(5)).
 mode_t without_mask(int from, mode_t mode) {
@@ -181,7 +193,7 @@ bool copy_file(const char* source, const char* target, const char* owner, const 
     }
 
     temporary_file copy(directory.get());
-    if (!copy || !copy_content(from.get(), copy.fd())) {
+    if (!copy || !copy_content(from.get(), copy.fd()) || !is_unchanged(from.get(), source_status)) {
         return false;
     }
     mode = keep_unnamed(copy.fd(), source_status, owner == nullptr, group == nullptr, mode);
