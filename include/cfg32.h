@@ -37,10 +37,10 @@
  *     found and kept in their own way (see cfg_bind_s()) and for what is said of codes 80 and 91
  *     at cfg_modify_s(). This handle's copy in memory is not rolled back: what was carried out
  *     before the refusal (earlier modifications, earlier values of a deletion), and a change that
- *     failed before the file was touched (no backup, no permission, no room), is seen by its
- *     searches and written with its next change. The copy is dropped, and read again, when the
- *     failure came later, when the text could not be made, and when somebody else changes the
- *     file; to drop it yourself, unbind.
+ *     failed before the file was touched (no backup, no permission), is seen by its searches and
+ *     written with its next change; one that failed for lack of room may be. The copy is dropped,
+ *     and read again, when the failure came later, when the text could not be made, and when
+ *     somebody else changes the file; to drop it yourself, unbind.
  *  6. Many programs. Every program that uses this library sees the changes of the others at its
  *     next call, and no change is lost when several make one at the same time: each keeps the
  *     others away (flock(2) on the file itself) while it changes the file, and while it reads it. A

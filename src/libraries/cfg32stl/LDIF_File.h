@@ -103,7 +103,7 @@ class LDIF_File {
     cfg32::locked_file locked(int flags, int operation) const;
     cfg32::locked_file locked_for_reading();
     [[noreturn]] void raise_changed();
-    void require_finished(std::string_view text) const;
+    void require_finished(std::string_view text);
     int authenticate(const char* dn, const char* password, int method) const;
     std::string text() const;
     void back_up(bool is_refreshed);
@@ -113,7 +113,6 @@ class LDIF_File {
     void overwrite(cfg32::unique_fd file, struct stat& status, const std::string& content);
     std::string reserved(int file, const struct stat& status, size_t size);
     void require_own(const struct stat& status, bool is_refreshed);
-    void require_complete(bool is_refreshed);
 
     // What is filled in of a failure.
     void name_file(LDIF_Exception& e) const { e.configFile = file_name_; }

@@ -1,6 +1,5 @@
 // Drawing the tree of entries as text.
 
-#include <iterator>
 #include <utility>
 #include <vector>
 

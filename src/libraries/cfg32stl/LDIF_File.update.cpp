@@ -54,8 +54,9 @@ void LDIF_File::raise_changed() {
 }
 
 /// Throws when a writer did not come to the end of the text.
-void LDIF_File::require_finished(std::string_view text) const {
+void LDIF_File::require_finished(std::string_view text) {
     if (text.starts_with(unfinished_mark)) {
+        is_loaded_ = false;
         raise_with(unfinished, {}, name_file_and_errno(0));
     }
 }

@@ -94,7 +94,6 @@ void LDIF_File::flush() {
         const bool is_refreshed = is_updated_;
         const update lock(*this);
         if (!backup_file_name_.empty()) {
-            with_context([&] { require_complete(is_refreshed); }, forgetting);
             back_up(is_refreshed);
         }
         write(content, is_refreshed);
@@ -124,27 +123,32 @@ std::string LDIF_File::text() const {
     return out;
 }
 
+/// The backup is replaced by nothing but a complete version of the file that is to be changed.
 void LDIF_File::back_up(bool is_refreshed) {
     // Not the remembered status: what was changed meanwhile is still to be noticed.
     struct stat status;
-    if (stat(file_name_.c_str(), &status) != 0) {
+    const char* name = file_name_.c_str();
+    if (stat(name, &status) != 0) {
         raise_with(no_status_for_backup, {}, name_file_and_errno(errno));
+    }
+    if (lock_) {
+        require_finished(first_bytes(lock_.get(), unfinished_mark.size()));
+        require_own(status, is_refreshed);
     }
     char owner_buffer[name_buffer_size];
     char group_buffer[name_buffer_size];
     const char* owner = owner_name(status.st_uid, owner_buffer);
     const char* group = group_name(status.st_gid, group_buffer);
     errno = lock_error_;
-    if (!lock_ ||
-        !copyFile(file_name_.c_str(), backup_file_name_.c_str(), owner, group, status.st_mode)) {
-        const int error = errno;
-        if (lock_ && stat(file_name_.c_str(), &status) == 0) {
-            require_own(status, is_refreshed);  // a copy of what is being written is none
-        }
-        raise_with(no_backup,
-                   formatted("Unable to backup the configuration file: \"%s\" ", file_name_),
-                   name_file_and_errno(error));
+    if (lock_ && copyFile(name, backup_file_name_.c_str(), owner, group, status.st_mode)) {
+        return;
     }
+    const int error = errno;
+    if (lock_ && stat(name, &status) == 0) {
+        require_own(status, is_refreshed);  // a copy of what is being written is none
+    }
+    raise_with(no_backup, formatted("Unable to backup the configuration file: \"%s\" ", file_name_),
+               name_file_and_errno(error));
 }
 
 /// Makes content the file's, in place: links to it, its owner and its mode stay.
@@ -169,15 +173,6 @@ void LDIF_File::write(const std::string& content, bool is_refreshed) {
 void LDIF_File::require_own(const struct stat& status, bool is_refreshed) {
     if (!is_same_file(status, lock_.status()) || (is_refreshed && !is_current(status))) {
         raise_changed();
-    }
-}
-
-/// The same before the backup is made: it is replaced by nothing but a complete version.
-void LDIF_File::require_complete(bool is_refreshed) {
-    struct stat status;
-    if (lock_ && stat(file_name_.c_str(), &status) == 0) {
-        require_finished(first_bytes(lock_.get(), unfinished_mark.size()));
-        require_own(status, is_refreshed);
     }
 }
 
