@@ -1,0 +1,108 @@
+// How a command ends when it is not simply done.
+
+#include "outcome.h"
+
+#include <fmt/format.h>
+
+#include <cstring>
+
+#include "LDIF_AttrType.h"
+#include "LDIF_Exception.h"
+#include "attribute_words.h"
+#include "cfg32.h"
+#include "secret.h"
+
+namespace cfg32::tool {
+
+namespace {
+
+/// What is known of a failure.
+struct facts {
+    std::string file;
+    int line = 0;
+    std::string message;
+    int system_error = 0;
+    int code = 0;
+    std::string entry;
+    std::string attribute;
+    std::string value;
+    const _AttrType* violated = nullptr;
+};
+
+void append_line(std::string& text, std::string_view label, std::string_view what) {
+    if (!what.empty()) {
+        text += fmt::format("\n  {}: {}", label, what);
+    }
+}
+
+std::string told(const facts& known) {
+    std::string text;
+    if (!known.file.empty()) {
+        text = known.line > 0 ? fmt::format("{}:{}: ", known.file, known.line) : known.file + ": ";
+    }
+    text +=
+        with_result(known.message.empty() ? cfg_err2string(known.code) : known.message, known.code);
+    if (known.system_error != 0) {
+        append_line(text, "system error", strerror(known.system_error));
+    }
+    append_line(text, "entry", known.entry);
+    if (!known.attribute.empty()) {
+        append_line(text, known.attribute, shown_value(known.attribute, known.value));
+    }
+    if (known.violated && known.violated->name) {
+        append_line(text, "accepted", accepted_values(*known.violated));
+    }
+    return text;
+}
+
+/// The innermost cause has the message that says most.
+const LDIF_Exception& innermost(const LDIF_Exception& e) {
+    const LDIF_Exception* inner = &e;
+    while (inner->cause) {
+        inner = inner->cause.get();
+    }
+    return *inner;
+}
+
+}  // namespace
+
+ended::ended(exit_status status, std::string message)
+    : status_(status), message_(std::move(message)) {}
+
+std::string with_result(std::string_view text, int code) {
+    return fmt::format("{} [{} ({})]", text, cfg_err2string(code), code);
+}
+
+void fail(int code, std::string_view text) { throw ended(failed, with_result(text, code)); }
+
+std::string report(const LDIF_Exception& e, std::string_view file_name) {
+    facts known;
+    known.file = file_name.empty() ? e.configFile : file_name;
+    known.line = e.configLine;
+    known.message = innermost(e).msg;
+    known.system_error = e.sysErrno;
+    known.code = e.ldapErr;
+    known.entry = e.entryDn;
+    known.attribute = e.attribute;
+    known.value = e.value;
+    known.violated = e.attrType;
+    return told(known);
+}
+
+void fail(CfgHandle* handle, int code, std::string_view file_name) {
+    facts known;
+    known.file = file_name;
+    known.code = code;
+    const int extended = cfg_get_exterror(handle);
+    known.message = cfg_err2string(extended != 0 ? extended : code);
+    if (cfg_dump_exception(handle)) {
+        known.line = cfg_get_file_line(handle);
+        known.entry = cfg_get_entry(handle);
+        known.attribute = cfg_get_attribute(handle) ? cfg_get_attribute(handle) : "";
+        known.value = cfg_get_value(handle);
+        known.violated = find_attribute(known.attribute);
+    }
+    throw ended(failed, told(known));
+}
+
+}  // namespace cfg32::tool

@@ -1,0 +1,75 @@
+// What follows from the options that every command shares.
+
+#include "settings.h"
+
+#include <cerrno>
+#include <cstring>
+#include <fstream>
+#include <memory>
+
+#include "cfg32.h"
+#include "cfg32_platform.h"
+#include "outcome.h"
+#include "terminal.h"
+
+namespace cfg32::tool {
+
+namespace {
+
+/// The first line of a file, which one ends with or without a newline.
+secret first_line(const std::string& name) {
+    std::ifstream file(name);
+    std::string line;
+    if (!file || !(std::getline(file, line) || file.eof())) {
+        throw ended(usage_error, name + ": " + strerror(errno));
+    }
+    secret text(line);
+    wipe(line);
+    return text;
+}
+
+/// The server's own configuration file.
+std::string default_file_name() {
+    const std::unique_ptr<CfgHandle, int (*)(CfgHandle*)> handle(cfg_init(), cfg_unbind);
+    const char* name = cfg_get_file_name(handle.get());
+    if (!name) {
+        throw ended(usage_error, "where the server is installed is not known: name a file with -f");
+    }
+    return name;
+}
+
+}  // namespace
+
+std::string settings::file_name() const { return file.empty() ? default_file_name() : file; }
+
+std::string settings::backup_name() const {
+    return has_no_backup ? "" : backup_option.empty() ? file_name() + ".bak" : backup_option;
+}
+
+secret settings::bind_password() const {
+    if (asks_password) {
+        return ask_secret("Password of " + bind_dn + ": ");
+    }
+    if (password_file.empty()) {
+        throw ended(usage_error, "-D needs a password: add -W or -y FILE");
+    }
+    return first_line(password_file);
+}
+
+key::key(const settings& options) {
+    if (options.key_file.empty()) {
+        return;
+    }
+    data_ = aes_key_data_from_file(options.key_file.c_str());
+    if (!data_) {
+        const int error = errno;
+        throw ended(failed, options.key_file + ": " +
+                                (error == EACCES   ? "a key file that others can read is not used"
+                                 : error == EINVAL ? "a key file holds 16, 24 or 32 bytes"
+                                                   : strerror(error)));
+    }
+}
+
+key::~key() { aes_key_data_free(data_); }
+
+}  // namespace cfg32::tool

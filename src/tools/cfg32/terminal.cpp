@@ -1,0 +1,107 @@
+// What differs between a person at a terminal and a program in a pipe.
+
+#include "terminal.h"
+
+#include <bsd/readpassphrase.h>
+#include <unistd.h>
+
+#include <array>
+#include <chrono>
+#include <cstdio>
+#include <cstdlib>
+#include <iostream>
+
+#include "cfg32_platform.h"
+#include "outcome.h"
+
+namespace cfg32::tool {
+
+namespace {
+
+using namespace std::chrono_literals;
+
+color_choice chosen = color_choice::automatic;
+
+/// NO_COLOR says the same as --color=never, which an explicit --color=always overrides.
+bool is_coloured(std::FILE* stream) {
+    if (chosen != color_choice::automatic) {
+        return chosen == color_choice::always;
+    }
+    const char* no_color = getenv("NO_COLOR");
+    const char* terminal = getenv("TERM");
+    return isatty(fileno(stream)) && !(no_color && *no_color) &&
+           !(terminal && std::string_view(terminal) == "dumb");
+}
+
+/// From when on, and how often, it is said what is being done.
+constexpr auto patience = 1s;
+
+}  // namespace
+
+void choose_color(color_choice choice) { chosen = choice; }
+
+std::string styled(std::FILE* stream, const fmt::text_style& style, std::string_view text) {
+    return is_coloured(stream) ? fmt::format(style, "{}", text) : std::string(text);
+}
+
+void complain(std::string_view message) {
+    fmt::print(stderr, "{} {}\n", styled(stderr, style::error, "cfg32:"), message);
+}
+
+secret ask_secret(const std::string& prompt) {
+    std::array<char, CFG32_PASSWORD_MAX + 2> buffer{};
+    const bool is_given = readpassphrase(prompt.c_str(), buffer.data(), buffer.size(), 0);
+    secret text(is_given ? std::string_view(buffer.data()) : std::string_view());
+    explicit_bzero(buffer.data(), buffer.size());
+    if (!is_given) {
+        throw ended(failed, "no password was given");
+    }
+    return text;
+}
+
+char ask(const std::string& question, std::string_view letters) {
+    for (;;) {
+        fmt::print(stderr, "{} ", question);
+        fflush(stderr);
+        std::string answer;
+        if (!std::getline(std::cin, answer)) {
+            fmt::print(stderr, "\n");
+            return letters.back();
+        }
+        if (answer.size() == 1 && letters.find(answer.front()) != std::string_view::npos) {
+            return answer.front();
+        }
+    }
+}
+
+progress::progress(std::string what) : what_(std::move(what)) {
+    if (isatty(STDERR_FILENO)) {
+        thread_ = std::thread([this] { show(); });
+    }
+}
+
+progress::~progress() {
+    if (thread_.joinable()) {
+        {
+            const std::scoped_lock lock(mutex_);
+            is_over_ = true;
+        }
+        ended_.notify_one();
+        thread_.join();
+    }
+}
+
+void progress::show() {
+    std::unique_lock lock(mutex_);
+    int seconds = 0;
+    while (!ended_.wait_for(lock, patience, [this] { return is_over_; })) {
+        fmt::print(stderr, "\r{} ... {} s", what_, ++seconds);
+        fflush(stderr);
+    }
+    if (seconds > 0) {
+        fmt::print(stderr, "\r\033[K");  // the line is for the result
+        fflush(stderr);
+    }
+}
+
+}  // namespace cfg32::tool
