@@ -61,6 +61,13 @@ class LDIF_File {
     /// made, or would not read back (21/1005), is forgotten: the next refresh() reads the file.
     void flush();
 
+    /// Puts a text in the place of the file's, whatever that is, in the way of flush(): under the
+    /// lock, after a backup, in place. expected is what the file holds; if it holds something else,
+    /// or changes meanwhile, that is 51/51 and nothing is written. A file that was not written to
+    /// its end is not backed up, because its backup is the complete version.
+    static void replace(const std::string& fileName, const std::string& backupFileName,
+                        const std::string& content, const std::string& expected);
+
     /// Changes an entry's attributes. Modifications before one that is refused stay applied.
     /// Throws 32/32 when there is no such entry, 16/16 when there is no attribute to delete,
     /// 19/1006 for a second value of a single-valued attribute, 89/1010 for an unknown operation,
@@ -98,6 +105,10 @@ class LDIF_File {
     const LDIF_Comment& trailing_comment() const { return trailing_comment_; }
 
   private:
+    struct not_loaded {};
+    LDIF_File(const std::string& fileName, const std::string& backupFileName, not_loaded)
+        : file_name_(fileName), backup_file_name_(backupFileName), key_(nullptr) {}
+
     bool is_current(const struct stat& status) const;
     bool load_if_changed();
     cfg32::locked_file locked(int flags, int operation) const;
@@ -108,6 +119,8 @@ class LDIF_File {
     std::string text() const;
     void back_up(bool is_refreshed);
     void write(const std::string& content, bool is_refreshed);
+    void replace_content_of(const std::string& expected, const std::string& content);
+    std::string locked_content();
     cfg32::unique_fd open_for_writing(struct stat& status);
     void create();
     void overwrite(cfg32::unique_fd file, struct stat& status, const std::string& content);

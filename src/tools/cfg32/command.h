@@ -5,7 +5,11 @@
 
 #include <functional>
 #include <span>
+#include <string>
+#include <utility>
+#include <vector>
 
+#include "outcome.h"
 #include "settings.h"
 
 namespace CLI {

@@ -2,11 +2,11 @@
 
 #include <sys/prctl.h>
 
-#include <CLI/CLI.hpp>
 #include <clocale>
 #include <cstdio>
 
 #include "LDIF_Exception.h"
+#include "choice_option.h"
 #include "command.h"
 #include "outcome.h"
 #include "terminal.h"
@@ -22,33 +22,45 @@ void keep_memory_private() {
 #endif
 }
 
+/// Help without the rules that tie options together: the descriptions tell them.
+class plain_help : public CLI::Formatter {
+  public:
+    std::string make_option_opts(const CLI::Option* option) const override {
+        const std::string type = option->get_type_name();
+        return type.empty() ? "" : " " + type;
+    }
+};
+
+constexpr const char* shared_options = "Options of every command";
+
 void add_shared_options(CLI::App& parser, settings& options) {
-    const auto group = parser.add_option_group("Options of every command");
-    group->add_option("-f,--file", options.file, "the configuration file; else the server's own")
-        ->type_name("FILE");
-    const auto dn = group->add_option("-D,--bind-dn", options.bind_dn,
-                                      "bind as this administrator; else anonymously");
-    const auto prompt = group->add_flag("-W,--ask-password", options.asks_password,
-                                        "ask for the administrator's password");
-    const auto file = group->add_option("-y,--password-file", options.password_file,
-                                        "read that password from the first line of a file");
-    group->add_option("--key-file", options.key_file, "the key of encoded passwords")
-        ->type_name("FILE");
-    const auto backup = group
-                            ->add_option("--backup", options.backup_option,
-                                         "where a change puts the file of before; else FILE.bak")
-                            ->type_name("FILE");
-    group->add_flag("--no-backup", options.has_no_backup, "make no backup")->excludes(backup);
-    dn->type_name("DN");
-    file->type_name("FILE");
+    const auto add = [&](const char* names, std::string& value, const char* type,
+                         const char* description) {
+        return parser.add_option(names, value, description)->type_name(type)->group(shared_options);
+    };
+    add("-f,--file", options.file, "FILE", "the configuration file; else the server's own");
+    const auto dn =
+        add("-D,--bind-dn", options.bind_dn, "DN", "bind as the administrator; else anonymously");
+    const auto prompt =
+        parser
+            .add_flag("-W,--ask-password", options.asks_password, "with -D: ask for the password")
+            ->group(shared_options);
+    const auto file = add("-y,--password-file", options.password_file, "FILE",
+                          "with -D: the password is the first line of a file");
+    add("--key-file", options.key_file, "FILE", "the key of encoded passwords");
+    const auto backup = add("--backup", options.backup_option, "FILE",
+                            "where a change puts the file of before; else FILE.bak");
+    parser.add_flag("--no-backup", options.has_no_backup, "make no backup")
+        ->group(shared_options)
+        ->excludes(backup);
     prompt->needs(dn)->excludes(file);
     file->needs(dn);
-    const std::map<std::string, color_choice> choices = {{"auto", color_choice::automatic},
-                                                         {"always", color_choice::always},
-                                                         {"never", color_choice::never}};
-    group->add_option("--color", options.color, "auto, always or never; NO_COLOR is respected")
-        ->type_name("WHEN")
-        ->transform(CLI::Transformer(choices));
+    add_choice<color_choice>(parser, "--color", options.color,
+                             {{"auto", color_choice::automatic},
+                              {"always", color_choice::always},
+                              {"never", color_choice::never}},
+                             "else auto, which respects NO_COLOR")
+        ->group(shared_options);
 }
 
 /// Runs a command; tells what ends it.
@@ -86,6 +98,7 @@ int main(int argc, char** argv) {
                     "cfg32");
     parser.require_subcommand(1);
     parser.set_version_flag("--version", "cfg32 " CFG32_VERSION);
+    parser.formatter(std::make_shared<plain_help>());
     add_shared_options(parser, options);
     for (const command& row : commands()) {
         CLI::App* sub = parser.add_subcommand(row.name, row.summary)->fallthrough();

@@ -70,7 +70,9 @@ ended::ended(exit_status status, std::string message)
     : status_(status), message_(std::move(message)) {}
 
 std::string with_result(std::string_view text, int code) {
-    return fmt::format("{} [{} ({})]", text, cfg_err2string(code), code);
+    const std::string_view result = cfg_err2string(code);
+    return text.ends_with(result) ? fmt::format("{} ({})", text, code)
+                                  : fmt::format("{} [{} ({})]", text, result, code);
 }
 
 void fail(int code, std::string_view text) { throw ended(failed, with_result(text, code)); }

@@ -31,7 +31,7 @@ class ended : public std::exception {
     std::string message_;
 };
 
-/// "<text> [<the result's name> (<code>)]"
+/// "<text> [<the result's name> (<code>)]", without repeating a name that the text ends with.
 std::string with_result(std::string_view text, int code);
 
 /// Ends the command with an LDAP result.

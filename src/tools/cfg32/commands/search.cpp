@@ -1,0 +1,104 @@
+// cfg32 search: prints entries.
+
+#include <fmt/format.h>
+
+#include <algorithm>
+#include <nlohmann/json.hpp>
+
+#include "cfg32.h"
+#include "choice_option.h"
+#include "command.h"
+#include "configuration.h"
+#include "json_text.h"
+#include "ldif_writer.h"
+
+namespace cfg32::tool {
+
+namespace {
+
+struct arguments {
+    std::string base = "cn=Configuration";
+    int scope = CFG_SCOPE_SUBTREE;
+    std::string filter;
+    std::vector<std::string> attributes;
+    bool is_not_wrapped = false;
+};
+
+/// In a list of wanted attributes (RFC 4511, 4.5.1.8). Its other one, 1.1, is the name of none.
+constexpr const char* every_attribute = "*";
+
+bool is_wanted(const arguments& given, const attribute& found) {
+    const auto means = [&](const std::string& name) {
+        return name == every_attribute || cisString(name) == found.name;
+    };
+    return given.attributes.empty() ||
+           std::any_of(given.attributes.begin(), given.attributes.end(), means);
+}
+
+/// A first word that can't be a filter is the first of the attributes.
+void tell_filter_from_attribute(arguments& given) {
+    if (!given.filter.empty() && given.filter.find_first_of("=(") == std::string::npos) {
+        given.attributes.insert(given.attributes.begin(), std::exchange(given.filter, {}));
+    }
+}
+
+/// Without a filter every entry is meant, also one without an objectclass.
+std::vector<entry> found_entries(const configuration& file, const arguments& given) {
+    std::vector<entry> entries = given.filter.empty()
+                                     ? entries_below(file.entry_at(given.base), given.scope)
+                                     : file.search(given.base, given.scope, given.filter);
+    for (entry& found : entries) {
+        std::erase_if(found.attributes,
+                      [&](const attribute& each) { return !is_wanted(given, each); });
+    }
+    return entries;
+}
+
+void print_as_json(const configuration& file, const std::vector<entry>& entries) {
+    json list = json::array();
+    for (const entry& found : entries) {
+        list.push_back(json_of(found));
+    }
+    print_json({{"file", utf8(file.name())},
+                {"entries", std::move(list)},
+                {"leftOut", json_of(file.left_out())}});
+}
+
+int search(const settings& options, const arguments& given) {
+    const configuration file(options);
+    const std::vector<entry> entries = found_entries(file, given);
+    if (options.is_json) {
+        print_as_json(file, entries);
+    } else {
+        for (const entry& found : entries) {
+            fmt::print("{}", ldif(found, !given.is_not_wrapped));
+        }
+    }
+    return entries.empty() ? answer_is_no : done;
+}
+
+}  // namespace
+
+action define_search(CLI::App& parser, settings& options) {
+    const auto given = std::make_shared<arguments>();
+    parser.add_option("-b,--base", given->base, "where to begin; else cn=Configuration")
+        ->type_name("DN");
+    add_choice<int>(
+        parser, "-s,--scope", given->scope,
+        {{"base", CFG_SCOPE_BASE}, {"one", CFG_SCOPE_ONELEVEL}, {"sub", CFG_SCOPE_SUBTREE}},
+        "that entry, those directly below it, or all from it on; else sub");
+    parser.add_flag("--no-wrap", given->is_not_wrapped, "don't fold long lines");
+    parser
+        .add_option("filter", given->filter,
+                    "attribute=value, or attribute=* for any value; else every entry")
+        ->type_name("FILTER");
+    parser.add_option("attributes", given->attributes, "the attributes to print; else all")
+        ->type_name("ATTR");
+    add_json_option(parser, options);
+    return [given, &options] {
+        tell_filter_from_attribute(*given);
+        return search(options, *given);
+    };
+}
+
+}  // namespace cfg32::tool

@@ -1,0 +1,152 @@
+// Reading a configuration, also a broken one, without ever changing it.
+
+#include "configuration.h"
+
+#include <fmt/format.h>
+
+#include <algorithm>
+
+#include "LDIF_File.h"
+#include "cfg32.h"
+#include "handle.h"
+#include "outcome.h"
+#include "terminal.h"
+
+namespace cfg32::tool {
+
+namespace {
+
+using result_nodes = std::unique_ptr<CfgMessage, int (*)(CfgMessage*)>;
+using text_of_library = std::unique_ptr<char, void (*)(void*)>;
+
+entry entry_of(CfgHandle* handle, CfgMessage* node) {
+    const text_of_library dn(cfg_get_dn(handle, node), cfg_memfree);
+    entry read{dn ? dn.get() : "", {}};
+    CfgCursor* cursor = nullptr;
+    text_of_library name(cfg_first_attribute(handle, node, &cursor), cfg_memfree);
+    const std::unique_ptr<CfgCursor, void (*)(CfgCursor*)> owner(cursor, cfg_ber_free);
+    for (; name; name.reset(cfg_next_attribute(handle, node, cursor))) {
+        const std::unique_ptr<char*, void (*)(char**)> values(
+            cfg_get_values(handle, node, name.get()), cfg_value_free);
+        attribute& added = read.attributes.emplace_back(attribute{name.get(), {}});
+        for (char** value = values.get(); value && *value; ++value) {
+            added.values.emplace_back(*value);
+        }
+    }
+    return read;
+}
+
+bool is_read_differently(const problem& found) {
+    return found.broken->outcome != consequence::none;
+}
+
+}  // namespace
+
+configuration::configuration(const settings& options, std::string file_name)
+    : name_(std::move(file_name)),
+      text_(read_configuration(name_)),
+      key_(options),
+      copy_(text_),
+      handle_(cfg_init(), cfg_unbind) {
+    const progress loading("Loading " + name_);
+    cfg_set_option(handle_.get(), CFG_OPT_KEY_DATA, key_.get());
+    cfg_set_option(handle_.get(), CFG_OPT_CONFIG_FILE, copy_.name().c_str());
+    if (cfg_bind_s(handle_.get(), nullptr, nullptr, CFG_AUTH_SIMPLE) != CFG_SUCCESS) {
+        load_part();
+    } else if (copy_.text() != text_) {
+        note_left_out();
+    }
+    if (options.bind_dn.empty()) {
+        return;
+    }
+    const secret password = options.bind_password();
+    const int code =
+        cfg_bind_s(handle_.get(), options.bind_dn.c_str(), password.c_str(), CFG_AUTH_SIMPLE);
+    if (code != CFG_SUCCESS) {
+        fail(handle_.get(), code, name_);
+    }
+}
+
+/// Loads what can be loaded of a file that as a whole can't.
+void configuration::load_part() {
+    note_left_out();
+    copy_ = memory_file(loadable_part(text_, left_out_));
+    cfg_set_option(handle_.get(), CFG_OPT_CONFIG_FILE, copy_.name().c_str());
+    const int code = cfg_bind_s(handle_.get(), nullptr, nullptr, CFG_AUTH_SIMPLE);
+    if (code != CFG_SUCCESS) {
+        fail(handle_.get(), code, name_);
+    }
+}
+
+void configuration::note_left_out() {
+    left_out_ = find_problems(text_, key_.get());
+    std::erase_if(left_out_, [](const problem& found) { return !is_read_differently(found); });
+    complain(name_ +
+             ": read from a private copy, because not all of it can be used (`cfg32 check` "
+             "tells more):");
+    for (const problem& found : left_out_) {
+        const bool is_kept = found.broken->outcome == consequence::kept_aside;
+        fmt::print(stderr, "{}:{}: {}, {}\n", name_, found.line, found.text,
+                   is_kept ? "kept as oru-slapdInvalidLine" : "left out");
+    }
+}
+
+std::vector<entry> configuration::search(const std::string& base, int scope,
+                                         const std::string& filter) const {
+    CfgMessage* found = nullptr;
+    // Without names of attributes passwords come as they are stored.
+    const int code =
+        cfg_search_s(handle_.get(), base.c_str(), scope, filter.c_str(), nullptr, 0, &found);
+    const result_nodes owner(found, cfg_msgfree);
+    if (code == CFG_NO_SUCH_OBJECT) {
+        throw ended(answer_is_no, with_result(name_ + ": no entry " + base, code));
+    }
+    if (code != CFG_SUCCESS) {
+        fail(handle_.get(), code, name_);
+    }
+    std::vector<entry> entries;
+    for (CfgMessage* node = found; node; node = cfg_next_entry(handle_.get(), node)) {
+        entries.push_back(entry_of(handle_.get(), node));
+    }
+    return entries;
+}
+
+const LDIF_Entry& configuration::root() const { return handle_->file->root(); }
+
+const LDIF_Entry& configuration::entry_at(const std::string& dn) const {
+    const LDIF_Entry* found = root().find(LDIF_DN(cisString(dn)));
+    if (!found) {
+        throw ended(answer_is_no, with_result(name_ + ": no entry " + dn, CFG_NO_SUCH_OBJECT));
+    }
+    return *found;
+}
+
+entry entry_of(const LDIF_Entry& node) {
+    entry read{shown(node.dn()), {}};
+    for (const LDIF_Attribute& each : node.attributes()) {
+        attribute& added = read.attributes.emplace_back(attribute{each.name().text(), {}});
+        for (const LDIF_Value& value : each.values()) {
+            added.values.push_back(value.str());
+        }
+    }
+    return read;
+}
+
+std::vector<entry> entries_below(const LDIF_Entry& base, int scope) {
+    std::vector<entry> entries;
+    const auto add = [&](const LDIF_Entry& node) {
+        if (!node.is_root()) {
+            entries.push_back(entry_of(node));
+        }
+    };
+    if (scope == CFG_SCOPE_SUBTREE) {
+        for_each_in_preorder(base, add);
+    } else if (scope == CFG_SCOPE_BASE) {
+        add(base);
+    } else {
+        std::for_each(base.children().begin(), base.children().end(), add);
+    }
+    return entries;
+}
+
+}  // namespace cfg32::tool

@@ -1,0 +1,60 @@
+#pragma once
+
+#include <memory>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include "LDIF_Entry.h"
+#include "entry.h"
+#include "memory_file.h"
+#include "problem.h"
+#include "settings.h"
+
+struct CfgHandle;
+
+namespace cfg32::tool {
+
+/// A configuration file that is read. It is loaded from a private copy of its text, so that it is
+/// never rewritten, and what would stop a load is left out of the copy, so that a broken file can
+/// be read as far as it goes. Both are told on standard error.
+class configuration {
+  public:
+    /// Binds with the options' credentials. Ends the command when the file can't be read.
+    configuration(const settings& options, std::string file_name);
+    explicit configuration(const settings& options) : configuration(options, options.file_name()) {}
+
+    const std::string& name() const { return name_; }
+    const std::string& text() const { return text_; }
+
+    /// What a load would not have taken, or not as it stands.
+    const std::vector<problem>& left_out() const { return left_out_; }
+
+    /// The entries that a filter (RFC 4515, simple) matches. Ends the command when the base is not
+    /// there, or the filter can't be used.
+    std::vector<entry> search(const std::string& base, int scope, const std::string& filter) const;
+
+    /// The tree itself, also of entries that no filter finds.
+    const LDIF_Entry& root() const;
+    /// The entry of that DN; ends the command with "not found" (1) when it is not there.
+    const LDIF_Entry& entry_at(const std::string& dn) const;
+
+  private:
+    void load_part();
+    void note_left_out();
+
+    std::string name_;
+    std::string text_;
+    key key_;
+    memory_file copy_;
+    std::unique_ptr<CfgHandle, int (*)(CfgHandle*)> handle_;
+    std::vector<problem> left_out_;
+};
+
+/// An entry's printable form.
+entry entry_of(const LDIF_Entry& node);
+
+/// The entries at and below one, as the scope has them.
+std::vector<entry> entries_below(const LDIF_Entry& base, int scope);
+
+}  // namespace cfg32::tool

@@ -1,0 +1,58 @@
+// A configuration's text, from the disk and in memory.
+
+#include "memory_file.h"
+
+#include <fmt/format.h>
+#include <sys/mman.h>
+
+#include <cerrno>
+#include <cstring>
+
+#include "cfg32.h"
+#include "disk.h"
+#include "file_lock.h"
+#include "outcome.h"
+#include "terminal.h"
+
+namespace cfg32::tool {
+
+namespace {
+
+[[noreturn]] void fail_with_errno(const std::string& name, int code) {
+    const int error = errno;
+    fail(code, name + ": " + strerror(error));
+}
+
+std::string content_of(int file, size_t expected, const std::string& name) {
+    std::string text;
+    if (!read_all(file, expected, text)) {
+        fail_with_errno(name, CFG_OTHER);
+    }
+    return text;
+}
+
+}  // namespace
+
+memory_file::memory_file(std::string_view text)
+    : file_(memfd_create("configuration", MFD_CLOEXEC)),
+      name_(fmt::format("/proc/self/fd/{}", file_.get())) {
+    if (!file_ || !replace_content(file_.get(), text)) {
+        fail_with_errno("a private copy in memory", CFG_OTHER);
+    }
+}
+
+std::string memory_file::text() const { return content_of(file_.get(), 0, name_); }
+
+std::string read_configuration(const std::string& name) {
+    const progress reading("Reading " + name);
+    const locked_file file(name.c_str(), O_RDONLY, LOCK_SH);
+    if (!file && errno == EWOULDBLOCK) {
+        fail(CFG_BUSY, name + ": in use by another process");
+    }
+    if (!file) {
+        fail_with_errno(name, CFG_CONNECT_ERROR);
+    }
+    return content_of(file.get(), static_cast<size_t>(file.status().st_size), name);
+}
+
+}  // namespace cfg32::tool

@@ -1,0 +1,29 @@
+#pragma once
+
+#include <string>
+#include <string_view>
+
+#include "unique_fd.h"
+
+namespace cfg32::tool {
+
+/// A private copy of a file's text, in memory, that is opened by its name like a file. What is
+/// tried on it touches no disk, and nobody else sees it.
+class memory_file {
+  public:
+    explicit memory_file(std::string_view text);
+
+    const std::string& name() const { return name_; }
+    /// What it holds now.
+    std::string text() const;
+
+  private:
+    unique_fd file_;
+    std::string name_;
+};
+
+/// The text of the configuration file, read while no program is writing it. Ends the command when
+/// it can't be read.
+std::string read_configuration(const std::string& name);
+
+}  // namespace cfg32::tool
