@@ -56,12 +56,17 @@ configuration::configuration(const settings& options, std::string file_name)
     } else if (copy_.text() != text_) {
         note_left_out();
     }
-    if (options.bind_dn.empty()) {
-        return;
+}
+
+configuration::configuration(const settings& options)
+    : configuration(options, options.file_name()) {
+    if (!options.bind_dn.empty()) {
+        bind(options.bind_dn.c_str(), options.bind_password().c_str());
     }
-    const secret password = options.bind_password();
-    const int code =
-        cfg_bind_s(handle_.get(), options.bind_dn.c_str(), password.c_str(), CFG_AUTH_SIMPLE);
+}
+
+void configuration::bind(const char* dn, const char* password) {
+    const int code = cfg_bind_s(handle_.get(), dn, password, CFG_AUTH_SIMPLE);
     if (code != CFG_SUCCESS) {
         fail(handle_.get(), code, name_);
     }
@@ -72,10 +77,7 @@ void configuration::load_part() {
     note_left_out();
     copy_ = memory_file(loadable_part(text_, left_out_));
     cfg_set_option(handle_.get(), CFG_OPT_CONFIG_FILE, copy_.name().c_str());
-    const int code = cfg_bind_s(handle_.get(), nullptr, nullptr, CFG_AUTH_SIMPLE);
-    if (code != CFG_SUCCESS) {
-        fail(handle_.get(), code, name_);
-    }
+    bind(nullptr, nullptr);
 }
 
 void configuration::note_left_out() {

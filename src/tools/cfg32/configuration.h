@@ -20,9 +20,10 @@ namespace cfg32::tool {
 /// be read as far as it goes. Both are told on standard error.
 class configuration {
   public:
-    /// Binds with the options' credentials. Ends the command when the file can't be read.
+    /// Any file, bound to anonymously. Ends the command when it can't be read.
     configuration(const settings& options, std::string file_name);
-    explicit configuration(const settings& options) : configuration(options, options.file_name()) {}
+    /// The file that the options name, bound to with their credentials.
+    explicit configuration(const settings& options);
 
     const std::string& name() const { return name_; }
     const std::string& text() const { return text_; }
@@ -40,6 +41,7 @@ class configuration {
     const LDIF_Entry& entry_at(const std::string& dn) const;
 
   private:
+    void bind(const char* dn, const char* password);
     void load_part();
     void note_left_out();
 

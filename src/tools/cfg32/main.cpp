@@ -1,5 +1,6 @@
 // The administrator's command.
 
+#include <sodium.h>
 #include <sys/prctl.h>
 
 #include <clocale>
@@ -92,6 +93,10 @@ int flushed(int status) {
 int main(int argc, char** argv) {
     keep_memory_private();
     setlocale(LC_ALL, "");
+    if (sodium_init() < 0) {
+        complain("there is no source of random numbers");
+        return failed;
+    }
     settings options;
     action chosen;
     CLI::App parser("Reads, checks and changes the configuration file of the directory server.",

@@ -29,8 +29,9 @@ struct facts {
     const _AttrType* violated = nullptr;
 };
 
+/// What is more than a line is left out: of a refused filter the library tells a whole entry.
 void append_line(std::string& text, std::string_view label, std::string_view what) {
-    if (!what.empty()) {
+    if (!what.empty() && what.find('\n') == std::string_view::npos) {
         text += fmt::format("\n  {}: {}", label, what);
     }
 }

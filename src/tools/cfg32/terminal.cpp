@@ -48,6 +48,8 @@ void complain(std::string_view message) {
     fmt::print(stderr, "{} {}\n", styled(stderr, style::error, "cfg32:"), message);
 }
 
+bool is_interactive() { return isatty(STDIN_FILENO) && isatty(STDERR_FILENO); }
+
 secret ask_secret(const std::string& prompt) {
     std::array<char, CFG32_PASSWORD_MAX + 2> buffer{};
     const bool is_given = readpassphrase(prompt.c_str(), buffer.data(), buffer.size(), 0);
@@ -66,7 +68,7 @@ char ask(const std::string& question, std::string_view letters) {
         std::string answer;
         if (!std::getline(std::cin, answer)) {
             fmt::print(stderr, "\n");
-            return letters.back();
+            return '\0';
         }
         if (answer.size() == 1 && letters.find(answer.front()) != std::string_view::npos) {
             return answer.front();

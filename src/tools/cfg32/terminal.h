@@ -35,11 +35,14 @@ std::string styled(std::FILE* stream, const fmt::text_style& style, std::string_
 /// Prints "cfg32: " and the message on standard error.
 void complain(std::string_view message);
 
+/// True when a person can be asked something.
+bool is_interactive();
+
 /// Asks for a text without echo, at the terminal or, without one, on standard input.
 secret ask_secret(const std::string& prompt);
 
-/// Asks a question that one of the letters answers, at the terminal on standard input, until one is
-/// given; the end of the input answers with the last one.
+/// Asks a question on standard error until one of the letters answers it on standard input; NUL at
+/// the end of the input.
 char ask(const std::string& question, std::string_view letters);
 
 /// Tells on a terminal's standard error what is being done, once it takes longer than a second.

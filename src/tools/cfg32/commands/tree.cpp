@@ -80,7 +80,7 @@ std::string drawing_of(const LDIF_Entry& tree, drawing_style style) {
         text = lines_in_unicode(text);
     }
     if (!missing.empty()) {
-        text += "\n* below entries that are missing:\n";
+        text += "\n* the following entries are undefined:\n";
     }
     for (const LDIF_DN& dn : missing) {
         text += dn.str() + "\n";

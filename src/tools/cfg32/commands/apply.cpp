@@ -1,0 +1,43 @@
+// cfg32 apply: makes the configuration the same as another file's.
+
+#include <CLI/CLI.hpp>
+
+#include "command.h"
+#include "configuration.h"
+#include "difference.h"
+#include "update.h"
+
+namespace cfg32::tool {
+
+namespace {
+
+/// What was left out of the other file would be deleted from this one.
+void require_whole(const configuration& wanted) {
+    if (!wanted.left_out().empty()) {
+        throw ended(failed, wanted.name() + " can't be used whole: mend it first");
+    }
+}
+
+int apply_all(const settings& options, const std::string& wanted_name) {
+    const configuration wanted(options, wanted_name);
+    require_whole(wanted);
+    const configuration present(options);
+    update_options how;
+    how.source = wanted_name;
+    const std::vector<change_record> changes = changes_between(present.root(), wanted.root());
+    return print_result(options, update(options, changes, how));
+}
+
+}  // namespace
+
+action define_apply(CLI::App& parser, settings& options) {
+    const auto wanted = std::make_shared<std::string>();
+    parser.add_option("wanted", *wanted, "the file that has the wanted content")
+        ->type_name("FILE")
+        ->required();
+    add_dry_run_option(parser, options);
+    add_json_option(parser, options);
+    return [wanted, &options] { return apply_all(options, *wanted); };
+}
+
+}  // namespace cfg32::tool

@@ -1,0 +1,65 @@
+// cfg32 keygen: makes a key file for passwords.
+
+#include <fcntl.h>
+#include <sodium.h>
+#include <unistd.h>
+
+#include <array>
+#include <cerrno>
+#include <cstring>
+
+#include "choice_option.h"
+#include "command.h"
+#include "disk.h"
+#include "unique_fd.h"
+
+namespace cfg32::tool {
+
+namespace {
+
+constexpr size_t largest_key = 32;
+
+struct arguments {
+    std::string file;
+    size_t bytes = largest_key;
+};
+
+constexpr mode_t of_owner_only = 0600;
+
+bool is_written(int file, std::string_view key) {
+    // Whatever the umask is.
+    return fchmod(file, of_owner_only) == 0 && replace_content(file, key) && sync_content(file);
+}
+
+/// A key that is there already is never overwritten: what it encoded would be lost.
+int keygen(const arguments& given) {
+    const char* name = given.file.c_str();
+    unique_fd file(open(name, O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, of_owner_only));
+    if (!file) {
+        throw ended(failed, given.file + ": " + strerror(errno));
+    }
+    std::array<char, largest_key> key{};
+    randombytes_buf(key.data(), given.bytes);
+    const bool is_done = is_written(file.get(), {key.data(), given.bytes}) && file.close();
+    const int error = errno;
+    sodium_memzero(key.data(), key.size());
+    if (!is_done) {
+        unlink(name);
+        throw ended(failed, given.file + ": " + strerror(error));
+    }
+    return done;
+}
+
+}  // namespace
+
+action define_keygen(CLI::App& parser, settings&) {
+    const auto given = std::make_shared<arguments>();
+    parser.add_option("file", given->file, "the key file, which must not be there yet")
+        ->type_name("FILE")
+        ->required();
+    add_choice<size_t>(parser, "--bits", given->bytes, {{"128", 16}, {"192", 24}, {"256", 32}},
+                       "the size of the key; else 256");
+    return [given] { return keygen(*given); };
+}
+
+}  // namespace cfg32::tool

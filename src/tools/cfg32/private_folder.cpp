@@ -1,0 +1,48 @@
+// A place for a text that another program is to work on.
+
+#include "private_folder.h"
+
+#include <fcntl.h>
+
+#include <cerrno>
+#include <cstdlib>
+#include <cstring>
+#include <system_error>
+
+#include "disk.h"
+#include "outcome.h"
+#include "unique_fd.h"
+
+namespace cfg32::tool {
+
+namespace {
+
+constexpr mode_t of_owner_only = 0600;
+
+}  // namespace
+
+private_folder::private_folder() {
+    std::string name = (std::filesystem::temp_directory_path() / "cfg32-XXXXXX").string();
+    if (!mkdtemp(name.data())) {
+        throw ended(failed, name + ": " + strerror(errno));
+    }
+    path_ = name;
+}
+
+private_folder::~private_folder() {
+    if (!is_kept_) {
+        std::error_code ignored;
+        std::filesystem::remove_all(path_, ignored);
+    }
+}
+
+std::string private_folder::write(const std::string& name, std::string_view text) const {
+    const std::string path = (path_ / name).string();
+    unique_fd file(open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, of_owner_only));
+    if (!file || !replace_content(file.get(), text) || !file.close()) {
+        throw ended(failed, path + ": " + strerror(errno));
+    }
+    return path;
+}
+
+}  // namespace cfg32::tool

@@ -1,0 +1,195 @@
+Two files with the same content do not differ, whatever their order, their comments and their case:
+
+    $ . "$TOOLS/scratch.sh"
+    $ cat > a.conf <<EOF
+    > # The first one.
+    > version: 1
+    > 
+    > dn: cn=Configuration
+    > cn: Configuration
+    > oru-slapdLogMessages: TRUE
+    > 
+    > dn: cn=x, cn=Configuration
+    > oru-slapdReferral: ldap://one
+    > oru-slapdReferral: ldap://two
+    > EOF
+    $ cat > b.conf <<EOF
+    > dn: cn=X,CN=Configuration
+    > oru-slapdReferral: ldap://two
+    > oru-slapdReferral: ldap://ONE
+    > 
+    > dn: cn=Configuration
+    > # Another comment.
+    > oru-slapdLogMessages: true
+    > cn: configuration
+    > EOF
+    $ cfg32 diff a.conf b.conf
+
+What differs comes as changes that `cfg32 modify` takes, and as the answer no: entries that go, each
+after those below it, entries that change, new entries:
+
+    $ cat > b.conf <<EOF
+    > dn: cn=Configuration
+    > cn: Configuration
+    > oru-slapdLogMessages: FALSE
+    > oru-slapdPort: 389
+    > 
+    > dn: cn=y, cn=Configuration
+    > cn: y
+    > 
+    > dn: cn=z, cn=y, cn=Configuration
+    > cn: z
+    > EOF
+    $ cfg32 diff a.conf b.conf
+    dn: cn=x, cn=Configuration
+    changetype: delete
+    
+    dn: cn=Configuration
+    changetype: modify
+    replace: oru-slapdLogMessages
+    oru-slapdLogMessages: FALSE
+    -
+    replace: oru-slapdPort
+    oru-slapdPort: 389
+    -
+    
+    dn: cn=y, cn=Configuration
+    changetype: add
+    cn: y
+    
+    dn: cn=z, cn=y, cn=Configuration
+    changetype: add
+    cn: z
+    
+    [1]
+
+Of an attribute with several values only those are named that differ:
+
+    $ cat > c.conf <<EOF
+    > version: 1
+    > 
+    > dn: cn=Configuration
+    > cn: Configuration
+    > oru-slapdLogMessages: TRUE
+    > 
+    > dn: cn=x, cn=Configuration
+    > oru-slapdReferral: ldap://two
+    > oru-slapdReferral: ldap://three
+    > EOF
+    $ cfg32 diff a.conf c.conf
+    dn: cn=x, cn=Configuration
+    changetype: modify
+    delete: oru-slapdReferral
+    oru-slapdReferral: ldap://one
+    -
+    add: oru-slapdReferral
+    oru-slapdReferral: ldap://three
+    -
+    
+    [1]
+
+For people it is shorter:
+
+    $ cfg32 diff --format text a.conf b.conf
+    - cn=x, cn=Configuration
+    -   oru-slapdReferral: ldap://one
+    -   oru-slapdReferral: ldap://two
+      cn=Configuration
+    -   oru-slapdLogMessages: TRUE
+    +   oru-slapdLogMessages: FALSE
+    +   oru-slapdPort: 389
+    + cn=y, cn=Configuration
+    +   cn: y
+    + cn=z, cn=y, cn=Configuration
+    +   cn: z
+    [1]
+    $ cfg32 diff --format json a.conf c.conf | tee found
+    {
+      "from": "a.conf",
+      "to": "c.conf",
+      "entries": [
+        {
+          "dn": "cn=x, cn=Configuration",
+          "change": "changed",
+          "attributes": [
+            {
+              "name": "oru-slapdReferral",
+              "removed": [
+                "ldap://one"
+              ],
+              "added": [
+                "ldap://three"
+              ]
+            }
+          ]
+        }
+      ]
+    }
+    $ "$TOOLS/valid_json" diff < found
+    valid
+
+The lines above all entries are an entry without a name:
+
+    $ sed 's/^version: 1/charset: UTF-8/' a.conf > d.conf
+    $ cfg32 diff a.conf d.conf
+    dn:
+    changetype: modify
+    replace: charset
+    charset: UTF-8
+    -
+    
+    [1]
+
+An entry that stays below one that goes is removed with it and added again:
+
+    $ printf 'dn: cn=a\ncn: a\n\ndn: cn=b, cn=a\ncn: b\n' > above.conf
+    $ printf 'dn: cn=b, cn=a\ncn: b\n' > alone.conf
+    $ cfg32 diff above.conf alone.conf
+    dn: cn=b, cn=a
+    changetype: delete
+    
+    dn: cn=a
+    changetype: delete
+    
+    dn: cn=b, cn=a
+    changetype: add
+    cn: b
+    
+    [1]
+    $ cfg32 diff --format text above.conf alone.conf
+    - cn=a
+    -   cn: a
+    [1]
+
+Passwords are compared by what they are, with the key, and are never seen in clear. In changes they
+stand as they are stored; what is only masked there should be guarded:
+
+    $ secret() { printf 'dn: cn=Configuration\noru-slapdAdminPW: %s\n' "$1"; }
+    $ secret Correct-Horse-7 > clear.conf
+    $ grep -m2 -e '^dn' -e '^oru-slapdAdminPW' oruslapd.conf > masked.conf
+    $ cfg32 diff clear.conf masked.conf
+    $ secret Wrong-Horse > other.conf
+    $ cfg32 diff --format text clear.conf other.conf
+      cn=Configuration
+    -   oru-slapdAdminPW: ********
+    +   oru-slapdAdminPW: ********
+    [1]
+    $ cfg32 diff --json clear.conf other.conf | grep -c '\*\*\*\*\*\*\*\*'
+    2
+    $ cfg32 diff clear.conf other.conf > changes
+    cfg32: masked passwords, which anybody can decode, are in this output: guard it like the file
+    [1]
+    $ grep -e Horse changes
+    [1]
+    $ cfg32 --key-file oruslapd.key diff clear.conf other.conf | grep -o ': {AES256}'
+    : {AES256}
+
+What can't be read is a failure:
+
+    $ cfg32 diff a.conf nowhere
+    cfg32: nowhere: No such file or directory [Connection error (91)]
+    [3]
+    $ cfg32 diff a.conf
+    to is required
+    Run with --help for more information.
+    [2]

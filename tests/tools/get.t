@@ -1,0 +1,107 @@
+It prints each value of an attribute on a line:
+
+    $ . "$TOOLS/scratch.sh"
+    $ cfg32 -f oruslapd.conf get "cn=Client Listener, cn=Network, cn=Configuration" oru-slapdPort
+    389
+    $ cfg32 -f oruslapd.conf get "cn=Configuration" objectclass
+    top
+    oruConfigTop
+
+Names and DNs are compared without regard to case, and DNs in any of their forms:
+
+    $ cfg32 -f oruslapd.conf get "CN=client listener,CN=network;CN=configuration" ORU-slapdPORT
+    389
+
+Options may stand behind the command as well:
+
+    $ cfg32 get -f oruslapd.conf cn=Configuration cn
+    Configuration
+
+A continued value comes in one piece:
+
+    $ cfg32 -f oruslapd.conf get cn=Configuration nuv-instanceDesc
+    Directory of the Lindau and München offices; changes are agreed with Jörg Voß, telephone extension 4410
+
+Passwords are seen only when nobody can read them; masked ones are not:
+
+    $ cfg32 -f oruslapd.conf get "cn=jvoss, cn=Administrators, cn=Configuration" oru-slapdAdminPW
+    {AES256}EKYCnJOygjgfY9+X+KdRfAj7wgohq5+wxoTFJNccOrZdYD5D/4qHkzX1XgCsAbHO
+    $ cfg32 -f oruslapd.conf get cn=Configuration oru-slapdAdminPW
+    ********
+
+An attribute or an entry that is not there is the answer no:
+
+    $ cfg32 -f oruslapd.conf get cn=Configuration oru-slapdPrt
+    cfg32: oruslapd.conf: cn=Configuration has no attribute oru-slapdPrt; did you mean oru-slapdPort? [No such attribute (16)]
+    [1]
+    $ cfg32 -f oruslapd.conf get cn=Configuration oru-slapdPort
+    cfg32: oruslapd.conf: cn=Configuration has no attribute oru-slapdPort [No such attribute (16)]
+    [1]
+    $ cfg32 -f oruslapd.conf get cn=Nobody,cn=Configuration cn
+    cfg32: oruslapd.conf: no entry cn=Nobody,cn=Configuration [No such object (32)]
+    [1]
+
+What is no DN is a failure:
+
+    $ cfg32 -f oruslapd.conf get nobody cn
+    cfg32: Missing RDN value: nobody [Invalid DN syntax (34)]
+    [3]
+
+JSON says the same:
+
+    $ cfg32 -f oruslapd.conf get "cn=Client Listener, cn=Network, cn=Configuration" oru-slapdPort --json | tee found
+    {
+      "file": "oruslapd.conf",
+      "entries": [
+        {
+          "dn": "cn=Client Listener, cn=Network, cn=Configuration",
+          "attributes": {
+            "oru-slapdPort": [
+              "389"
+            ]
+          }
+        }
+      ],
+      "leftOut": []
+    }
+    $ "$TOOLS/valid_json" search < found
+    valid
+    $ cfg32 -f oruslapd.conf get cn=Configuration oru-slapdAdminPW --json | grep -A1 PW
+            "oru-slapdAdminPW": [
+              "********"
+
+With a DN it binds as the administrator; whose password it is has to be right:
+
+    $ echo Correct-Horse-7 > password
+    $ cfg32 -f oruslapd.conf --key-file oruslapd.key -D cn=root -y password get cn=Configuration cn
+    Configuration
+    $ echo wrong > password
+    $ cfg32 -f oruslapd.conf --key-file oruslapd.key -D cn=root -y password get cn=Configuration cn
+    cfg32: oruslapd.conf: Invalid credentials (49)
+    [3]
+    $ cfg32 -f oruslapd.conf -D cn=root get cn=Configuration cn
+    cfg32: -D needs a password: add -W or -y FILE
+    [2]
+
+A key that others could read is not used:
+
+    $ chmod 640 oruslapd.key
+    $ cfg32 -f oruslapd.conf --key-file oruslapd.key get cn=Configuration cn
+    cfg32: oruslapd.key: a key file that others can read is not used
+    [3]
+
+Without -f it is the server's own file, and without a server that is said:
+
+    $ mkdir -p server/etc && cp oruslapd.conf server/etc/
+    $ NUV_INSTALL_PATH=$PWD/server cfg32 get cn=Configuration cn
+    Configuration
+    $ cfg32 -f nowhere.conf get cn=Configuration cn
+    cfg32: nowhere.conf: No such file or directory [Connection error (91)]
+    [3]
+
+A missing argument is a usage error:
+
+    $ cfg32 get cn=Configuration
+    attribute is required
+    Run with --help for more information.
+    [2]
