@@ -127,6 +127,7 @@ A filter that its attribute does not allow is a failure:
     $ cfg32 -f oruslapd.conf search '(oru-slapdPort=http)'
     cfg32: oruslapd.conf: Value is not a valid integer. [Invalid syntax (21)]
       oru-slapdPort: http
+      accepted: an integer from 1 to 65535
     [3]
 
 Reading leaves the file alone:

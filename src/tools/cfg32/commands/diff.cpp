@@ -129,10 +129,12 @@ action define_diff(CLI::App& parser, settings& options) {
     const auto given = std::make_shared<arguments>();
     parser.add_option("from", given->from, "the file of before")->type_name("FILE")->required();
     parser.add_option("to", given->to, "the file of after")->type_name("FILE")->required();
-    add_choice<diff_format>(parser, "--format", given->format,
-                            {{"ldif", as_ldif}, {"text", as_text}, {"json", as_json}},
-                            "changes that `cfg32 modify` takes, lines to read, or JSON; else ldif");
+    const auto format = add_choice<diff_format>(
+        parser, "--format", given->format,
+        {{"ldif", as_ldif}, {"text", as_text}, {"json", as_json}},
+        "changes that `cfg32 modify` takes, lines to read, or JSON; else ldif");
     add_json_option(parser, options);
+    parser.get_option("--json")->description("the same as --format json")->excludes(format);
     return [given, &options] { return diff(options, *given); };
 }
 
