@@ -8,7 +8,7 @@
 #include <string_view>
 
 #include "LDIF_AttrType.h"
-#include "attribute_words.h"
+#include "schema/attribute_words.h"
 
 using namespace cfg32::tool;
 

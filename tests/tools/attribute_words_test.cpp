@@ -1,7 +1,7 @@
 // The attribute table in words: what is said of each attribute, what is accepted, which name is
 // meant.
 
-#include "attribute_words.h"
+#include "schema/attribute_words.h"
 
 #include <gmock/gmock.h>
 

@@ -25,4 +25,6 @@ under another name it is copied:
 
     $ echo "dn: no name" >> oruslapd.conf
     $ cfg32 -f oruslapd.conf backup
+    cfg32: oruslapd.conf:850: Invalid character in RDN attribute: n; oruslapd.conf.bak stays as it is (name another file to copy to)
+    [1]
     $ cfg32 -f oruslapd.conf backup broken && cmp oruslapd.conf broken

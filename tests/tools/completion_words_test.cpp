@@ -1,6 +1,6 @@
 // What may stand at the end of a command line.
 
-#include "completion_words.h"
+#include "completion/completion_words.h"
 
 #include <gmock/gmock.h>
 

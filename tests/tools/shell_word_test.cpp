@@ -1,6 +1,6 @@
 // Words as bash has them while one is typed.
 
-#include "shell_word.h"
+#include "completion/shell_word.h"
 
 #include <gtest/gtest.h>
 

@@ -6,9 +6,9 @@
 #include <vector>
 
 #include "LDIF_Entry.h"
+#include "check/problem.h"
 #include "entry.h"
 #include "memory_file.h"
-#include "problem.h"
 #include "settings.h"
 
 struct CfgHandle;

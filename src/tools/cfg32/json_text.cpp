@@ -5,50 +5,9 @@
 #include <cstdio>
 #include <nlohmann/json.hpp>
 
-#include "LDIF_Util.h"
-#include "secret.h"
+#include "hidden_passwords.h"
 
 namespace cfg32::tool {
-
-namespace {
-
-constexpr unsigned long replacement_character = 0xfffd;
-
-void append_utf8(std::string& text, unsigned long code) {
-    const auto append = [&](unsigned long byte) { text += static_cast<char>(byte); };
-    const auto append_rest = [&](int shift) { append(0x80 | ((code >> shift) & 0x3f)); };
-    if (code < 0x80) {
-        append(code);
-    } else if (code < 0x800) {
-        append(0xc0 | (code >> 6));
-        append_rest(0);
-    } else if (code < 0x10000) {
-        append(0xe0 | (code >> 12));
-        append_rest(6);
-        append_rest(0);
-    } else {
-        append(0xf0 | (code >> 18));
-        append_rest(12);
-        append_rest(6);
-        append_rest(0);
-    }
-}
-
-}  // namespace
-
-std::string utf8(std::string_view text) {
-    if (is_plain(text)) {
-        return std::string(text);
-    }
-    std::string converted;
-    while (!text.empty()) {
-        const character next = first_character(text);
-        append_utf8(converted,
-                    next.is_valid ? static_cast<unsigned long>(next.code) : replacement_character);
-        text.remove_prefix(next.bytes.size());
-    }
-    return converted;
-}
 
 json json_of(const entry& printed) {
     json attributes = json::object();

@@ -7,7 +7,7 @@
 #include <string_view>
 #include <vector>
 
-#include "change_record.h"
+#include "change/change_record.h"
 #include "entry.h"
 
 namespace cfg32::tool {

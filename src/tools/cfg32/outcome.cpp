@@ -4,13 +4,15 @@
 
 #include <fmt/format.h>
 
+#include <algorithm>
 #include <cstring>
+#include <iterator>
 
 #include "LDIF_AttrType.h"
 #include "LDIF_Exception.h"
-#include "attribute_words.h"
 #include "cfg32.h"
-#include "secret.h"
+#include "hidden_passwords.h"
+#include "schema/attribute_words.h"
 
 namespace cfg32::tool {
 
@@ -50,20 +52,21 @@ std::string told(const facts& known) {
     if (!known.attribute.empty()) {
         append_line(text, known.attribute, shown_value(known.attribute, known.value));
     }
-    if (known.violated && known.violated->name) {
+    if (known.violated && known.violated->name && known.code != CFG_DECODING_ERROR) {
         append_line(text, "accepted", accepted_values(*known.violated));
     }
     return text;
 }
 
-/// The innermost cause has the message that says most.
-const LDIF_Exception& innermost(const LDIF_Exception& e) {
-    const LDIF_Exception* inner = &e;
-    while (inner->cause) {
-        inner = inner->cause.get();
-    }
-    return *inner;
-}
+/// Where the library's message quotes a text that may be a password, or names its own parts.
+struct own_message {
+    int code;
+    const char* text;
+};
+constexpr own_message own_messages[] = {
+    {CFG_DECODING_ERROR, "a stored password can't be decoded with this key, or without one"},
+    {162, "text that is not of the locale's character set"},
+};
 
 }  // namespace
 
@@ -78,11 +81,22 @@ std::string with_result(std::string_view text, int code) {
 
 void fail(int code, std::string_view text) { throw ended(failed, with_result(text, code)); }
 
+std::string message_of(const LDIF_Exception& e) {
+    const LDIF_Exception* inner = &e;
+    while (inner->cause) {
+        inner = inner->cause.get();
+    }
+    const auto own =
+        std::find_if(std::begin(own_messages), std::end(own_messages),
+                     [&](const own_message& each) { return each.code == inner->ldapErr; });
+    return own == std::end(own_messages) ? inner->msg : own->text;
+}
+
 std::string report(const LDIF_Exception& e, std::string_view file_name) {
     facts known;
     known.file = file_name.empty() ? e.configFile : file_name;
     known.line = e.configLine;
-    known.message = innermost(e).msg;
+    known.message = message_of(e);
     known.system_error = e.sysErrno;
     known.code = e.ldapErr;
     known.entry = e.entryDn;

@@ -37,6 +37,9 @@ std::string with_result(std::string_view text, int code);
 /// Ends the command with an LDAP result.
 [[noreturn]] void fail(int code, std::string_view text);
 
+/// What the innermost cause says, which is the most; or what this program says in its place.
+std::string message_of(const LDIF_Exception& e);
+
 /// What a failure of the library says: file and line, message, result, and below it the entry, the
 /// attribute with its value (as far as it may be seen) and what would have been accepted.
 /// file_name takes the place of the file's name, unless it is empty.

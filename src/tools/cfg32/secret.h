@@ -29,17 +29,4 @@ class secret {
 /// Wipes a text's buffer and empties it.
 void wipe(std::string& text);
 
-/// True for the attributes whose values are passwords.
-bool is_password_attribute(std::string_view name);
-
-/// What takes the place of text that is not to be seen.
-inline constexpr std::string_view hidden_text = "********";
-
-/// A value as people and programs may see it: of a password that is in clear, or only masked,
-/// nothing but the hidden text; of an encrypted or hashed one what is stored.
-std::string shown_value(std::string_view attribute, std::string_view value);
-
-/// The same for a line of a file, also for one without a colon and for a kept unusable line.
-std::string shown_line(std::string_view line);
-
 }  // namespace cfg32::tool

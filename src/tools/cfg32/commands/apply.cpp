@@ -2,10 +2,10 @@
 
 #include <CLI/CLI.hpp>
 
+#include "change/update.h"
 #include "command.h"
 #include "configuration.h"
-#include "difference.h"
-#include "update.h"
+#include "diff/difference.h"
 
 namespace cfg32::tool {
 

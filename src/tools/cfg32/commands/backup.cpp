@@ -10,11 +10,11 @@
 
 #include "LDIF_File.h"
 #include "cfg32_platform.h"
+#include "check/problem.h"
 #include "command.h"
 #include "disk.h"
 #include "file_lock.h"
 #include "memory_file.h"
-#include "problem.h"
 
 namespace cfg32::tool {
 

@@ -10,9 +10,9 @@
 
 #include "choice_option.h"
 #include "command.h"
-#include "completion_words.h"
+#include "completion/completion_words.h"
+#include "completion/shell_word.h"
 #include "outcome.h"
-#include "shell_word.h"
 
 namespace cfg32::tool {
 

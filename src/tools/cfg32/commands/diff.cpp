@@ -7,10 +7,10 @@
 #include "choice_option.h"
 #include "command.h"
 #include "configuration.h"
-#include "difference.h"
+#include "diff/difference.h"
+#include "hidden_passwords.h"
 #include "json_text.h"
 #include "ldif_writer.h"
-#include "secret.h"
 #include "terminal.h"
 
 namespace cfg32::tool {

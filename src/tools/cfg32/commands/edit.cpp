@@ -10,14 +10,14 @@
 
 #include "LDIF_Exception.h"
 #include "LDIF_File.h"
-#include "check_report.h"
+#include "check/check_report.h"
+#include "check/problem.h"
 #include "command.h"
+#include "diff/unified_diff.h"
 #include "entry_text.h"
 #include "memory_file.h"
 #include "private_folder.h"
-#include "problem.h"
 #include "terminal.h"
-#include "unified_diff.h"
 
 namespace cfg32::tool {
 
@@ -107,6 +107,7 @@ class session {
 
     choice review(const std::string& draft);
     int finish(const std::string& draft);
+    void keep_draft();
 
     const settings& options_;
     std::string file_name_;
@@ -145,7 +146,6 @@ int session::finish(const std::string& draft) {
     return done;
 }
 
-/// Whatever goes wrong, the draft is not lost.
 int session::run() {
     try {
         for (;;) {
@@ -161,9 +161,16 @@ int session::run() {
             }
         }
     } catch (...) {
+        keep_draft();
+        throw;
+    }
+}
+
+/// Whatever went wrong, what was edited is not lost.
+void session::keep_draft() {
+    if (read_configuration(path_) != text_.part()) {
         folder_.keep();
         fmt::print(stderr, "what you edited is kept in {}\n", path_);
-        throw;
     }
 }
 

@@ -7,11 +7,11 @@
 #include <nlohmann/json.hpp>
 
 #include "LDIF_AttrType.h"
-#include "attribute_json.h"
-#include "attribute_words.h"
 #include "command.h"
 #include "json_text.h"
 #include "outcome.h"
+#include "schema/attribute_json.h"
+#include "schema/attribute_words.h"
 #include "terminal.h"
 
 namespace cfg32::tool {

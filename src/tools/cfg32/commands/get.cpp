@@ -5,13 +5,13 @@
 #include <CLI/CLI.hpp>
 #include <nlohmann/json.hpp>
 
-#include "attribute_words.h"
 #include "cfg32.h"
 #include "command.h"
 #include "configuration.h"
+#include "hidden_passwords.h"
 #include "json_text.h"
 #include "outcome.h"
-#include "secret.h"
+#include "schema/attribute_words.h"
 
 namespace cfg32::tool {
 

@@ -10,13 +10,13 @@
 
 #include "LDIF_File.h"
 #include "cfg32_platform.h"
-#include "check_report.h"
+#include "check/check_report.h"
+#include "check/problem.h"
 #include "command.h"
+#include "diff/unified_diff.h"
 #include "file_lock.h"
 #include "memory_file.h"
-#include "problem.h"
 #include "terminal.h"
-#include "unified_diff.h"
 
 namespace cfg32::tool {
 

@@ -1,0 +1,115 @@
+// Changes that come as LDIF.
+
+#include "change/ldif_command.h"
+
+#include <CLI/CLI.hpp>
+#include <cerrno>
+#include <cstring>
+#include <fstream>
+#include <iostream>
+#include <iterator>
+
+#include "change/ldif_reader.h"
+#include "outcome.h"
+
+namespace cfg32::tool {
+
+namespace {
+
+std::string all_of(std::istream& in, const std::string& name) {
+    std::string text{std::istreambuf_iterator<char>(in), {}};
+    if (in.bad()) {
+        throw ended(failed, name + ": can't be read");
+    }
+    return text;
+}
+
+std::string read_source(const ldif_options& given) {
+    if (given.file.empty()) {
+        return all_of(std::cin, given.how.source);
+    }
+    errno = 0;
+    std::ifstream file(given.file, std::ios::binary);
+    if (!file || file.peek() == std::ifstream::traits_type::eof()) {
+        const int error = errno;
+        if (error != 0) {
+            throw ended(usage_error, given.file + ": " + strerror(error));
+        }
+    }
+    return all_of(file, given.file);
+}
+
+/// The records of a text, and what is wrong with those that are not well-formed.
+struct ldif_records {
+    std::vector<change_record> good;
+    std::vector<skipped_record> bad;
+
+    void add(change_record&& record, change_record::operation allowed, bool only_allowed,
+             const std::string& source) {
+        if (only_allowed && record.kind != allowed) {
+            return add({record.line, "a record that does not delete"}, source, record.dn);
+        }
+        good.push_back(std::move(record));
+    }
+
+    void add(const ldif_error& error, const std::string& source, const std::string& dn = {}) {
+        bad.push_back(
+            {error.line, dn, source + ":" + std::to_string(error.line) + ": " + error.text});
+    }
+};
+
+ldif_records records_of(std::string_view text, const std::string& source,
+                        change_record::operation default_kind, bool only_default) {
+    ldif_records records;
+    for (auto& each : read_ldif(text, default_kind)) {
+        if (const auto* error = std::get_if<ldif_error>(&each)) {
+            records.add(*error, source);
+        } else {
+            records.add(std::move(std::get<change_record>(each)), default_kind, only_default,
+                        source);
+        }
+    }
+    return records;
+}
+
+void require_none(const std::vector<skipped_record>& bad) {
+    std::string failures;
+    for (const skipped_record& each : bad) {
+        failures += (failures.empty() ? "" : "\n") + each.reason;
+    }
+    if (!failures.empty()) {
+        throw ended(failed, failures);
+    }
+}
+
+}  // namespace
+
+std::shared_ptr<ldif_options> add_ldif_options(CLI::App& parser, settings& options) {
+    auto given = std::make_shared<ldif_options>();
+    parser
+        .add_option("-l,--ldif", given->file,
+                    "read the changes from this file; else from standard input")
+        ->type_name("FILE");
+    parser.add_flag("-c,--continue", given->how.goes_on,
+                    "leave out records that fail, and say which");
+    add_dry_run_option(parser, options);
+    add_json_option(parser, options);
+    return given;
+}
+
+int update_from_ldif(const settings& options, const ldif_options& given,
+                     change_record::operation default_kind, bool only_default) {
+    update_options how = given.how;
+    how.source = given.file.empty() ? "standard input" : given.file;
+    ldif_records records = records_of(read_source(given), how.source, default_kind, only_default);
+    if (!how.goes_on) {
+        require_none(records.bad);
+    }
+    update_result result = update(options, records.good, how);
+    result.skipped.insert(result.skipped.end(), records.bad.begin(), records.bad.end());
+    std::sort(result.skipped.begin(), result.skipped.end(),
+              [](const skipped_record& l, const skipped_record& r) { return l.line < r.line; });
+    return print_result(options, result);
+}
+
+}  // namespace cfg32::tool

@@ -1,0 +1,177 @@
+// Comparing two trees.
+
+#include "diff/difference.h"
+
+#include <algorithm>
+#include <functional>
+
+#include "LDIF_AttrType.h"
+#include "LDIF_Exception.h"
+
+namespace cfg32::tool {
+
+namespace {
+
+using change_list = std::vector<entry_difference>;
+
+bool has_text(const LDIF_Values& values, const LDIF_Value& wanted) {
+    return std::any_of(values.begin(), values.end(),
+                       [&](const LDIF_Value& each) { return each.str() == wanted.str(); });
+}
+
+/// By the attribute's comparison; a password that can't be decoded is compared as it is stored.
+bool has(const LDIF_Values& values, const LDIF_Value& wanted) {
+    try {
+        return values.find(wanted) != values.end();
+    } catch (const LDIF_Exception&) {
+        return has_text(values, wanted);
+    }
+}
+
+std::vector<std::string> values_missing_in(const LDIF_Values& searched, const LDIF_Values& wanted) {
+    std::vector<std::string> missing;
+    for (const LDIF_Value& value : wanted) {
+        if (!has(searched, value)) {
+            missing.push_back(value.str());
+        }
+    }
+    return missing;
+}
+
+/// The attribute's values in an entry, none when it has it not.
+const LDIF_Values& values_of(const LDIF_Entry& node, const cisString& name) {
+    static const LDIF_Values none({}, nullptr);
+    const auto found = node.attributes().find(name);
+    return found == node.attributes().end() ? none : found->values();
+}
+
+std::vector<attribute_difference> attribute_differences(const LDIF_Entry& from,
+                                                        const LDIF_Entry& to) {
+    std::vector<attribute_difference> found;
+    const auto compare = [&](const LDIF_Attribute& named) {
+        const LDIF_Values& before = values_of(from, named.name());
+        const LDIF_Values& after = values_of(to, named.name());
+        attribute_difference difference{named.name().text(), values_missing_in(after, before),
+                                        values_missing_in(before, after)};
+        if (!difference.removed.empty() || !difference.added.empty()) {
+            found.push_back(std::move(difference));
+        }
+    };
+    for (const LDIF_Attribute& each : from.attributes()) {
+        compare(each);
+    }
+    for (const LDIF_Attribute& each : to.attributes()) {
+        if (from.attributes().find(each.name()) == from.attributes().end()) {
+            compare(each);
+        }
+    }
+    return found;
+}
+
+/// Finds the differences; which entries count as being in both trees can be narrowed.
+change_list compare(const LDIF_Entry& from, const LDIF_Entry& to,
+                    const std::function<bool(const LDIF_Entry&)>& may_stay) {
+    const LDIF_Entry nothing;
+    change_list removed;
+    change_list changed;
+    change_list added;
+    const auto append = [](change_list& list, entry_difference::kind kind, const LDIF_Entry& node,
+                           std::vector<attribute_difference> attributes) {
+        list.push_back({kind, node.dn(), std::move(attributes)});
+    };
+    for_each_in_preorder(from, [&](const LDIF_Entry& node) {
+        const LDIF_Entry* counterpart = may_stay(node) ? to.find(node.dn()) : nullptr;
+        auto attributes = attribute_differences(node, counterpart ? *counterpart : nothing);
+        if (!counterpart) {
+            append(removed, entry_difference::removed, node, std::move(attributes));
+        } else if (!attributes.empty()) {
+            append(changed, entry_difference::changed, node, std::move(attributes));
+        }
+    });
+    for_each_in_preorder(to, [&](const LDIF_Entry& node) {
+        const LDIF_Entry* counterpart = from.find(node.dn());
+        if (!counterpart || !may_stay(*counterpart)) {
+            append(added, entry_difference::added, node, attribute_differences(nothing, node));
+        }
+    });
+    std::reverse(removed.begin(), removed.end());
+    removed.insert(removed.end(), std::make_move_iterator(changed.begin()),
+                   std::make_move_iterator(changed.end()));
+    removed.insert(removed.end(), std::make_move_iterator(added.begin()),
+                   std::make_move_iterator(added.end()));
+    return removed;
+}
+
+/// An attribute's values are replaced where they are one, or all change, or are passwords: two
+/// encoded forms of a password have nothing in common.
+std::vector<modification> modifications_for(const attribute_difference& difference,
+                                            const LDIF_Entry& to) {
+    const LDIF_Values& after = values_of(to, cisString(difference.name));
+    const _AttrType& type = *after.type();
+    if (after.empty()) {
+        return {{modification::remove, difference.name, {}, 0}};
+    }
+    if (type.isSingle || type.fromStr == pwFromStr || difference.added.size() == after.size()) {
+        std::vector<std::string> values;
+        for (const LDIF_Value& value : after) {
+            values.push_back(value.str());
+        }
+        return {{modification::replace, difference.name, std::move(values), 0}};
+    }
+    std::vector<modification> changes;
+    if (!difference.removed.empty()) {
+        changes.push_back({modification::remove, difference.name, difference.removed, 0});
+    }
+    if (!difference.added.empty()) {
+        changes.push_back({modification::add, difference.name, difference.added, 0});
+    }
+    return changes;
+}
+
+change_record record_of(const entry_difference& difference, const LDIF_Entry& to) {
+    change_record record;
+    record.dn = difference.dn.str();
+    switch (difference.change) {
+        case entry_difference::removed:
+            record.kind = change_record::remove;
+            return record;
+        case entry_difference::added:
+            record.kind = change_record::add;
+            for (const attribute_difference& each : difference.attributes) {
+                record.modifications.push_back({modification::add, each.name, each.added, 0});
+            }
+            return record;
+        case entry_difference::changed:
+            break;
+    }
+    for (const attribute_difference& each : difference.attributes) {
+        for (modification& change : modifications_for(each, *to.find(difference.dn))) {
+            record.modifications.push_back(std::move(change));
+        }
+    }
+    return record;
+}
+
+}  // namespace
+
+std::vector<entry_difference> differences(const LDIF_Entry& from, const LDIF_Entry& to) {
+    return compare(from, to, [](const LDIF_Entry&) { return true; });
+}
+
+std::vector<change_record> changes_between(const LDIF_Entry& from, const LDIF_Entry& to) {
+    const auto may_stay = [&](const LDIF_Entry& node) {
+        for (LDIF_DN dn = node.dn(); !dn.empty(); dn.remove_leaf()) {
+            if (from.find(dn) && !to.find(dn)) {
+                return false;
+            }
+        }
+        return true;
+    };
+    std::vector<change_record> records;
+    for (const entry_difference& each : compare(from, to, may_stay)) {
+        records.push_back(record_of(each, to));
+    }
+    return records;
+}
+
+}  // namespace cfg32::tool

@@ -1,0 +1,36 @@
+#pragma once
+
+// What differs between two configurations, entry by entry and value by value. Their order and the
+// comments make no difference, nor does what an attribute's own comparison takes for equal.
+
+#include <string>
+#include <vector>
+
+#include "LDIF_Entry.h"
+#include "change/change_record.h"
+
+namespace cfg32::tool {
+
+struct attribute_difference {
+    std::string name;
+    std::vector<std::string> removed;  ///< values, as stored
+    std::vector<std::string> added;
+};
+
+struct entry_difference {
+    enum kind { added, removed, changed };
+
+    kind change;
+    LDIF_DN dn;  ///< empty for the lines above all entries
+    std::vector<attribute_difference> attributes;
+};
+
+/// What makes one tree out of the other: removed entries with their content, each after those below
+/// it; then changed ones; then new ones, each before those below it.
+std::vector<entry_difference> differences(const LDIF_Entry& from, const LDIF_Entry& to);
+
+/// The same as changes that can be carried out. An entry that stays below one that goes is removed
+/// with it and added again.
+std::vector<change_record> changes_between(const LDIF_Entry& from, const LDIF_Entry& to);
+
+}  // namespace cfg32::tool

@@ -1,0 +1,28 @@
+#pragma once
+
+// What of passwords may be seen: one that is encrypted or hashed as it is stored, of others
+// nothing.
+
+#include <string>
+#include <string_view>
+
+namespace cfg32::tool {
+
+/// What takes the place of text that is not to be seen.
+inline constexpr std::string_view hidden_text = "********";
+
+/// True for the attributes whose values are passwords.
+bool is_password_attribute(std::string_view name);
+
+/// A value as people and programs may see it.
+std::string shown_value(std::string_view attribute, std::string_view value);
+
+/// A line of a file, or the name at its front, as it may be seen: what follows the name of a
+/// password is hidden, also where the name is mistyped, the colon is missing, or the line is one
+/// that was kept because it can't be used. Only the end of the line differs.
+std::string shown_line(std::string_view line);
+
+/// True when all that follows this line's name is a password.
+bool is_password_line(std::string_view line);
+
+}  // namespace cfg32::tool
