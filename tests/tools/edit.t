@@ -2,7 +2,7 @@ The editor here is a script that does to its file what sed is told, or what the 
 
     $ export NO_COLOR=1
     $ . "$TOOLS/scratch.sh"
-    $ in_terminal() { "$TOOLS"/in_terminal "$@" | sed "s|$TMPDIR/cfg32-[^/]*|PRIVATE|"; }
+    $ in_terminal() { "$TOOLS"/in_terminal "$@" | sed "s|$TMPDIR/cfg32-[^/]*|PRIVATE|; s|$PWD/||"; }
     $ unset VISUAL
     $ export EDITOR=$PWD/editor
     $ edit_by() { printf '#!/bin/sh\n%s\n' "$1" > editor; chmod +x editor; }
@@ -16,11 +16,9 @@ A good edit is written as it stands, after a backup, and the private copy goes:
     $ cp oruslapd.conf before.conf
     $ replace 's/^oru-slapdPort: 389$/oru-slapdPort:1389/'
     $ in_terminal -- cfg32 -f oruslapd.conf edit
-    $ diff before.conf oruslapd.conf
-    119c119
-    < oru-slapdPort: 389
-    ---
-    > oru-slapdPort:1389
+    $ diff -U0 before.conf oruslapd.conf | grep '^[-+]oru'
+    -oru-slapdPort: 389
+    +oru-slapdPort:1389
     [1]
     $ cmp before.conf oruslapd.conf.bak
     $ ls private
@@ -29,7 +27,15 @@ One entry is edited by itself, with the comment above it:
 
     $ edit_by 'cat "$1"'
     $ in_terminal -- cfg32 -f oruslapd.conf edit "$listener"
-    # The port of all clients.
+    # Plain port, kept for StartTLS clients; see also cn=TLS below.
+    dn: cn=Client Listener, cn=Network, cn=Configuration
+    cn: Client Listener
+    objectclass: top
+    objectclass: oruListener
+    oru-slapdIpAddress: 192.0.2.10
+    oru-slapdPort:1389
+    oru-slapdSecurePort: 636
+    oru-slapdSecurity: SSLTLS
     unchanged
 
 What is left as it was is not written:
@@ -44,63 +50,137 @@ A dry run shows what would be written:
 
     $ replace 's/1389/2389/'
     $ in_terminal -- cfg32 -f oruslapd.conf edit -n "$listener"
-    x
+    --- oruslapd.conf
+    +++ oruslapd.conf
+    @@ -115,7 +115,7 @@
+     objectclass: top
+     objectclass: oruListener
+     oru-slapdIpAddress: 192.0.2.10
+    -oru-slapdPort:1389
+    +oru-slapdPort:2389
+     oru-slapdSecurePort: 636
+     oru-slapdSecurity: SSLTLS
+     
     $ state_of oruslapd.conf | cmp - state
 
 A bad edit is shown at its lines; the editor is opened again on it, and then it is good:
 
     $ edit_by 'sed -i "s/99999/3389/; s/1389/99999/" "$1"'
-    $ in_terminal 'drop?' e -- cfg32 -f oruslapd.conf edit "$listener"
-    x
+    $ in_terminal '(d)rop?' e -- cfg32 -f oruslapd.conf edit "$listener"
+    PRIVATE/oruslapd.conf:7:15: error: Integer value out of range [invalid-value]
+        7 | oru-slapdPort:99999
+          |               ^~~~~
+          = accepted: an integer from 1 to 65535
+    1 error
+    (e)dit again, (w)rite or (d)rop? e
     $ cfg32 -f oruslapd.conf get "$listener" oru-slapdPort
     3389
 
 What only a load would put aside may be written, on demand:
 
     $ replace 's/3389/99999/'
-    $ in_terminal 'drop?' w -- cfg32 -f oruslapd.conf edit "$listener"
-    x
+    $ in_terminal '(d)rop?' w -- cfg32 -f oruslapd.conf edit "$listener"
+    PRIVATE/oruslapd.conf:7:15: error: Integer value out of range [invalid-value]
+        7 | oru-slapdPort:99999
+          |               ^~~~~
+          = accepted: an integer from 1 to 65535
+    1 error
+    (e)dit again, (w)rite or (d)rop? w
     $ grep -n 99999 oruslapd.conf
-    119:oru-slapdPort:99999
+    118:oru-slapdPort:99999
 
 A dropped edit leaves the file alone:
 
     $ state_of oruslapd.conf > state
     $ replace 's/99999/88888/'
-    $ in_terminal 'drop?' d -- cfg32 -f oruslapd.conf edit "$listener"
-    x
+    $ in_terminal '(d)rop?' d -- cfg32 -f oruslapd.conf edit "$listener"
+    PRIVATE/oruslapd.conf:7:15: error: Integer value out of range [invalid-value]
+        7 | oru-slapdPort:88888
+          |               ^~~~~
+          = accepted: an integer from 1 to 65535
+    1 error
+    (e)dit again, (w)rite or (d)rop? d
+    cfg32: dropped; nothing was written
+    [1]
     $ state_of oruslapd.conf | cmp - state
     $ ls private
 
 What can't be loaded is never written, and writing it is not offered:
 
     $ replace 's/^dn:.*/dn: no name/'
-    $ in_terminal 'drop?' w 'drop?' d -- cfg32 -f oruslapd.conf edit "$listener"
-    x
+    $ in_terminal '(d)rop?' w '(d)rop?' d -- cfg32 -f oruslapd.conf edit "$listener"
+    PRIVATE/oruslapd.conf:2:8: error: Invalid character in RDN attribute: n [invalid-dn]
+        2 | dn: no name
+          |        ^
+          = accepted: a distinguished name, such as cn=Name, cn=Configuration
+    PRIVATE/oruslapd.conf:7:15: error: Integer value out of range [invalid-value]
+        7 | oru-slapdPort:99999
+          |               ^~~~~
+          = accepted: an integer from 1 to 65535
+    2 errors
+    cfg32: this can't be loaded, so it can't be written
+    (e)dit again or (d)rop? w
+    (e)dit again or (d)rop? d
+    cfg32: dropped; nothing was written
+    [1]
     $ state_of oruslapd.conf | cmp - state
 
 When nobody answers nothing is written, and the edit is kept:
 
     $ cfg32 -f oruslapd.conf edit "$listener" < /dev/null 2>&1 | sed "s|$TMPDIR/cfg32-[^/]*|PRIVATE|"
-    x
+    PRIVATE/oruslapd.conf:2:8: error: Invalid character in RDN attribute: n [invalid-dn]
+        2 | dn: no name
+          |        ^
+          = accepted: a distinguished name, such as cn=Name, cn=Configuration
+    PRIVATE/oruslapd.conf:7:15: error: Integer value out of range [invalid-value]
+        7 | oru-slapdPort:99999
+          |               ^~~~~
+          = accepted: an integer from 1 to 65535
+    2 errors
+    cfg32: this can't be loaded, so it can't be written
+    (e)dit again or (d)rop? 
+    what you edited is kept in PRIVATE/oruslapd.conf
+    cfg32: nobody answered; nothing was written
+    [3]
     $ state_of oruslapd.conf | cmp - state
     $ cat private/*/* && rm -r private/*
+    # Plain port, kept for StartTLS clients; see also cn=TLS below.
+    dn: no name
+    cn: Client Listener
+    objectclass: top
+    objectclass: oruListener
+    oru-slapdIpAddress: 192.0.2.10
+    oru-slapdPort:99999
+    oru-slapdSecurePort: 636
+    oru-slapdSecurity: SSLTLS
 
 A change that somebody else made meanwhile is noticed; both are kept:
 
-    $ edit_by 'cfg32 -f oruslapd.conf set cn=Configuration oru-slapdVersion 9; echo "# Mine." >> "$1"'
+    $ edit_by 'sed -i "s/99999/3389/" "$1"; cfg32 -f oruslapd.conf set cn=Configuration oru-slapdVersion 9'
     $ in_terminal -- cfg32 -f oruslapd.conf edit "$listener"
-    x
+    what you edited is kept in PRIVATE/oruslapd.conf
+    cfg32: oruslapd.conf: Configuration file was changed meanwhile [DSA is busy (51)]
+    [3]
     $ cfg32 -f oruslapd.conf get cn=Configuration oru-slapdVersion
     9
     $ cat private/*/* && rm -r private/*
+    # Plain port, kept for StartTLS clients; see also cn=TLS below.
+    dn: cn=Client Listener, cn=Network, cn=Configuration
+    cn: Client Listener
+    objectclass: top
+    objectclass: oruListener
+    oru-slapdIpAddress: 192.0.2.10
+    oru-slapdPort:3389
+    oru-slapdSecurePort: 636
+    oru-slapdSecurity: SSLTLS
 
 An editor that fails writes nothing:
 
     $ state_of oruslapd.conf > state
     $ edit_by false
     $ in_terminal -- cfg32 -f oruslapd.conf edit
-    x
+    cfg32: the editor failed: editor
+    [3]
     $ state_of oruslapd.conf | cmp - state
 
 VISUAL comes before EDITOR:
@@ -111,10 +191,12 @@ VISUAL comes before EDITOR:
 An entry that is not there, or stands there twice, can't be edited by itself:
 
     $ cfg32 -f oruslapd.conf edit cn=nobody
-    x
+    cfg32: no entry cn=nobody [No such object (32)]
+    [1]
     $ printf 'dn: cn=a\n\ndn: CN=A\n' > twice.conf
     $ cfg32 -f twice.conf edit cn=a
-    x
+    cfg32: cn=a stands in the file several times: edit the whole file
+    [1]
 
 A file that can't be loaded is edited until it can:
 
@@ -122,3 +204,8 @@ A file that can't be loaded is edited until it can:
     $ replace 's/no name/cn=x/'
     $ cfg32 -f broken.conf edit
     $ cat broken.conf
+    dn: cn=x
+    cn: x
+    
+    dn: cn=Configuration
+    cn: x

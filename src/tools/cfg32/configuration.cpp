@@ -37,7 +37,19 @@ entry entry_of(CfgHandle* handle, CfgMessage* node) {
 }
 
 bool is_read_differently(const problem& found) {
-    return found.broken->outcome != consequence::none;
+    return found.broken->outcome != consequence::none || found.first_left_out > 0;
+}
+
+/// False when an entry has a DN that nobody could name it by.
+bool is_printable(const LDIF_Entry& root) try {
+    for_each_in_preorder(root, [](const LDIF_Entry& each) {
+        if (!each.is_root()) {
+            each.dn().str();
+        }
+    });
+    return true;
+} catch (const LDIF_Exception&) {
+    return false;
 }
 
 }  // namespace
@@ -50,11 +62,26 @@ configuration::configuration(const settings& options, std::string file_name)
       handle_(cfg_init(), cfg_unbind) {
     const progress loading("Loading " + name_);
     cfg_set_option(handle_.get(), CFG_OPT_KEY_DATA, key_.get());
-    cfg_set_option(handle_.get(), CFG_OPT_CONFIG_FILE, copy_.name().c_str());
-    if (cfg_bind_s(handle_.get(), nullptr, nullptr, CFG_AUTH_SIMPLE) != CFG_SUCCESS) {
-        load_part();
+    if (!is_loaded(text_) || !is_printable(root())) {
+        note_left_out();
+        load(loadable_part(text_, left_out_));
     } else if (copy_.text() != text_) {
         note_left_out();
+        load(text_);
+    }
+}
+
+/// Tries to load a text.
+bool configuration::is_loaded(std::string_view text) {
+    copy_ = memory_file(text);
+    cfg_set_option(handle_.get(), CFG_OPT_CONFIG_FILE, copy_.name().c_str());
+    return cfg_bind_s(handle_.get(), nullptr, nullptr, CFG_AUTH_SIMPLE) == CFG_SUCCESS;
+}
+
+/// Loads what can be loaded. Lines that are put aside are read as the next load will read them.
+void configuration::load(std::string_view text) {
+    if (!is_loaded(text) || !is_loaded(copy_.text())) {
+        fail(handle_.get(), cfg_get_errno(handle_.get()), name_);
     }
 }
 
@@ -70,14 +97,6 @@ void configuration::bind(const char* dn, const char* password) {
     if (code != CFG_SUCCESS) {
         fail(handle_.get(), code, name_);
     }
-}
-
-/// Loads what can be loaded of a file that as a whole can't.
-void configuration::load_part() {
-    note_left_out();
-    copy_ = memory_file(loadable_part(text_, left_out_));
-    cfg_set_option(handle_.get(), CFG_OPT_CONFIG_FILE, copy_.name().c_str());
-    bind(nullptr, nullptr);
 }
 
 void configuration::note_left_out() {

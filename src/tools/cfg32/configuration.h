@@ -41,8 +41,9 @@ class configuration {
     const LDIF_Entry& entry_at(const std::string& dn) const;
 
   private:
+    bool is_loaded(std::string_view text);
+    void load(std::string_view text);
     void bind(const char* dn, const char* password);
-    void load_part();
     void note_left_out();
 
     std::string name_;

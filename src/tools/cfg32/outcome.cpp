@@ -52,7 +52,9 @@ std::string told(const facts& known) {
     if (!known.attribute.empty()) {
         append_line(text, known.attribute, shown_value(known.attribute, known.value));
     }
-    if (known.violated && known.violated->name && known.code != CFG_DECODING_ERROR) {
+    if (known.code == CFG_CONSTRAINT_VIOLATION) {
+        append_line(text, "accepted", "one value");
+    } else if (known.violated && known.violated->name && known.code != CFG_DECODING_ERROR) {
         append_line(text, "accepted", accepted_values(*known.violated));
     }
     return text;

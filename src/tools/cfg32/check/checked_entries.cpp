@@ -220,11 +220,11 @@ void checked_entries::check_writing(const checked_entry& entry) {
         found.entry = entry.written;
         found.result = 21;
         found.extended = 1005;
+        found.first_left_out = where.line;
+        found.last_left_out = last;
         if (!is_rewritten_) {
             return;
         }
-        found.first_left_out = where.line;
-        found.last_left_out = last;
     }
 }
 

@@ -39,7 +39,8 @@ struct problem {
     std::string accepted;   ///< what would be accepted instead, in words, or empty
     int result = 0;         ///< LDAP result code that a load or a change would give, 0 for none
     int extended = 0;       ///< extended code, 0 for none
-    // The lines that have to be left out for a load to succeed (both included), 0 if none.
+    // The lines that have to be left out for a load, and then a write, to succeed (both included),
+    // 0 if none.
     int first_left_out = 0;
     int last_left_out = 0;
 };

@@ -1,0 +1,120 @@
+It puts a backup back, byte for byte, after showing what that changes, and keeps what it replaces:
+
+    $ export NO_COLOR=1
+    $ . "$TOOLS/scratch.sh"
+    $ cp oruslapd.conf original
+    $ cfg32 -f oruslapd.conf set cn=Configuration oru-slapdVersion 9
+    $ cp oruslapd.conf changed
+    $ cfg32 -f oruslapd.conf restore | grep '^[-+]oru-slapdVersion'
+    +oru-slapdVersion: 4.2.1
+    -oru-slapdVersion: 9
+    $ cmp original oruslapd.conf && cmp changed oruslapd.conf.before-restore && cmp original oruslapd.conf.bak
+
+What is there already is not written:
+
+    $ state_of oruslapd.conf > state
+    $ cfg32 -f oruslapd.conf restore
+    unchanged
+    $ state_of oruslapd.conf | cmp - state
+
+A restore is undone by restoring what it kept, and that again:
+
+    $ cfg32 -f oruslapd.conf restore oruslapd.conf.before-restore > diff
+    $ cmp changed oruslapd.conf && cmp original oruslapd.conf.before-undo
+    $ cfg32 -f oruslapd.conf restore oruslapd.conf.before-undo > diff
+    $ cmp original oruslapd.conf
+
+A dry run only shows it:
+
+    $ state_of oruslapd.conf > state
+    $ sed 's/^version: 1$/# one\n&/; s/^oru-slapdAdminPW: >.*/oru-slapdAdminPW: sesame/' original > small-change
+    $ cfg32 -f oruslapd.conf restore -n small-change
+    --- oruslapd.conf
+    +++ oruslapd.conf
+    @@ -16,6 +16,7 @@
+     # or the attribute that follows them.
+     # ---------------------------------------------------------------------------
+     
+    +# one
+     version: 1
+     # The file is UTF-8 throughout, comments included.
+     charset: UTF-8
+    @@ -27,7 +28,7 @@
+     objectclass: top
+     objectclass: oruConfigTop
+     oru-slapdAdminDN: cn=root
+    -oru-slapdAdminPW: ********
+    +oru-slapdAdminPW: ********
+     # Assigned once by the installer; two servers must never share it.
+     oru-slapdServerID: 7c1f0a52-lindau-01
+     oru-slapdVersion: 4.2.1
+    $ state_of oruslapd.conf | cmp - state
+
+At a terminal it asks; another answer than yes leaves the file alone:
+
+    $ "$TOOLS"/in_terminal '[y/n]' n -- cfg32 -f oruslapd.conf restore small-change | tail -1
+    Restore? [y/n] n
+    $ state_of oruslapd.conf | cmp - state
+    $ "$TOOLS"/in_terminal '[y/n]' y -- cfg32 -f oruslapd.conf restore small-change | tail -1
+    Restore? [y/n] y
+    $ cmp small-change oruslapd.conf
+    $ "$TOOLS"/in_terminal -- cfg32 -f oruslapd.conf restore --yes original > diff
+    $ cmp original oruslapd.conf
+
+What can't be loaded is not restored, and it is said why; what a load would put aside is told:
+
+    $ printf 'dn: cn=Configuration\ncn: x\n\ndn: no name\n' > broken
+    $ cfg32 -f oruslapd.conf restore broken
+    broken:4:8: error: Invalid character in RDN attribute: n [invalid-dn]
+        4 | dn: no name
+          |        ^
+          = accepted: a distinguished name, such as cn=Name, cn=Configuration
+    1 error
+    cfg32: broken can't be loaded; nothing was restored
+    [1]
+    $ cmp original oruslapd.conf
+    $ printf 'dn: cn=Configuration\noru-slapdPort: 0\n' > doubtful
+    $ cfg32 -f oruslapd.conf restore doubtful 2>&1 > diff
+    doubtful:2:16: error: Integer value out of range [invalid-value]
+        2 | oru-slapdPort: 0
+          |                ^
+          = accepted: an integer from 1 to 65535
+    1 error
+    $ cmp doubtful oruslapd.conf
+
+A file that can't be loaded is no obstacle:
+
+    $ cp broken oruslapd.conf
+    $ cfg32 -f oruslapd.conf restore original > diff
+    $ cmp original oruslapd.conf && cmp broken oruslapd.conf.before-restore
+
+Neither is one that was not written to its end. It is not kept: the backup is the complete version.
+
+    $ rm oruslapd.conf.before-restore
+    $ printf '# This file is being written. If it stays so, its backup is the complete version.\ndn: cn=C' > oruslapd.conf
+    $ cp original oruslapd.conf.bak
+    $ cfg32 -f oruslapd.conf restore > diff
+    $ cmp original oruslapd.conf && ls oruslapd.conf.before-restore
+    ls: cannot access 'oruslapd.conf.before-restore': No such file or directory
+    [2]
+
+Nor a file that is gone; the new one has the backup's mode:
+
+    $ rm oruslapd.conf && chmod 640 oruslapd.conf.bak
+    $ cfg32 -f oruslapd.conf restore > diff
+    $ cmp original oruslapd.conf && stat --format=%a oruslapd.conf
+    640
+
+Where the replaced file goes can be said, but not over what is restored:
+
+    $ cfg32 -f oruslapd.conf --backup kept restore changed > diff
+    $ cmp original kept && cmp changed oruslapd.conf
+    $ cfg32 -f oruslapd.conf --backup kept restore kept
+    cfg32: what is restored can't be overwritten: kept
+    [2]
+    $ cfg32 -f oruslapd.conf restore nowhere
+    cfg32: nowhere: No such file or directory [Connection error (91)]
+    [3]
+    $ rm -f oruslapd.conf.bak; cfg32 -f oruslapd.conf restore
+    cfg32: oruslapd.conf.bak: No such file or directory [Connection error (91)]
+    [3]
