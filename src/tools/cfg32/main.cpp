@@ -74,7 +74,9 @@ int run(const action& carry_out) {
     } catch (const LDIF_Exception& e) {
         complain(report(e));
     } catch (const std::exception& e) {
-        complain(e.what());
+        if (!ferror(stdout)) {  // which is told at the end
+            complain(e.what());
+        }
     }
     return failed;
 }
