@@ -21,8 +21,17 @@ namespace cfg32::tool {
 /// Carries the command out, after its arguments were parsed. Returns the exit status.
 using action = std::function<int()>;
 
+/// What is the same for many commands.
+enum traits : unsigned {
+    none = 0,
+    binds = 1,    ///< works on the configuration as whoever -D names
+    changes = 2,  ///< has -n, which only shows the change
+    prints = 4    ///< has --json
+};
+
 struct command {
     const char* name;
+    unsigned traits;
     const char* summary;
     /// Adds the command's own arguments and options to the parser.
     action (*define)(CLI::App& parser, settings& options);
@@ -30,11 +39,7 @@ struct command {
 
 std::span<const command> commands();
 
-// Options that several commands have.
-void add_json_option(CLI::App& parser, settings& options);
-void add_dry_run_option(CLI::App& parser, settings& options);
-
-#define COMMAND(name, summary) action define_##name(CLI::App& parser, settings& options);
+#define COMMAND(name, traits, summary) action define_##name(CLI::App& parser, settings& options);
 #include "commands.def"
 #undef COMMAND
 

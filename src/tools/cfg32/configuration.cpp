@@ -107,8 +107,8 @@ void configuration::note_left_out() {
              "tells more):");
     for (const problem& found : left_out_) {
         const bool is_kept = found.broken->outcome == consequence::kept_aside;
-        fmt::print(stderr, "{}:{}: {}, {}\n", name_, found.line, found.text,
-                   is_kept ? "kept as oru-slapdInvalidLine" : "left out");
+        tell(fmt::format("{}:{}: {}, {}\n", name_, found.line, found.text,
+                         is_kept ? "kept as oru-slapdInvalidLine" : "left out"));
     }
 }
 

@@ -45,7 +45,12 @@ std::string styled(std::FILE* stream, const fmt::text_style& style, std::string_
 }
 
 void complain(std::string_view message) {
-    fmt::print(stderr, "{} {}\n", styled(stderr, style::error, "cfg32:"), message);
+    tell(fmt::format("{} {}\n", styled(stderr, style::error, "cfg32:"), message));
+}
+
+void tell(std::string_view text) {
+    // Where nobody listens there is nobody to tell that.
+    [[maybe_unused]] const size_t written = fwrite(text.data(), 1, text.size(), stderr);
 }
 
 bool is_interactive() { return isatty(STDIN_FILENO) && isatty(STDERR_FILENO); }
@@ -63,11 +68,11 @@ secret ask_secret(const std::string& prompt) {
 
 char ask(const std::string& question, std::string_view letters) {
     for (;;) {
-        fmt::print(stderr, "{} ", question);
+        tell(fmt::format("{} ", question));
         fflush(stderr);
         std::string answer;
         if (!std::getline(std::cin, answer)) {
-            fmt::print(stderr, "\n");
+            tell("\n");
             return '\0';
         }
         if (answer.size() == 1 && letters.find(answer.front()) != std::string_view::npos) {
@@ -88,7 +93,7 @@ progress::~progress() {
             const std::scoped_lock lock(mutex_);
             is_over_ = true;
         }
-        ended_.notify_one();
+        over_.notify_one();
         thread_.join();
     }
 }
@@ -96,12 +101,12 @@ progress::~progress() {
 void progress::show() {
     std::unique_lock lock(mutex_);
     int seconds = 0;
-    while (!ended_.wait_for(lock, patience, [this] { return is_over_; })) {
-        fmt::print(stderr, "\r{} ... {} s", what_, ++seconds);
+    while (!over_.wait_for(lock, patience, [this] { return is_over_; })) {
+        tell(fmt::format("\r{} ... {} s", what_, ++seconds));
         fflush(stderr);
     }
     if (seconds > 0) {
-        fmt::print(stderr, "\r\033[K");  // the line is for the result
+        tell("\r\033[K");  // the line is for the result
         fflush(stderr);
     }
 }

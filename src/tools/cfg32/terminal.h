@@ -35,6 +35,9 @@ std::string styled(std::FILE* stream, const fmt::text_style& style, std::string_
 /// Prints "cfg32: " and the message on standard error.
 void complain(std::string_view message);
 
+/// Writes on standard error.
+void tell(std::string_view text);
+
 /// True when a person can be asked something.
 bool is_interactive();
 
@@ -58,7 +61,7 @@ class progress {
 
     std::string what_;
     std::mutex mutex_;
-    std::condition_variable ended_;
+    std::condition_variable over_;
     bool is_over_ = false;
     std::thread thread_;
 };

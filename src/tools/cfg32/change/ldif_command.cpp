@@ -84,7 +84,7 @@ void require_none(const std::vector<skipped_record>& bad) {
 
 }  // namespace
 
-std::shared_ptr<ldif_options> add_ldif_options(CLI::App& parser, settings& options) {
+std::shared_ptr<ldif_options> add_ldif_options(CLI::App& parser) {
     auto given = std::make_shared<ldif_options>();
     parser
         .add_option("-l,--ldif", given->file,
@@ -92,8 +92,6 @@ std::shared_ptr<ldif_options> add_ldif_options(CLI::App& parser, settings& optio
         ->type_name("FILE");
     parser.add_flag("-c,--continue", given->how.goes_on,
                     "leave out records that fail, and say which");
-    add_dry_run_option(parser, options);
-    add_json_option(parser, options);
     return given;
 }
 

@@ -17,9 +17,8 @@ struct ldif_options {
     update_options how;
 };
 
-/// Adds -l and -c, and the options of all commands that change something. The result lives as long
-/// as the command's action keeps it.
-std::shared_ptr<ldif_options> add_ldif_options(CLI::App& parser, settings& options);
+/// Adds -l and -c. The result lives as long as the command's action keeps it.
+std::shared_ptr<ldif_options> add_ldif_options(CLI::App& parser);
 
 /// Reads the LDIF text, carries its records out and prints the result. only_default: records of
 /// another kind are errors. Returns the exit status.

@@ -35,8 +35,6 @@ action define_apply(CLI::App& parser, settings& options) {
     parser.add_option("wanted", *wanted, "the file that has the wanted content")
         ->type_name("FILE")
         ->required();
-    add_dry_run_option(parser, options);
-    add_json_option(parser, options);
     return [wanted, &options] { return apply_all(options, *wanted); };
 }
 

@@ -109,7 +109,6 @@ action define_check(CLI::App& parser, settings& options) {
                                                    {"sarif", sarif_report},
                                                    {"github", github_report}},
                                                   "how to print the problems; else text");
-    add_json_option(parser, options);
     parser.get_option("--json")->description("the same as --format json")->excludes(format);
     return [given, &options] { return check(options, *given); };
 }

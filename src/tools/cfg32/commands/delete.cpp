@@ -1,4 +1,4 @@
-// `cfg32 delete`: deletes entries.
+// cfg32 delete: deletes entries.
 
 #include <CLI/CLI.hpp>
 
@@ -21,7 +21,7 @@ int delete_entries(const settings& options, const std::vector<std::string>& dns,
 }  // namespace
 
 action define_delete(CLI::App& parser, settings& options) {
-    const auto given = add_ldif_options(parser, options);
+    const auto given = add_ldif_options(parser);
     const auto dns = std::make_shared<std::vector<std::string>>();
     parser.add_flag("-r,--recursive", given->how.deletes_trees,
                     "delete an entry with everything below it");

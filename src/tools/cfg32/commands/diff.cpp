@@ -133,7 +133,6 @@ action define_diff(CLI::App& parser, settings& options) {
         parser, "--format", given->format,
         {{"ldif", as_ldif}, {"text", as_text}, {"json", as_json}},
         "changes that `cfg32 modify` takes, lines to read, or JSON; else ldif");
-    add_json_option(parser, options);
     parser.get_option("--json")->description("the same as --format json")->excludes(format);
     return [given, &options] { return diff(options, *given); };
 }

@@ -122,7 +122,7 @@ session::choice session::review(const std::string& draft) {
     if (found.problems.empty() && found.is_loadable) {
         return write;
     }
-    fmt::print(stderr, "{}", text_report({{path_, draft, found.problems}}));
+    tell(text_report({{path_, draft, found.problems}}));
     if (!found.is_loadable) {
         complain("this can't be loaded, so it can't be written");
     }
@@ -170,7 +170,7 @@ int session::run() {
 void session::keep_draft() {
     if (read_configuration(path_) != text_.part()) {
         folder_.keep();
-        fmt::print(stderr, "what you edited is kept in {}\n", path_);
+        tell(fmt::format("what you edited is kept in {}\n", path_));
     }
 }
 
@@ -179,7 +179,6 @@ void session::keep_draft() {
 action define_edit(CLI::App& parser, settings& options) {
     const auto dn = std::make_shared<std::string>();
     parser.add_option("dn", *dn, "the entry to edit; else the whole file")->type_name("DN");
-    add_dry_run_option(parser, options);
     parser.footer("The editor is the one that VISUAL or EDITOR names, else vi.");
     return [dn, &options] { return session(options, *dn).run(); };
 }

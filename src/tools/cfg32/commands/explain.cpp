@@ -61,7 +61,6 @@ action define_explain(CLI::App& parser, settings& options) {
     parser.add_option("attributes", *names, "names of attributes, in upper or lower case")
         ->type_name("ATTR")
         ->required();
-    add_json_option(parser, options);
     return [names, &options] { return explain(*names, options.is_json); };
 }
 

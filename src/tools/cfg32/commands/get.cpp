@@ -67,7 +67,6 @@ action define_get(CLI::App& parser, settings& options) {
     parser.add_option("attribute", given->attribute, "the attribute")
         ->type_name("ATTR")
         ->required();
-    add_json_option(parser, options);
     return [given, &options] { return get(options, *given); };
 }
 

@@ -1,4 +1,4 @@
-// `cfg32 passwd`: sets a password from a prompt.
+// cfg32 passwd: sets a password from a prompt.
 
 #include <CLI/CLI.hpp>
 
@@ -64,8 +64,6 @@ action define_passwd(CLI::App& parser, settings& options) {
     parser.add_option("attribute", given->attribute, "the password's attribute")
         ->type_name("ATTR")
         ->required();
-    add_dry_run_option(parser, options);
-    add_json_option(parser, options);
     return [&options, given] { return passwd(options, *given); };
 }
 

@@ -57,7 +57,7 @@ void require_loadable(const std::string& name, const std::string& text, aes_key_
     if (problems.empty()) {
         return;
     }
-    fmt::print(stderr, "{}", text_report({{name, text, problems}}));
+    tell(text_report({{name, text, problems}}));
     const bool is_loadable = std::none_of(
         problems.begin(), problems.end(),
         [](const problem& each) { return each.broken->outcome == consequence::stops_load; });
@@ -115,7 +115,6 @@ action define_restore(CLI::App& parser, settings& options) {
     const auto given = std::make_shared<arguments>();
     parser.add_option("backup", given->backup, "the backup; else FILE.bak")->type_name("BACKUP");
     parser.add_flag("--yes", given->is_confirmed, "don't ask at a terminal");
-    add_dry_run_option(parser, options);
     parser.footer("What is replaced is kept as FILE.before-restore, or where --backup says.");
     return [given, &options] { return restore(options, *given); };
 }

@@ -61,7 +61,6 @@ action define_schema(CLI::App& parser, settings& options) {
         parser, "--format", *print,
         {{"table", print_table}, {"json", print_as_json}, {"markdown", print_markdown}},
         "how to print the list; else as a table");
-    add_json_option(parser, options);
     parser.get_option("--json")->description("the same as --format json")->excludes(format);
     return [print, &options] {
         (options.is_json ? print_as_json : *print)(all_attributes());

@@ -94,7 +94,6 @@ action define_search(CLI::App& parser, settings& options) {
         ->type_name("FILTER");
     parser.add_option("attributes", given->attributes, "the attributes to print; else all")
         ->type_name("ATTR");
-    add_json_option(parser, options);
     return [given, &options] {
         tell_filter_from_attribute(*given);
         return search(options, *given);

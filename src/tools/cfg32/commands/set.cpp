@@ -1,4 +1,4 @@
-// `cfg32 set`: gives an attribute these values.
+// cfg32 set: gives an attribute these values.
 
 #include <CLI/CLI.hpp>
 
@@ -53,8 +53,6 @@ action define_set(CLI::App& parser, settings& options) {
         ->required();
     parser.add_flag("--unknown-attribute", given->takes_any_name,
                     "take a name that the server does not know");
-    add_dry_run_option(parser, options);
-    add_json_option(parser, options);
     return [&options, given] { return set(options, *given); };
 }
 

@@ -136,7 +136,6 @@ action define_tree(CLI::App& parser, settings& options) {
                               {{"unicode", unicode}, {"ascii", ascii}, {"cp437", cp437}},
                               "the characters to draw with; else unicode");
     parser.add_option("base", given->base, "the entry to begin at; else all")->type_name("DN");
-    add_json_option(parser, options);
     return [given, &options] { return tree(options, *given); };
 }
 

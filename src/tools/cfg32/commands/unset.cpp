@@ -1,4 +1,4 @@
-// `cfg32 unset`: removes an attribute, or some of its values.
+// cfg32 unset: removes an attribute, or some of its values.
 
 #include <CLI/CLI.hpp>
 
@@ -25,8 +25,6 @@ action define_unset(CLI::App& parser, settings& options) {
         ->required();
     parser.add_option("value", given->values, "the values to remove; without any, all of them")
         ->type_name("VALUE");
-    add_dry_run_option(parser, options);
-    add_json_option(parser, options);
     return [&options, given] {
         require_no_secrets(given->attribute, given->values);
         return change_attribute(options, given->dn,
