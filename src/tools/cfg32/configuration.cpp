@@ -100,16 +100,25 @@ void configuration::bind(const char* dn, const char* password) {
 }
 
 void configuration::note_left_out() {
-    left_out_ = find_problems(text_, key_.get());
-    std::erase_if(left_out_, [](const problem& found) { return !is_read_differently(found); });
-    complain(name_ +
-             ": read from a private copy, because not all of it can be used (`cfg32 check` "
-             "tells more):");
-    for (const problem& found : left_out_) {
+    left_out_ = unused_lines(text_, key_.get());
+    tell_unused(name_, "read from a private copy, because not all of it can be used", left_out_);
+}
+
+std::vector<problem> unused_lines(std::string_view text, aes_key_data* key) {
+    std::vector<problem> found = find_problems(text, key);
+    std::erase_if(found, [](const problem& each) { return !is_read_differently(each); });
+    return found;
+}
+
+void tell_unused(const std::string& name, std::string_view what,
+                 const std::vector<problem>& unused) {
+    std::string message = fmt::format("{}: {} (`cfg32 check` tells more):", name, what);
+    for (const problem& found : unused) {
         const bool is_kept = found.broken->outcome == consequence::kept_aside;
-        tell(fmt::format("{}:{}: {}, {}\n", name_, found.line, found.text,
-                         is_kept ? "kept as oru-slapdInvalidLine" : "left out"));
+        message += fmt::format("\n  line {}: {}, {}", found.line, found.text,
+                               is_kept ? "kept as oru-slapdInvalidLine" : "left out");
     }
+    complain(message);
 }
 
 std::vector<entry> configuration::search(const std::string& base, int scope,
@@ -130,6 +139,12 @@ std::vector<entry> configuration::search(const std::string& base, int scope,
         entries.push_back(entry_of(handle_.get(), node));
     }
     return entries;
+}
+
+void require_bind(const settings& options) {
+    if (!options.bind_dn.empty()) {
+        const configuration bound(options);
+    }
 }
 
 const LDIF_Entry& configuration::root() const { return handle_->file->root(); }

@@ -54,6 +54,16 @@ class configuration {
     std::vector<problem> left_out_;
 };
 
+/// The lines of a text that a load does not use, or not as they stand.
+std::vector<problem> unused_lines(std::string_view text, aes_key_data* key);
+
+/// Tells of them on standard error.
+void tell_unused(const std::string& name, std::string_view what,
+                 const std::vector<problem>& unused);
+
+/// Ends the command when the options name somebody who can't bind to the file.
+void require_bind(const settings& options);
+
 /// An entry's printable form.
 entry entry_of(const LDIF_Entry& node);
 

@@ -38,6 +38,19 @@ void append_line(std::string& text, std::string_view label, std::string_view wha
     }
 }
 
+/// For the results that are about the value.
+std::string accepted_instead(const facts& known) {
+    switch (known.code) {
+        case CFG_CONSTRAINT_VIOLATION:
+            return "one value";
+        case CFG_INVALID_SYNTAX:
+        case CFG_INVALID_DN_SYNTAX:
+            return known.violated && known.violated->name ? accepted_values(*known.violated) : "";
+        default:
+            return {};
+    }
+}
+
 std::string told(const facts& known) {
     std::string text;
     if (!known.file.empty()) {
@@ -48,15 +61,14 @@ std::string told(const facts& known) {
     if (known.system_error != 0) {
         append_line(text, "system error", strerror(known.system_error));
     }
-    append_line(text, "entry", known.entry);
-    if (!known.attribute.empty()) {
+    append_line(text, "entry", known.entry == "<root>" ? "above all entries" : known.entry);
+    const bool has_line = !known.value.empty() && known.value.find('\n') == std::string::npos;
+    if (has_line && !known.attribute.empty()) {
         append_line(text, known.attribute, shown_value(known.attribute, known.value));
+    } else {
+        append_line(text, "attribute", known.attribute);
     }
-    if (known.code == CFG_CONSTRAINT_VIOLATION) {
-        append_line(text, "accepted", "one value");
-    } else if (known.violated && known.violated->name && known.code != CFG_DECODING_ERROR) {
-        append_line(text, "accepted", accepted_values(*known.violated));
-    }
+    append_line(text, "accepted", accepted_instead(known));
     return text;
 }
 
@@ -66,9 +78,16 @@ struct own_message {
     const char* text;
 };
 constexpr own_message own_messages[] = {
+    {CFG_INVALID_CREDENTIALS, "not the administrator's DN and password"},
     {CFG_DECODING_ERROR, "a stored password can't be decoded with this key, or without one"},
     {162, "text that is not of the locale's character set"},
 };
+
+const char* own_message_for(int code) {
+    const auto found = std::find_if(std::begin(own_messages), std::end(own_messages),
+                                    [&](const own_message& each) { return each.code == code; });
+    return found == std::end(own_messages) ? nullptr : found->text;
+}
 
 }  // namespace
 
@@ -83,15 +102,17 @@ std::string with_result(std::string_view text, int code) {
 
 void fail(int code, std::string_view text) { throw ended(failed, with_result(text, code)); }
 
+void fail_for_system(std::string_view what, int error) {
+    throw ended(failed, fmt::format("{}: {}", what, strerror(error)));
+}
+
 std::string message_of(const LDIF_Exception& e) {
     const LDIF_Exception* inner = &e;
     while (inner->cause) {
         inner = inner->cause.get();
     }
-    const auto own =
-        std::find_if(std::begin(own_messages), std::end(own_messages),
-                     [&](const own_message& each) { return each.code == inner->ldapErr; });
-    return own == std::end(own_messages) ? inner->msg : own->text;
+    const char* own = own_message_for(inner->ldapErr);
+    return own ? own : inner->msg;
 }
 
 std::string report(const LDIF_Exception& e, std::string_view file_name) {
@@ -113,7 +134,8 @@ void fail(CfgHandle* handle, int code, std::string_view file_name) {
     known.file = file_name;
     known.code = code;
     const int extended = cfg_get_exterror(handle);
-    known.message = cfg_err2string(extended != 0 ? extended : code);
+    const char* own = own_message_for(code);
+    known.message = own ? own : cfg_err2string(extended != 0 ? extended : code);
     if (cfg_dump_exception(handle)) {
         known.line = cfg_get_file_line(handle);
         known.entry = cfg_get_entry(handle);

@@ -37,6 +37,9 @@ std::string with_result(std::string_view text, int code);
 /// Ends the command with an LDAP result.
 [[noreturn]] void fail(int code, std::string_view text);
 
+/// Ends the command with what the system said (an errno) of a file or another thing.
+[[noreturn]] void fail_for_system(std::string_view what, int error);
+
 /// What the innermost cause says, which is the most; or what this program says in its place.
 std::string message_of(const LDIF_Exception& e);
 

@@ -6,7 +6,6 @@
 
 #include <cerrno>
 #include <cstdlib>
-#include <cstring>
 #include <system_error>
 
 #include "disk.h"
@@ -15,16 +14,10 @@
 
 namespace cfg32::tool {
 
-namespace {
-
-constexpr mode_t of_owner_only = 0600;
-
-}  // namespace
-
 private_folder::private_folder() {
     std::string name = (std::filesystem::temp_directory_path() / "cfg32-XXXXXX").string();
     if (!mkdtemp(name.data())) {
-        throw ended(failed, name + ": " + strerror(errno));
+        fail_for_system(name, errno);
     }
     path_ = name;
 }
@@ -40,7 +33,7 @@ std::string private_folder::write(const std::string& name, std::string_view text
     const std::string path = (path_ / name).string();
     unique_fd file(open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, of_owner_only));
     if (!file || !replace_content(file.get(), text) || !file.close()) {
-        throw ended(failed, path + ": " + strerror(errno));
+        fail_for_system(path, errno);
     }
     return path;
 }

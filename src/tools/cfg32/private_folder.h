@@ -1,10 +1,14 @@
 #pragma once
 
+#include <sys/stat.h>
+
 #include <filesystem>
 #include <string>
 #include <string_view>
 
 namespace cfg32::tool {
+
+inline constexpr mode_t of_owner_only = 0600;
 
 /// A folder that only its owner can look into, removed with the object unless it is kept.
 class private_folder {

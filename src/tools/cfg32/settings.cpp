@@ -21,7 +21,7 @@ secret first_line(const std::string& name) {
     std::ifstream file(name);
     std::string line;
     if (!file || !(std::getline(file, line) || file.eof())) {
-        throw ended(usage_error, name + ": " + strerror(errno));
+        fail_for_system(name, errno);
     }
     secret text(line);
     wipe(line);

@@ -5,7 +5,9 @@
 #include <bsd/readpassphrase.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <array>
+#include <cctype>
 #include <chrono>
 #include <cstdio>
 #include <cstdlib>
@@ -36,6 +38,14 @@ bool is_coloured(std::FILE* stream) {
 /// From when on, and how often, it is said what is being done.
 constexpr auto patience = 1s;
 
+/// Names and values that a message quotes shall not steer the terminal.
+std::string without_controls(std::string_view message) {
+    std::string text(message);
+    const auto is_control = [](unsigned char c) { return c != '\n' && iscntrl(c); };
+    std::replace_if(text.begin(), text.end(), is_control, '?');
+    return text;
+}
+
 }  // namespace
 
 void choose_color(color_choice choice) { chosen = choice; }
@@ -45,7 +55,7 @@ std::string styled(std::FILE* stream, const fmt::text_style& style, std::string_
 }
 
 void complain(std::string_view message) {
-    tell(fmt::format("{} {}\n", styled(stderr, style::error, "cfg32:"), message));
+    tell(fmt::format("{} {}\n", styled(stderr, style::error, "cfg32:"), without_controls(message)));
 }
 
 void tell(std::string_view text) {
@@ -53,7 +63,7 @@ void tell(std::string_view text) {
     [[maybe_unused]] const size_t written = fwrite(text.data(), 1, text.size(), stderr);
 }
 
-bool is_interactive() { return isatty(STDIN_FILENO) && isatty(STDERR_FILENO); }
+bool can_be_asked() { return isatty(STDIN_FILENO) && isatty(STDERR_FILENO); }
 
 secret ask_secret(const std::string& prompt) {
     std::array<char, CFG32_PASSWORD_MAX + 2> buffer{};
@@ -75,8 +85,9 @@ char ask(const std::string& question, std::string_view letters) {
             tell("\n");
             return '\0';
         }
-        if (answer.size() == 1 && letters.find(answer.front()) != std::string_view::npos) {
-            return answer.front();
+        const char letter = static_cast<char>(tolower(static_cast<unsigned char>(answer[0])));
+        if (letters.find(letter) != std::string_view::npos) {
+            return letter;
         }
     }
 }

@@ -38,14 +38,14 @@ void complain(std::string_view message);
 /// Writes on standard error.
 void tell(std::string_view text);
 
-/// True when a person can be asked something.
-bool is_interactive();
+/// True when a person sees a question and can answer it.
+bool can_be_asked();
 
 /// Asks for a text without echo, at the terminal or, without one, on standard input.
 secret ask_secret(const std::string& prompt);
 
-/// Asks a question on standard error until one of the letters answers it on standard input; NUL at
-/// the end of the input.
+/// Asks a question on standard error until a word that begins with one of the letters answers it on
+/// standard input; NUL at the end of the input.
 char ask(const std::string& question, std::string_view letters);
 
 /// Tells on a terminal's standard error what is being done, once it takes longer than a second.

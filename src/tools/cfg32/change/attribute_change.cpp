@@ -19,7 +19,7 @@ std::string spelled_name(const std::string& attribute) {
 }
 
 void require_no_secrets(const std::string& attribute, const std::vector<std::string>& values) {
-    if (!is_password_attribute(attribute)) {
+    if (!is_password_line(attribute)) {
         return;
     }
     for (const std::string& value : values) {
@@ -35,7 +35,9 @@ void require_no_secrets(const std::string& attribute, const std::vector<std::str
 int change_attribute(const settings& options, const std::string& dn, modification change) {
     change_record record = {change_record::modify, dn, {}};
     record.modifications.push_back(std::move(change));
-    return print_result(options, update(options, {std::move(record)}, {}));
+    update_options how;
+    how.may_be_gone = true;
+    return print_result(options, update(options, {std::move(record)}, how));
 }
 
 }  // namespace cfg32::tool

@@ -4,10 +4,7 @@
 
 #include <CLI/CLI.hpp>
 #include <cerrno>
-#include <cstring>
-#include <fstream>
-#include <iostream>
-#include <iterator>
+#include <cstdio>
 
 #include "change/ldif_reader.h"
 #include "outcome.h"
@@ -16,27 +13,28 @@ namespace cfg32::tool {
 
 namespace {
 
-std::string all_of(std::istream& in, const std::string& name) {
-    std::string text{std::istreambuf_iterator<char>(in), {}};
-    if (in.bad()) {
-        throw ended(failed, name + ": can't be read");
+std::string all_of(std::FILE* in, const std::string& name) {
+    std::string text;
+    char buffer[65536];
+    while (const size_t count = fread(buffer, 1, sizeof buffer, in)) {
+        text.append(buffer, count);
+    }
+    if (ferror(in)) {
+        fail_for_system(name, errno);
     }
     return text;
 }
 
-std::string read_source(const ldif_options& given) {
+std::string read_source(const ldif_options& given, const std::string& name) {
     if (given.file.empty()) {
-        return all_of(std::cin, given.how.source);
+        return all_of(stdin, name);
     }
-    errno = 0;
-    std::ifstream file(given.file, std::ios::binary);
-    if (!file || file.peek() == std::ifstream::traits_type::eof()) {
-        const int error = errno;
-        if (error != 0) {
-            throw ended(usage_error, given.file + ": " + strerror(error));
-        }
+    const std::unique_ptr<std::FILE, int (*)(std::FILE*)> file(fopen(given.file.c_str(), "re"),
+                                                               fclose);
+    if (!file) {
+        fail_for_system(name, errno);
     }
-    return all_of(file, given.file);
+    return all_of(file.get(), name);
 }
 
 /// The records of a text, and what is wrong with those that are not well-formed.
@@ -99,7 +97,8 @@ int update_from_ldif(const settings& options, const ldif_options& given,
                      change_record::operation default_kind, bool only_default) {
     update_options how = given.how;
     how.source = given.file.empty() ? "standard input" : given.file;
-    ldif_records records = records_of(read_source(given), how.source, default_kind, only_default);
+    ldif_records records =
+        records_of(read_source(given, how.source), how.source, default_kind, only_default);
     if (!how.goes_on) {
         require_none(records.bad);
     }

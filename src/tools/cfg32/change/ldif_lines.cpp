@@ -8,6 +8,8 @@
 
 #include <algorithm>
 
+#include "hidden_passwords.h"
+
 namespace cfg32::tool {
 
 namespace {
@@ -89,12 +91,16 @@ std::vector<ldif_lines> split_records(std::string_view text) {
     return records;
 }
 
+bool is_attribute_name(std::string_view text) {
+    return !text.empty() && text.find_first_not_of(name_characters) == std::string_view::npos;
+}
+
 void require_name(std::string_view name, int line) {
     if (name.empty()) {
         throw ldif_error{line, "an attribute's name is missing"};
     }
-    if (name.find_first_not_of(name_characters) != std::string_view::npos) {
-        throw ldif_error{line, fmt::format("\"{}\" is not an attribute's name", name)};
+    if (!is_attribute_name(name)) {
+        throw ldif_error{line, fmt::format("\"{}\" is not an attribute's name", shown_line(name))};
     }
 }
 

@@ -36,6 +36,9 @@ named_value parse_line(const ldif_text_line& line);
 /// Compares names, whose case means nothing.
 bool is_same_name(std::string_view left, std::string_view right);
 
+/// True for a text that can be an attribute's name in LDIF.
+bool is_attribute_name(std::string_view text);
+
 /// Throws ldif_error for a text that is no attribute's name.
 void require_name(std::string_view name, int line);
 

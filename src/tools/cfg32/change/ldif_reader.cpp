@@ -11,6 +11,7 @@
 #include <utility>
 
 #include "change/ldif_lines.h"
+#include "hidden_passwords.h"
 
 namespace cfg32::tool {
 
@@ -91,9 +92,11 @@ modification take_block(line_span& lines, modification::operation kind) {
     const named_value head = parse_line(lines.front());
     require_name(head.value, head.line);
     modification block = {kind, head.value, {}, head.line};
+    bool is_ended = false;
     for (lines = lines.subspan(1); !lines.empty(); lines = lines.subspan(1)) {
         if (lines.front().text == "-") {
             lines = lines.subspan(1);
+            is_ended = true;
             break;
         }
         if (lines.front().text.starts_with('-')) {
@@ -103,12 +106,16 @@ modification take_block(line_span& lines, modification::operation kind) {
         if (!is_same_name(line.name, block.attribute)) {
             throw ldif_error{line.line,
                              fmt::format("\"{}\" in the block of {}, which a line \"-\" ends",
-                                         line.name, block.attribute)};
+                                         shown_line(line.name), shown_line(block.attribute))};
         }
         add_value(block, line);
     }
     if (kind == modification::add && block.values.empty()) {
         throw ldif_error{head.line, "no values to add"};
+    }
+    if (block.values.empty() && !is_ended) {
+        // A cut-off replacement would delete.
+        throw ldif_error{head.line, "a block without values needs the line \"-\" that ends it"};
     }
     return block;
 }
@@ -203,6 +210,17 @@ bool is_version(const ldif_text_line& line) {
     return true;
 }
 
+/// A line that the end of the text ends may have been cut off in the middle.
+std::optional<ldif_error> cut_off_line(std::string_view text) {
+    const std::string_view last = text.substr(text.find_last_of('\n') + 1);
+    if (last.find_first_not_of(" \t\r") == std::string_view::npos || last.front() == '#') {
+        return {};
+    }
+    const auto line = std::count(text.begin(), text.end(), '\n') + 1;
+    return ldif_error{static_cast<int>(line),
+                      "the last line has no newline at its end, as if it were cut off"};
+}
+
 }  // namespace
 
 std::vector<std::variant<change_record, ldif_error>> read_ldif(
@@ -221,6 +239,10 @@ std::vector<std::variant<change_record, ldif_error>> read_ldif(
         } catch (const ldif_error& e) {
             read.emplace_back(e);
         }
+    }
+    const std::optional<ldif_error> cut_off = cut_off_line(text);
+    if (cut_off && !read.empty()) {
+        read.back() = *cut_off;
     }
     return read;
 }

@@ -10,6 +10,7 @@
 #include "cfg32.h"
 #include "failure.h"
 #include "outcome.h"
+#include "password.h"
 
 namespace cfg32::tool {
 
@@ -49,7 +50,8 @@ auto with_place(const record_source& source, const change_record& record, Body b
             placed.entryDn = record.dn;
         }
         throw refused_record{
-            report(placed, source.text.empty() ? source.configuration : source.text)};
+            report(placed, source.text.empty() ? source.configuration : source.text),
+            record.kind == change_record::modify && e.ldapErr != CFG_NO_SUCH_OBJECT};
     }
 }
 
@@ -111,13 +113,23 @@ class library_changes {
     std::vector<ldapmod*> records_ = {nullptr};
 };
 
+/// How a password is stored: its tag. A masked one that is now to be encrypted is another.
+std::string scheme_of(const std::string& stored) {
+    const std::string encoded = stored.empty() ? stored : decoder_input(stored);
+    return encoded.substr(0, encoded.find('}'));
+}
+
 /// Compares what is stored, or passwords by what they decode to. What can't be decoded differs.
 bool is_same_value(const LDIF_Value& present, const LDIF_Value& given) {
     if (present.str() == given.str()) {
         return true;
     }
+    if (present.attrType->fromStr != pwFromStr ||
+        cisString(scheme_of(present.str())) != scheme_of(given.str())) {
+        return false;
+    }
     try {
-        return present.attrType->fromStr == pwFromStr && present.compare(given) == 0;
+        return present.compare(given) == 0;
     } catch (const LDIF_Exception&) {
         return false;
     }
@@ -142,8 +154,10 @@ bool is_replaced_by_itself(const LDIF_Values& present, const modification& chang
     return std::equal(present.begin(), present.end(), given.begin(), given.end(), is_same_value);
 }
 
-/// Tells whether the modification would change the entry.
-bool is_needed(const LDIF_Entry& entry, const modification& change, aes_key_data* key) {
+/// Tells whether the modification would change the entry. may_be_gone: an attribute to remove that
+/// is not there needs nothing; else the library refuses that.
+bool is_needed(const LDIF_Entry& entry, const modification& change, bool may_be_gone,
+               aes_key_data* key) {
     const auto found = entry.attributes().find(cisString(change.attribute));
     const bool is_there = found != entry.attributes().end();
     const auto is_present = [&](const std::string& value) {
@@ -154,8 +168,9 @@ bool is_needed(const LDIF_Entry& entry, const modification& change, aes_key_data
         case modification::add:
             return !std::all_of(values.begin(), values.end(), is_present);
         case modification::remove:
-            return is_there &&
-                   (values.empty() || std::any_of(values.begin(), values.end(), is_present));
+            return is_there
+                       ? values.empty() || std::any_of(values.begin(), values.end(), is_present)
+                       : !may_be_gone;
         case modification::replace:
             break;
     }
@@ -164,14 +179,15 @@ bool is_needed(const LDIF_Entry& entry, const modification& change, aes_key_data
 }
 
 /// Carries out the modifications that are needed.
-bool modify(LDIF_File& file, const LDIF_DN& dn, const change_record& record, aes_key_data* key) {
+bool modify(LDIF_File& file, const LDIF_DN& dn, const change_record& record, bool may_be_gone,
+            aes_key_data* key) {
     const LDIF_Entry* entry = file.root().find(dn);
     if (!entry) {
         raise(no_entry);
     }
     bool is_changed = false;
     for (const modification& change : record.modifications) {
-        if (is_needed(*entry, change, key)) {
+        if (is_needed(*entry, change, may_be_gone, key)) {
             file.modify(dn, library_changes({&change, 1}).records());
             is_changed = true;
         }
@@ -187,7 +203,7 @@ bool add(LDIF_File& file, const LDIF_DN& dn, const change_record& record, bool m
         raise(entry_is_there);
     }
     const auto is_lacking = [&](const modification& change) {
-        return is_needed(*entry, change, key);
+        return is_needed(*entry, change, true, key);
     };
     const auto& changes = record.modifications;
     if (entry && std::none_of(changes.begin(), changes.end(), is_lacking)) {
@@ -227,7 +243,7 @@ bool carry_out(LDIF_File& file, const change_record& record, const update_option
             case change_record::add:
                 return add(file, dn, record, how.merges, key);
             case change_record::modify:
-                return modify(file, dn, record, key);
+                return modify(file, dn, record, how.may_be_gone, key);
             case change_record::remove:
                 break;
         }

@@ -13,6 +13,7 @@ namespace cfg32::tool {
 /// Why a record can't be carried out: the whole of the message.
 struct refused_record {
     std::string message;
+    bool may_be_half_done;
 };
 
 /// Where messages say that a record stands.

@@ -9,6 +9,7 @@
 #include "LDIF_File.h"
 #include "cfg32.h"
 #include "change/record_changes.h"
+#include "configuration.h"
 #include "memory_file.h"
 #include "outcome.h"
 #include "terminal.h"
@@ -60,12 +61,15 @@ class updater {
   private:
     const std::string& name() const { return source_.configuration; }
 
+    void require_expected() const;
     void load();
+    void tell_unused_lines();
     void bind(const secret& password);
     void check_records();
     void skip(size_t number, const refused_record& refused);
     std::optional<bool> carry_out_all();
     void try_records();
+    std::string flushed_text();
     bool is_written();
     std::vector<skipped_record> skipped() const;
 
@@ -76,6 +80,7 @@ class updater {
     const key key_;
     std::vector<std::optional<std::string>> reasons_;  // why a record is left out
     std::optional<trial> trial_;
+    bool is_repaired_ = false;  // by the load
     update_result result_;
 };
 
@@ -84,6 +89,7 @@ update_result updater::run() {
     const progress changing("Changing " + name());
     do {
         result_.before = read_configuration(name());
+        require_expected();
         reasons_.assign(records_.size(), std::nullopt);
         load();
         bind(password);
@@ -91,15 +97,36 @@ update_result updater::run() {
         try_records();
     } while (result_.is_changed && !options_.is_dry_run && !is_written());
     result_.skipped = skipped();
+    if (result_.is_changed) {
+        tell_unused_lines();
+    }
     return std::move(result_);
+}
+
+void updater::require_expected() const {
+    if (how_.based_on && *how_.based_on != result_.before) {
+        fail(CFG_BUSY, name() + " was changed meanwhile; nothing was written: try again");
+    }
 }
 
 void updater::load() {
     try {
         trial_.emplace(result_.before, key_.get());
     } catch (const LDIF_Exception& e) {
-        throw ended(failed,
-                    report(e, name()) + "\n  hint: `cfg32 check` tells everything that is wrong");
+        const char* hint = result_.before.starts_with(unfinished_mark)
+                               ? "`cfg32 restore` puts the backup back"
+                               : "`cfg32 check` tells everything that is wrong";
+        throw ended(failed, report(e, name()) + "\n  hint: " + hint);
+    }
+    is_repaired_ = trial_->text() != result_.before;
+}
+
+/// The change kept aside, or lost, what could not be used.
+void updater::tell_unused_lines() {
+    const std::vector<problem> unused =
+        is_repaired_ ? unused_lines(result_.before, key_.get()) : std::vector<problem>();
+    if (!unused.empty()) {
+        tell_unused(name(), "not all of it could be used", unused);
     }
 }
 
@@ -153,7 +180,7 @@ std::optional<bool> updater::carry_out_all() {
                 throw ended(failed, refused.message);
             }
             skip(i, refused);
-            if (records_[i].kind == change_record::modify) {
+            if (refused.may_be_half_done) {
                 return std::nullopt;
             }
         }
@@ -163,6 +190,9 @@ std::optional<bool> updater::carry_out_all() {
 
 /// Carries the records out on the private copy, which is made anew without each that left a part.
 void updater::try_records() {
+    if (options_.is_dry_run) {
+        result_.canonical = flushed_text();
+    }
     std::optional<bool> is_changed;
     while (!(is_changed = carry_out_all())) {
         load();
@@ -172,12 +202,17 @@ void updater::try_records() {
     if (!result_.is_changed) {
         return;
     }
+    result_.after = flushed_text();
+}
+
+/// What a write makes of the private copy.
+std::string updater::flushed_text() {
     try {
         trial_->file().flush();
+        return trial_->text();
     } catch (const LDIF_Exception& e) {
         throw ended(failed, renamed(report(e, name()), trial_->name(), name()));
     }
-    result_.after = trial_->text();
 }
 
 /// Puts what the private copy has become in the place of the file, if that still is what was

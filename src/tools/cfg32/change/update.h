@@ -22,12 +22,15 @@ struct update_options {
     bool goes_on = false;        ///< -c: records that fail are left out
     bool deletes_trees = false;  ///< an entry goes with everything below it
     bool merges = false;         ///< an added entry that is there takes over the attributes
+    bool may_be_gone = false;    ///< an attribute to remove that is not there is no error
+    const std::string* based_on = nullptr;  ///< the text that the records were made for; else any
 };
 
 struct update_result {
     bool is_changed = false;
-    std::string before;  ///< the file's text
-    std::string after;   ///< what it becomes, or became
+    std::string before;     ///< the file's text
+    std::string canonical;  ///< what a write without a change would make of it
+    std::string after;      ///< what it becomes, or became
     std::vector<skipped_record> skipped;
 };
 

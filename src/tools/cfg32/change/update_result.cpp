@@ -17,8 +17,11 @@ namespace {
 json as_json(const settings& options, const update_result& result) {
     json skipped = json::array();
     for (const skipped_record& each : result.skipped) {
-        skipped.push_back(
-            {{"line", each.line}, {"dn", utf8(each.dn)}, {"reason", utf8(each.reason)}});
+        json object = {{"dn", utf8(each.dn)}, {"reason", utf8(each.reason)}};
+        if (each.line > 0) {
+            object["line"] = each.line;
+        }
+        skipped.push_back(std::move(object));
     }
     json document = {
         {"file", utf8(options.file_name())},
@@ -27,7 +30,7 @@ json as_json(const settings& options, const update_result& result) {
     };
     if (options.is_dry_run) {
         document["diff"] =
-            utf8(unified_diff(result.before, result.after, options.file_name(), false));
+            utf8(unified_diff(result.canonical, result.after, options.file_name(), false));
     }
     document["skipped"] = std::move(skipped);
     return document;
@@ -37,10 +40,20 @@ std::string plain_text(const settings& options, const update_result& result) {
     if (!result.is_changed) {
         return "unchanged\n";
     }
-    return options.is_dry_run ? unified_diff(result.before, result.after, options.file_name()) : "";
+    return options.is_dry_run ? unified_diff(result.canonical, result.after, options.file_name())
+                              : "";
 }
 
 }  // namespace
+
+/// A write puts the whole file in one form, which would hide the change in the diff.
+void note_rewriting(const settings& options, const update_result& result) {
+    if (options.is_dry_run && result.is_changed && result.canonical != result.before) {
+        complain(options.file_name() +
+                 ": besides, the write sorts attributes, joins continued lines and prints names in "
+                 "one form");
+    }
+}
 
 int print_result(const settings& options, const update_result& result) {
     for (const skipped_record& each : result.skipped) {
@@ -51,6 +64,7 @@ int print_result(const settings& options, const update_result& result) {
     } else {
         fmt::print("{}", plain_text(options, result));
     }
+    note_rewriting(options, result);
     return result.skipped.empty() ? done : failed;
 }
 

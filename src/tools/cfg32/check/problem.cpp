@@ -47,4 +47,10 @@ std::string loadable_part(std::string_view text, const std::vector<problem>& pro
     return part;
 }
 
+bool can_be_loaded(const std::vector<problem>& problems) {
+    return std::none_of(problems.begin(), problems.end(), [](const problem& each) {
+        return each.broken->outcome == consequence::stops_load;
+    });
+}
+
 }  // namespace cfg32::tool

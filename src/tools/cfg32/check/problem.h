@@ -63,6 +63,9 @@ size_t index_of(const rule& wanted);
 /// passwords are tried as well.
 std::vector<problem> find_problems(std::string_view text, aes_key_data* key);
 
+/// True when none of the problems stops a load.
+bool can_be_loaded(const std::vector<problem>& problems);
+
 /// The text without the lines that a load would stop at, so that it can be read.
 std::string loadable_part(std::string_view text, const std::vector<problem>& problems);
 

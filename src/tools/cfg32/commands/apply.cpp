@@ -18,12 +18,23 @@ void require_whole(const configuration& wanted) {
     }
 }
 
+/// Such a change would be carried out on something else.
+void require_speakable(const configuration& present, const configuration& wanted) {
+    const std::string name = unspeakable_name(differences(present.root(), wanted.root()));
+    if (!name.empty()) {
+        throw ended(failed, wanted.name() + " can't be applied: \"" + name +
+                                "\" would be taken for another name, or not at all");
+    }
+}
+
 int apply_all(const settings& options, const std::string& wanted_name) {
     const configuration wanted(options, wanted_name);
     require_whole(wanted);
-    const configuration present(options);
+    const configuration present(options, options.file_name());  // the update binds
+    require_speakable(present, wanted);
     update_options how;
     how.source = wanted_name;
+    how.based_on = &present.text();
     const std::vector<change_record> changes = changes_between(present.root(), wanted.root());
     return print_result(options, update(options, changes, how));
 }

@@ -1,40 +1,33 @@
 // cfg32 backup: copies the configuration file now.
 
+#include <fcntl.h>
 #include <fmt/format.h>
-#include <sys/stat.h>
 
 #include <CLI/CLI.hpp>
 #include <algorithm>
-#include <cerrno>
-#include <cstring>
 
-#include "LDIF_File.h"
-#include "cfg32_platform.h"
 #include "check/problem.h"
 #include "command.h"
-#include "disk.h"
+#include "configuration.h"
+#include "copied_file.h"
 #include "file_lock.h"
-#include "memory_file.h"
 
 namespace cfg32::tool {
 
 namespace {
 
 /// A backup that is there may be the last good version: a broken file doesn't take its place.
-void require_good(const std::string& name, const std::string& target) {
-    struct stat status;
-    if (stat(target.c_str(), &status) != 0) {
+void require_good(const std::string& name, const std::string& text, const std::string& target) {
+    const std::vector<problem> problems = find_problems(text, nullptr);
+    if (!is_there(target) || can_be_loaded(problems)) {
         return;
     }
-    const std::vector<problem> problems = find_problems(read_configuration(name), nullptr);
     const auto found = std::find_if(problems.begin(), problems.end(), [](const problem& each) {
         return each.broken->outcome == consequence::stops_load;
     });
-    if (found != problems.end()) {
-        throw ended(answer_is_no,
-                    fmt::format("{}:{}: {}; {} stays as it is (name another file to copy to)", name,
-                                found->line, found->text, target));
-    }
+    throw ended(answer_is_no,
+                fmt::format("{}:{}: {}; {} stays as it is (name another file to copy to)", name,
+                            found->line, found->text, target));
 }
 
 int backup(const settings& options, const std::string& given_target) {
@@ -43,12 +36,11 @@ int backup(const settings& options, const std::string& given_target) {
     if (target.empty()) {
         throw ended(usage_error, "--no-backup leaves nothing to do");
     }
-    require_good(name, target);
-    const locked_file file(name.c_str(), O_RDONLY, LOCK_SH);
-    if (!file || !copyFile(name.c_str(), target.c_str(), nullptr, nullptr, file.status().st_mode)) {
-        throw ended(failed,
-                    fmt::format("{} can't be copied to {}: {}", name, target, strerror(errno)));
-    }
+    require_bind(options);
+    require_good(name, read_configuration(name), target);
+    // Nobody writes it meanwhile; one who doesn't ask is noticed by the copying.
+    const locked_file lock(name.c_str(), O_RDONLY, LOCK_SH);
+    copy_file(name, target);
     return done;
 }
 

@@ -28,8 +28,7 @@ struct arguments {
 /// A password in a change record is as safe as it is stored.
 bool is_readable_password(const modification& change) {
     for (const std::string& value : change.values) {
-        if (is_password_attribute(change.attribute) &&
-            shown_value(change.attribute, value) != value) {
+        if (shown_value(change.attribute, value) != value) {
             return true;
         }
     }
@@ -48,6 +47,14 @@ void print_ldif(const std::vector<change_record>& records) {
         complain(
             "masked passwords, which anybody can decode, are in this output: guard it like the "
             "file");
+    }
+}
+
+void note_unspeakable(const std::vector<entry_difference>& found) {
+    const std::string name = unspeakable_name(found);
+    if (!name.empty()) {
+        complain("these changes do not lead to the other file: as a name in LDIF, \"" + name +
+                 "\" would be taken for another, or not at all");
     }
 }
 
@@ -119,6 +126,7 @@ int diff(const settings& options, const arguments& given) {
         print_text(found);
     } else {
         print_ldif(changes_between(from.root(), to.root()));
+        note_unspeakable(found);
     }
     return found.empty() ? done : answer_is_no;
 }

@@ -1,21 +1,23 @@
 // cfg32 edit: edits the file or one entry in an editor, and checks before anything is written.
 
 #include <fmt/format.h>
+#include <unistd.h>
 
 #include <CLI/CLI.hpp>
-#include <algorithm>
+#include <climits>
+#include <csignal>
+#include <cstdio>
 #include <cstdlib>
+#include <cstring>
 #include <filesystem>
-#include <optional>
 
 #include "LDIF_Exception.h"
 #include "LDIF_File.h"
 #include "check/check_report.h"
-#include "check/problem.h"
 #include "command.h"
+#include "configuration.h"
 #include "diff/unified_diff.h"
-#include "entry_text.h"
-#include "memory_file.h"
+#include "edited_text.h"
 #include "private_folder.h"
 #include "terminal.h"
 
@@ -23,72 +25,38 @@ namespace cfg32::tool {
 
 namespace {
 
-/// What is edited: all of a file's text or a part of it.
-class edited_text {
-  public:
-    edited_text(const std::string& file_name, const std::string& dn)
-        : file_name_(file_name), before_(read_configuration(file_name)), end_(before_.size()) {
-        if (!dn.empty()) {
-            const entry_text place = find_entry_text(before_, dn);
-            begin_ = place.begin;
-            end_ = place.end;
-            first_line_ = place.first_line;
-        }
-    }
-
-    const std::string& before() const { return before_; }
-    std::string part() const { return before_.substr(begin_, end_ - begin_); }
-    std::string with(const std::string& draft) const;
-
-    /// The problems of the part, counted from its first line; and whether the whole can be loaded.
-    struct findings {
-        std::vector<problem> problems;
-        bool is_loadable;
-    };
-    findings check(const std::string& draft, aes_key_data* key) const;
-
-  private:
-    std::string file_name_;
-    std::string before_;
-    size_t begin_ = 0;
-    size_t end_;
-    int first_line_ = 1;
-};
-
-/// The whole text with the draft in the place of the part.
-std::string edited_text::with(const std::string& draft) const {
-    const std::string rest = before_.substr(end_);
-    const bool runs_on = !draft.empty() && draft.back() != '\n' && !rest.empty();
-    return before_.substr(0, begin_) + draft + (runs_on ? "\n" : "") + rest;
-}
-
-edited_text::findings edited_text::check(const std::string& draft, aes_key_data* key) const {
-    findings found{find_problems(with(draft), key), true};
-    const auto lines = static_cast<int>(std::count(draft.begin(), draft.end(), '\n'));
-    const auto stops_load = [](const problem& each) {
-        return each.broken->outcome == consequence::stops_load;
-    };
-    found.is_loadable = std::none_of(found.problems.begin(), found.problems.end(), stops_load);
-    if (begin_ > 0 || end_ < before_.size()) {
-        std::erase_if(found.problems, [&](problem& each) {
-            each.line -= first_line_ - 1;
-            return each.line < 1 || each.line > lines + 1;
-        });
-    }
-    return found;
-}
-
 /// Runs the user's editor, as other programs do: its variable may hold arguments.
 void run_editor(const std::string& path) {
     const char* visual = getenv("VISUAL");
     const char* editor = visual && *visual ? visual : getenv("EDITOR");
     setenv("CFG32_EDITED", path.c_str(), 1);
-    const std::string command =
-        std::string(editor && *editor ? editor : "vi") + " \"$CFG32_EDITED\"";
-    if (system(command.c_str()) != 0) {
-        throw ended(failed, "the editor failed: " + std::string(editor ? editor : "vi"));
+    const std::string name = editor && *editor ? editor : "vi";
+    if (system((name + " \"$CFG32_EDITED\"").c_str()) != 0) {
+        throw ended(failed, "the editor failed: " + name + " (VISUAL or EDITOR names another)");
     }
 }
+
+/// Tells where the draft is when a signal ends the program.
+class draft_keeper {
+  public:
+    explicit draft_keeper(const std::string& path) {
+        snprintf(message, sizeof message, "\nwhat you edited is kept in %s\n", path.c_str());
+        struct sigaction action {};
+        action.sa_handler = tell_and_end;
+        action.sa_flags = SA_RESETHAND;
+        for (const int signal : {SIGHUP, SIGINT, SIGTERM}) {
+            sigaction(signal, &action, nullptr);
+        }
+    }
+
+  private:
+    static void tell_and_end(int signal) {
+        [[maybe_unused]] const ssize_t written = ::write(STDERR_FILENO, message, strlen(message));
+        raise(signal);
+    }
+
+    static inline char message[PATH_MAX + 64];
+};
 
 /// One edit: the editor, the check and the question, until it is written or dropped.
 class session {
@@ -119,10 +87,15 @@ class session {
 
 session::choice session::review(const std::string& draft) {
     const edited_text::findings found = text_.check(draft, key_.get());
-    if (found.problems.empty() && found.is_loadable) {
+    if (found.in_draft.empty() && found.elsewhere.empty()) {
         return write;
     }
-    tell(text_report({{path_, draft, found.problems}}));
+    if (!found.in_draft.empty()) {
+        tell(text_report({{path_, draft, found.in_draft}}));
+    }
+    if (!found.elsewhere.empty()) {
+        tell(text_report({{file_name_, text_.with(draft), found.elsewhere}}));
+    }
     if (!found.is_loadable) {
         complain("this can't be loaded, so it can't be written");
     }
@@ -147,6 +120,7 @@ int session::finish(const std::string& draft) {
 }
 
 int session::run() {
+    const draft_keeper keeper(path_);
     try {
         for (;;) {
             run_editor(path_);
@@ -179,8 +153,12 @@ void session::keep_draft() {
 action define_edit(CLI::App& parser, settings& options) {
     const auto dn = std::make_shared<std::string>();
     parser.add_option("dn", *dn, "the entry to edit; else the whole file")->type_name("DN");
-    parser.footer("The editor is the one that VISUAL or EDITOR names, else vi.");
-    return [dn, &options] { return session(options, *dn).run(); };
+    parser.footer("The editor is the one that VISUAL or EDITOR names, else vi.\n" +
+                  parser.get_footer());
+    return [dn, &options] {
+        require_bind(options);
+        return session(options, *dn).run();
+    };
 }
 
 }  // namespace cfg32::tool

@@ -6,11 +6,11 @@
 
 #include <array>
 #include <cerrno>
-#include <cstring>
 
 #include "choice_option.h"
 #include "command.h"
 #include "disk.h"
+#include "private_folder.h"
 #include "unique_fd.h"
 
 namespace cfg32::tool {
@@ -24,8 +24,6 @@ struct arguments {
     size_t bytes = largest_key;
 };
 
-constexpr mode_t of_owner_only = 0600;
-
 bool is_written(int file, std::string_view key) {
     // Whatever the umask is.
     return fchmod(file, of_owner_only) == 0 && replace_content(file, key) && sync_content(file);
@@ -36,7 +34,7 @@ int keygen(const arguments& given) {
     const char* name = given.file.c_str();
     unique_fd file(open(name, O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, of_owner_only));
     if (!file) {
-        throw ended(failed, given.file + ": " + strerror(errno));
+        fail_for_system(given.file, errno);
     }
     std::array<char, largest_key> key{};
     randombytes_buf(key.data(), given.bytes);
@@ -45,7 +43,7 @@ int keygen(const arguments& given) {
     sodium_memzero(key.data(), key.size());
     if (!is_done) {
         unlink(name);
-        throw ended(failed, given.file + ": " + strerror(error));
+        fail_for_system(given.file, error);
     }
     return done;
 }

@@ -51,6 +51,11 @@ int passwd(const settings& options, const arguments& given) {
     }
     const std::string attribute = spelled_name(given.attribute);
     const key encoding(options);
+    if (!encoding.get()) {
+        complain(
+            "without --key-file the password is only masked, which hides it from nobody who "
+            "tries");
+    }
     std::string stored = encoded(attribute, ask_new_password(attribute), encoding);
     return change_attribute(options, given.dn,
                             {modification::replace, attribute, {std::move(stored)}});

@@ -4,18 +4,14 @@
 #include <sys/stat.h>
 
 #include <CLI/CLI.hpp>
-#include <algorithm>
-#include <cerrno>
-#include <cstring>
 
 #include "LDIF_File.h"
-#include "cfg32_platform.h"
 #include "check/check_report.h"
 #include "check/problem.h"
 #include "command.h"
+#include "configuration.h"
+#include "copied_file.h"
 #include "diff/unified_diff.h"
-#include "file_lock.h"
-#include "memory_file.h"
 #include "terminal.h"
 
 namespace cfg32::tool {
@@ -26,18 +22,6 @@ struct arguments {
     std::string backup;
     bool is_confirmed = false;
 };
-
-bool is_there(const std::string& name) {
-    struct stat status;
-    return stat(name.c_str(), &status) == 0;
-}
-
-bool is_same(const std::string& left, const std::string& right) {
-    struct stat left_status;
-    struct stat right_status;
-    return stat(left.c_str(), &left_status) == 0 && stat(right.c_str(), &right_status) == 0 &&
-           is_same_file(left_status, right_status);
-}
 
 /// Where the file that is replaced is kept: never in the place of the backup that replaces it.
 std::string keeping_place(const settings& options, const std::string& source) {
@@ -52,44 +36,55 @@ std::string keeping_place(const settings& options, const std::string& source) {
     return is_same(place, source) ? options.file_name() + ".before-undo" : place;
 }
 
+/// The backup that the last write made. A restore that did not come to its end made one, too.
+std::string newest_backup(const settings& options) {
+    const std::string name = options.file_name();
+    std::string newest = name + ".bak";
+    if (is_there(name) && read_configuration(name).starts_with(unfinished_mark)) {
+        for (const char* other : {".before-restore", ".before-undo"}) {
+            newest = is_newer(name + other, newest) ? name + other : newest;
+        }
+    }
+    return newest;
+}
+
 void require_loadable(const std::string& name, const std::string& text, aes_key_data* key) {
     const std::vector<problem> problems = find_problems(text, key);
     if (problems.empty()) {
         return;
     }
     tell(text_report({{name, text, problems}}));
-    const bool is_loadable = std::none_of(
-        problems.begin(), problems.end(),
-        [](const problem& each) { return each.broken->outcome == consequence::stops_load; });
-    if (!is_loadable) {
+    if (!can_be_loaded(problems)) {
         throw ended(answer_is_no, name + " can't be loaded; nothing was restored");
     }
 }
 
-bool is_wanted(const arguments& given) {
-    return given.is_confirmed || !is_interactive() || ask("Restore? [y/n]", "yn") == 'y';
-}
-
-/// Makes the file anew when it is gone.
-void copy_back(const std::string& source, const std::string& name) {
-    struct stat status;
-    if (stat(source.c_str(), &status) != 0 ||
-        !copyFile(source.c_str(), name.c_str(), nullptr, nullptr, status.st_mode)) {
-        throw ended(failed,
-                    fmt::format("{} can't be copied to {}: {}", source, name, strerror(errno)));
+/// Overwriting is confirmed by a person or by an option.
+void require_confirmation(const arguments& given) {
+    if (given.is_confirmed) {
+        return;
+    }
+    if (!can_be_asked()) {
+        throw ended(usage_error, "nobody can be asked here: --yes restores");
+    }
+    if (ask("Restore? [y/n]", "yn") != 'y') {
+        throw ended(answer_is_no, "nothing was restored");
     }
 }
 
 int restore(const settings& options, const arguments& given) {
     const std::string name = options.file_name();
-    const std::string source = given.backup.empty() ? name + ".bak" : given.backup;
+    const std::string source = given.backup.empty() ? newest_backup(options) : given.backup;
     const std::string keep = keeping_place(options, source);
     const key passwords(options);
     const std::string wanted = read_configuration(source);
     require_loadable(source, wanted, passwords.get());
     const bool is_missing = !is_there(name);
     const std::string present = is_missing ? std::string() : read_configuration(name);
-    if (present == wanted) {
+    if (!is_missing) {
+        require_bind(options);
+    }
+    if (present == wanted && !is_missing) {
         fmt::print("unchanged\n");
         return done;
     }
@@ -98,14 +93,8 @@ int restore(const settings& options, const arguments& given) {
     if (options.is_dry_run) {
         return done;
     }
-    if (!is_wanted(given)) {
-        return answer_is_no;
-    }
-    if (is_missing) {
-        copy_back(source, name);
-    } else {
-        LDIF_File::replace(name, keep, wanted, present);
-    }
+    require_confirmation(given);
+    is_missing ? copy_file(source, name) : LDIF_File::replace(name, keep, wanted, present);
     return done;
 }
 
@@ -114,8 +103,9 @@ int restore(const settings& options, const arguments& given) {
 action define_restore(CLI::App& parser, settings& options) {
     const auto given = std::make_shared<arguments>();
     parser.add_option("backup", given->backup, "the backup; else FILE.bak")->type_name("BACKUP");
-    parser.add_flag("--yes", given->is_confirmed, "don't ask at a terminal");
-    parser.footer("What is replaced is kept as FILE.before-restore, or where --backup says.");
+    parser.add_flag("--yes", given->is_confirmed, "don't ask");
+    parser.footer("What is replaced is kept as FILE.before-restore, or where --backup says.\n" +
+                  parser.get_footer());
     return [given, &options] { return restore(options, *given); };
 }
 

@@ -11,6 +11,8 @@
 #include "configuration.h"
 #include "json_text.h"
 #include "ldif_writer.h"
+#include "schema/attribute_words.h"
+#include "terminal.h"
 
 namespace cfg32::tool {
 
@@ -39,6 +41,49 @@ bool is_wanted(const arguments& given, const attribute& found) {
 void tell_filter_from_attribute(arguments& given) {
     if (!given.filter.empty() && given.filter.find_first_of("=(") == std::string::npos) {
         given.attributes.insert(given.attributes.begin(), std::exchange(given.filter, {}));
+    }
+}
+
+[[noreturn]] void refuse_filter(const std::string& filter) {
+    throw ended(usage_error,
+                filter + " is no filter: it is one term, attribute=value or attribute=*");
+}
+
+/// What the library's filters can't say would be taken for something else: it finds nothing, or
+/// everything.
+void require_simple(const std::string& filter) {
+    std::string_view term = filter;
+    if (term.starts_with('(') != term.ends_with(')')) {
+        refuse_filter(filter);
+    }
+    if (term.starts_with('(')) {
+        term = term.substr(1, term.size() - 2);
+    }
+    const std::string_view name = term.substr(0, term.find('='));
+    const std::string_view value = term.substr(std::min(name.size() + 1, term.size()));
+    const bool has_pattern = value != "*" && value.find('*') != std::string_view::npos;
+    if (name.empty() || name.find_first_of("()&|!<>~*") != std::string_view::npos || has_pattern ||
+        value.starts_with('(')) {
+        refuse_filter(filter);
+    }
+}
+
+/// A name that the table does not have may be mistyped.
+void note_unknown(const std::string& name) {
+    const auto meant = find_attribute(name) ? std::nullopt : nearest_attribute(name);
+    if (meant) {
+        complain(fmt::format("the server knows no attribute {}; did you mean {}?", name, *meant));
+    }
+}
+
+void note_unknown_names(const arguments& given) {
+    const std::string& filter = given.filter;
+    if (!filter.empty()) {
+        const size_t begin = filter.starts_with('(') ? 1 : 0;
+        note_unknown(filter.substr(begin, filter.find_first_of("=)") - begin));
+    }
+    for (const std::string& name : given.attributes) {
+        note_unknown(name);
     }
 }
 
@@ -96,6 +141,10 @@ action define_search(CLI::App& parser, settings& options) {
         ->type_name("ATTR");
     return [given, &options] {
         tell_filter_from_attribute(*given);
+        if (!given->filter.empty()) {
+            require_simple(given->filter);
+        }
+        note_unknown_names(*given);
         return search(options, *given);
     };
 }

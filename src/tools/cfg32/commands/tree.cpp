@@ -1,6 +1,7 @@
 // cfg32 tree: draws the tree of entries.
 
 #include <fmt/format.h>
+#include <langinfo.h>
 
 #include <algorithm>
 #include <array>
@@ -19,8 +20,13 @@ namespace {
 
 enum drawing_style { unicode, ascii, cp437 };
 
+/// Line-drawing characters where the locale has them.
+drawing_style default_style() {
+    return std::string_view(nl_langinfo(CODESET)) == "UTF-8" ? unicode : ascii;
+}
+
 struct arguments {
-    drawing_style style = unicode;
+    drawing_style style = default_style();
     std::string base;
 };
 
@@ -69,13 +75,38 @@ LDIF_Entry tree_from(const LDIF_Entry& base) {
     return tree;
 }
 
+/// The DNs that are missing above an entry, the nearest to it first. Above a suffix none is.
+std::vector<LDIF_DN> missing_ancestors(const LDIF_Entry& node) {
+    std::vector<LDIF_DN> missing;
+    LDIF_DN dn = node.dn();
+    const size_t count = node.relative_dn().rdns().size();
+    for (size_t i = 1; i < count && count < node.dn().rdns().size(); ++i) {
+        dn.remove_leaf();
+        missing.push_back(dn);
+    }
+    return missing;
+}
+
+/// The first line of a drawing that begins at an entry: it is no suffix, but ancestors of it may be
+/// missing.
+void mark_base(std::string& drawing, const LDIF_Entry& base, std::set<LDIF_DN>& missing) {
+    constexpr std::string_view suffix = " (suffix)";
+    const std::vector<LDIF_DN> above = missing_ancestors(base);
+    missing.insert(above.begin(), above.end());
+    drawing.replace(drawing.find('\n') - suffix.size(), suffix.size(), above.empty() ? "" : " *");
+}
+
 /// The drawing, and below it the DNs of the entries that are missing: what is marked with "*"
 /// hangs below them.
-std::string drawing_of(const LDIF_Entry& tree, drawing_style style) {
+std::string drawing_of(const LDIF_Entry& base, drawing_style style) {
+    const LDIF_Entry tree = tree_from(base);
     std::set<LDIF_DN> missing;
     std::string text =
         style == ascii ? IA5_TreeView(tree, missing, {}) : OEM_TreeView(tree, true, missing, {});
     text.erase(0, text.starts_with('\n') ? 1 : 0);
+    if (!base.is_root() && base.relative_dn().rdns().size() < base.dn().rdns().size()) {
+        mark_base(text, base, missing);
+    }
     if (style == unicode) {
         text = lines_in_unicode(text);
     }
@@ -88,28 +119,30 @@ std::string drawing_of(const LDIF_Entry& tree, drawing_style style) {
     return text;
 }
 
-/// The DNs between an entry and the one it hangs below, the nearest to the entry first.
-json missing_ancestors(const LDIF_Entry& node) {
-    json list = json::array();
+/// How many entries of the drawing stand above this one.
+size_t depth_below(const LDIF_Entry& base, const LDIF_Entry& node, const LDIF_Entry& root) {
+    size_t depth = 0;
     LDIF_DN dn = node.dn();
-    const size_t count = node.relative_dn().rdns().size();
-    // Above a suffix nothing is missing.
-    const bool is_suffix = count == dn.rdns().size();
-    for (size_t i = 1; i < count && !is_suffix; ++i) {
+    while (dn != base.dn() && !dn.empty()) {
         dn.remove_leaf();
-        list.push_back(utf8(dn.str()));
+        depth += !dn.empty() && root.find(dn) ? 1 : 0;
     }
-    return list;
+    return depth;
 }
 
-void print_as_json(const configuration& file, const LDIF_Entry& tree) {
+void print_as_json(const configuration& file, const LDIF_Entry& base) {
     json list = json::array();
-    for_each_in_preorder(tree, [&](const LDIF_Entry& node) {
-        if (!node.is_root()) {
-            list.push_back({{"dn", utf8(node.dn().str())},
-                            {"depth", node.dn().rdns().size()},
-                            {"missingAncestors", missing_ancestors(node)}});
+    for_each_in_preorder(base, [&](const LDIF_Entry& node) {
+        if (node.is_root()) {
+            return;
         }
+        json missing = json::array();
+        for (const LDIF_DN& dn : missing_ancestors(node)) {
+            missing.push_back(utf8(dn.str()));
+        }
+        list.push_back({{"dn", utf8(node.dn().str())},
+                        {"depth", depth_below(base, node, file.root())},
+                        {"missingAncestors", std::move(missing)}});
     });
     print_json({{"file", utf8(file.name())},
                 {"entries", std::move(list)},
@@ -118,12 +151,11 @@ void print_as_json(const configuration& file, const LDIF_Entry& tree) {
 
 int tree(const settings& options, const arguments& given) {
     const configuration file(options);
-    const LDIF_Entry drawn =
-        tree_from(given.base.empty() ? file.root() : file.entry_at(given.base));
+    const LDIF_Entry& base = given.base.empty() ? file.root() : file.entry_at(given.base);
     if (options.is_json) {
-        print_as_json(file, drawn);
+        print_as_json(file, base);
     } else {
-        fmt::print("{}", drawing_of(drawn, given.style));
+        fmt::print("{}", drawing_of(base, given.style));
     }
     return done;
 }
@@ -134,7 +166,7 @@ action define_tree(CLI::App& parser, settings& options) {
     const auto given = std::make_shared<arguments>();
     add_choice<drawing_style>(parser, "--style", given->style,
                               {{"unicode", unicode}, {"ascii", ascii}, {"cp437", cp437}},
-                              "the characters to draw with; else unicode");
+                              "the characters to draw with; else what the locale has");
     parser.add_option("base", given->base, "the entry to begin at; else all")->type_name("DN");
     return [given, &options] { return tree(options, *given); };
 }

@@ -7,6 +7,7 @@
 
 #include "LDIF_AttrType.h"
 #include "LDIF_Exception.h"
+#include "change/ldif_lines.h"
 
 namespace cfg32::tool {
 
@@ -152,10 +153,43 @@ change_record record_of(const entry_difference& difference, const LDIF_Entry& to
     return record;
 }
 
+bool is_read_as_another(const std::string& dn) { return LDIF_DN(cisString(dn)).str() != dn; }
+
+std::string unspeakable_name(const attribute_difference& attribute) {
+    if (!is_attribute_name(attribute.name)) {
+        return attribute.name;
+    }
+    if (getAttrType(attribute.name.c_str())->fromStr != dnFromStr) {
+        return {};
+    }
+    for (const auto* values : {&attribute.removed, &attribute.added}) {
+        const auto found = std::find_if(values->begin(), values->end(), is_read_as_another);
+        if (found != values->end()) {
+            return *found;
+        }
+    }
+    return {};
+}
+
 }  // namespace
 
 std::vector<entry_difference> differences(const LDIF_Entry& from, const LDIF_Entry& to) {
     return compare(from, to, [](const LDIF_Entry&) { return true; });
+}
+
+std::string unspeakable_name(const std::vector<entry_difference>& found) {
+    for (const entry_difference& each : found) {
+        if (is_read_as_another(each.dn.str())) {
+            return each.dn.str();
+        }
+        for (const attribute_difference& attribute : each.attributes) {
+            std::string name = unspeakable_name(attribute);
+            if (!name.empty()) {
+                return name;
+            }
+        }
+    }
+    return {};
 }
 
 std::vector<change_record> changes_between(const LDIF_Entry& from, const LDIF_Entry& to) {

@@ -29,6 +29,10 @@ struct entry_difference {
 /// it; then changed ones; then new ones, each before those below it.
 std::vector<entry_difference> differences(const LDIF_Entry& from, const LDIF_Entry& to);
 
+/// What of the differences no change record can say, because its name would be read as another: the
+/// first such name, or nothing.
+std::string unspeakable_name(const std::vector<entry_difference>& found);
+
 /// The same as changes that can be carried out. An entry that stays below one that goes is removed
 /// with it and added again.
 std::vector<change_record> changes_between(const LDIF_Entry& from, const LDIF_Entry& to);

@@ -1,0 +1,20 @@
+#pragma once
+
+#include <string>
+
+namespace cfg32::tool {
+
+/// True when a file has that name.
+bool is_there(const std::string& name);
+
+/// True when both names are there and mean the same file.
+bool is_same(const std::string& left, const std::string& right);
+
+/// True when the one is there and was made after the other, or the other is not there.
+bool is_newer(const std::string& one, const std::string& other);
+
+/// Copies a file, complete and durable, with its owner, group and mode. Ends the command when that
+/// can't be done.
+void copy_file(const std::string& from, const std::string& to);
+
+}  // namespace cfg32::tool
