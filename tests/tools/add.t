@@ -25,8 +25,8 @@ From standard input, in the form that ldapadd takes:
     +objectclass: top
     +oru-slapdPort: 390
     +
-    +dn: cn=D\xc3\xbcsseldorf, cn=Network, cn=Configuration (esc)
-    +cn: D\xc3\xbcsseldorf (esc)
+    +dn: cn=Düsseldorf, cn=Network, cn=Configuration
+    +cn: Düsseldorf
     +
     [1]
 
@@ -41,8 +41,8 @@ From a file; a dry run prints what would become of it:
     --- conf
     +++ conf
     @@ -26,3 +26,7 @@
-     dn: cn=D\xc3\xbcsseldorf, cn=Network, cn=Configuration (esc)
-     cn: D\xc3\xbcsseldorf (esc)
+     dn: cn=Düsseldorf, cn=Network, cn=Configuration
+     cn: Düsseldorf
      
     +dn: cn=Third, cn=Network, cn=Configuration
     +cn: Third
@@ -138,9 +138,9 @@ No file, a folder, and nothing at all:
 
     $ cfg32 -f conf add -l missing.ldif
     cfg32: missing.ldif: No such file or directory
-    [2]
+    [3]
     $ cfg32 -f conf add -l .
     cfg32: .: Is a directory
-    [2]
+    [3]
     $ cfg32 -f conf add < /dev/null
     unchanged

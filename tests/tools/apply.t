@@ -21,6 +21,7 @@ comments and the order:
     +   cn: New
     [1]
     $ cfg32 -f oruslapd.conf apply --dry-run wanted | grep '^+oru-slapdPort: 1'
+    cfg32: oruslapd.conf: besides, the write sorts attributes, joins continued lines and prints names in one form
     +oru-slapdPort: 1389
     $ cmp original oruslapd.conf
     $ cfg32 -f oruslapd.conf apply wanted
@@ -58,7 +59,7 @@ A file that can't be used whole is not applied: what is left out of it would be 
     $ printf 'dn: cn=Configuration\noru-slapdPort: 0\n' > doubtful
     $ cfg32 -f oruslapd.conf apply doubtful
     cfg32: doubtful: read from a private copy, because not all of it can be used (`cfg32 check` tells more):
-    doubtful:2: Integer value out of range, kept as oru-slapdInvalidLine
+      line 2: Integer value out of range, kept as oru-slapdInvalidLine
     cfg32: doubtful can't be used whole: mend it first
     [3]
     $ cfg32 -f oruslapd.conf apply nowhere

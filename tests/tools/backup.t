@@ -17,7 +17,7 @@ What is no place for a copy is a failure, and changes nothing:
     cfg32: --no-backup leaves nothing to do
     [2]
     $ cfg32 -f nowhere backup
-    cfg32: nowhere can't be copied to nowhere.bak: No such file or directory
+    cfg32: nowhere: No such file or directory [Connection error (91)]
     [3]
 
 A file that can't be loaded doesn't take the place of a backup, which may be the last good version;

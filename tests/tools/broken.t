@@ -12,11 +12,11 @@ Each reading command takes what is usable, and says what is not; none touches th
 
     $ cfg32 -f broken.conf get "cn=a, cn=Configuration" cn
     cfg32: broken.conf: read from a private copy, because not all of it can be used (`cfg32 check` tells more):
-    broken.conf:2: an attribute above the first entry, left out
-    broken.conf:6: Integer value out of range, kept as oru-slapdInvalidLine
-    broken.conf:7: no colon after the attribute's name, kept as oru-slapdInvalidLine
-    broken.conf:9: Invalid character in RDN attribute: n, left out
-    broken.conf:14: bytes that are no character in this locale; a file with other than ASCII text needs the locale it was written in, left out
+      line 2: an attribute above the first entry, left out
+      line 6: Integer value out of range, kept as oru-slapdInvalidLine
+      line 7: no colon after the attribute's name, kept as oru-slapdInvalidLine
+      line 9: Invalid character in RDN attribute: n, left out
+      line 14: bytes that are no character in this locale; a file with other than ASCII text needs the locale it was written in, left out
     a
     $ cfg32 -f broken.conf search 'cn=*' 2> /dev/null
     dn: cn=Configuration
@@ -84,7 +84,7 @@ A change is refused, and says where to look:
 
     $ cfg32 -f broken.conf set cn=Configuration oru-slapdPort 389
     cfg32: broken.conf:2: "oru-slapdPort" attribute not allowed in <root> object [Object class violation (65)]
-      entry: <root>
+      entry: above all entries
       oru-slapdPort: 1
       hint: `cfg32 check` tells everything that is wrong
     [3]
@@ -96,7 +96,7 @@ is one:
     $ printf '%s\n' 'dn: cn=Configuration' 'cn: Configuration' 'oru-slapdPort: 70000' > doubtful.conf
     $ cfg32 -f doubtful.conf get cn=Configuration oru-slapdInvalidLine
     cfg32: doubtful.conf: read from a private copy, because not all of it can be used (`cfg32 check` tells more):
-    doubtful.conf:3: Integer value out of range, kept as oru-slapdInvalidLine
+      line 3: Integer value out of range, kept as oru-slapdInvalidLine
     oru-slapdPort: 70000
     $ cfg32 -f doubtful.conf set cn=Configuration cn Configuration
     unchanged
@@ -105,6 +105,8 @@ is one:
     cn: Configuration
     oru-slapdPort: 70000
     $ cfg32 -f doubtful.conf set cn=Configuration oru-slapdPort 7000
+    cfg32: doubtful.conf: not all of it could be used (`cfg32 check` tells more):
+      line 3: Integer value out of range, kept as oru-slapdInvalidLine
     $ cat doubtful.conf
     charset: ISO-8859-1
     version: 1
@@ -124,11 +126,11 @@ An entry whose DN can't be printed is left out, because nothing could name it:
     $ printf 'dn: cn=Configuration\ncn: x\n\ndn: cn=\ncn: y\n' > nameless.conf
     $ cfg32 -f nameless.conf tree
     cfg32: nameless.conf: read from a private copy, because not all of it can be used (`cfg32 check` tells more):
-    nameless.conf:4: no change of the file can be made, because this entry can't be written: a value of its DN is empty, or has a line break or NUL, left out
+      line 4: no change of the file can be made, because this entry can't be written: a value of its DN is empty, or has a line break or NUL, left out
     ─ cn=Configuration (suffix)
     $ cfg32 -f nameless.conf search 'cn=*'
     cfg32: nameless.conf: read from a private copy, because not all of it can be used (`cfg32 check` tells more):
-    nameless.conf:4: no change of the file can be made, because this entry can't be written: a value of its DN is empty, or has a line break or NUL, left out
+      line 4: no change of the file can be made, because this entry can't be written: a value of its DN is empty, or has a line break or NUL, left out
     dn: cn=Configuration
     cn: x
     

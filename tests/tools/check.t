@@ -251,10 +251,10 @@ A file that its writer left unfinished, and the copy of one that did not get tha
 What can't be asked for:
 
     $ cfg32 check --format xml good.conf
-    --format: xml not in {text,json,sarif,github}
-    Run with --help for more information.
+    cfg32: --format: xml not in {text,json,sarif,github}
+      hint: x
     [2]
     $ cfg32 check --format text --json good.conf
-    --format excludes --json
-    Run with --help for more information.
+    cfg32: --format excludes --json
+      hint: x
     [2]

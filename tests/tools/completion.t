@@ -5,8 +5,8 @@ The scripts are ones that their shells can read:
 Another shell is a usage error:
 
     $ cfg32 completion tcsh
-    shell: tcsh not in {bash,zsh,fish}
-    Run with --help for more information.
+    cfg32: shell: tcsh not in {bash,zsh,fish}
+      hint: x
     [2]
 
 What the scripts use is not in the help:

@@ -86,7 +86,6 @@ Several go together, or none:
       "dryRun": false,
       "skipped": [
         {
-          "line": 0,
           "dn": "cn=None",
           "reason": "conf: Entry not found [No such object (32)]\n  entry: cn=None"
         }
@@ -122,15 +121,16 @@ LDIF may name them, by their DNs alone or in records that delete:
     > dn: cn=Configuration
     > changetype: modify
     > delete: cn
+    > -
     > 
     > dn: cn=Configuration
     > cn: Configuration
     > END
     $ cfg32 -f conf delete -l other.ldif
     cfg32: other.ldif:1: a record that does not delete
-    other.ldif:6: nothing may follow in a record that deletes
+    other.ldif:7: nothing may follow in a record that deletes
     [3]
     $ cfg32 -f conf delete -l other.ldif cn=Configuration
-    --ldif excludes dn
-    Run with --help for more information.
+    cfg32: --ldif excludes dn
+      hint: `cfg32 delete --help` tells what there is
     [2]

@@ -184,12 +184,27 @@ stand as they are stored; what is only masked there should be guarded:
     $ cfg32 --key-file oruslapd.key diff clear.conf other.conf | grep -o ': {AES256}'
     : {AES256}
 
+A name that would be read as another can't be said in LDIF:
+
+    $ printf 'dn: cn=Configuration\ncn: x\n' > one.conf
+    $ printf 'dn: cn=Configuration\ncn: x\n\ndn: cn=a+ou=b, cn=Configuration\ncn: a\n' > pair.conf
+    $ cfg32 diff one.conf pair.conf
+    cfg32: these changes do not lead to the other file: as a name in LDIF, "cn=a + ou=b, cn=Configuration" would be taken for another, or not at all
+    dn: cn=a + ou=b, cn=Configuration
+    changetype: add
+    cn: a
+    
+    [1]
+    $ cfg32 -f one.conf apply pair.conf
+    cfg32: pair.conf can't be applied: "cn=a + ou=b, cn=Configuration" would be taken for another name, or not at all
+    [3]
+
 What can't be read is a failure:
 
     $ cfg32 diff a.conf nowhere
     cfg32: nowhere: No such file or directory [Connection error (91)]
     [3]
     $ cfg32 diff a.conf
-    to is required
-    Run with --help for more information.
+    cfg32: to is required
+      hint: `cfg32 diff --help` tells what there is
     [2]

@@ -158,6 +158,8 @@ A change that somebody else made meanwhile is noticed; both are kept:
 
     $ edit_by 'sed -i "s/99999/3389/" "$1"; cfg32 -f oruslapd.conf set cn=Configuration oru-slapdVersion 9'
     $ in_terminal -- cfg32 -f oruslapd.conf edit "$listener"
+    cfg32: oruslapd.conf: not all of it could be used (`cfg32 check` tells more):
+      line 118: Integer value out of range, kept as oru-slapdInvalidLine
     what you edited is kept in PRIVATE/oruslapd.conf
     cfg32: oruslapd.conf: Configuration file was changed meanwhile [DSA is busy (51)]
     [3]
@@ -179,9 +181,31 @@ An editor that fails writes nothing:
     $ state_of oruslapd.conf > state
     $ edit_by false
     $ in_terminal -- cfg32 -f oruslapd.conf edit
-    cfg32: the editor failed: editor
+    cfg32: the editor failed: editor (VISUAL or EDITOR names another)
     [3]
     $ state_of oruslapd.conf | cmp - state
+
+A signal at the question ends it, and says where the draft is:
+
+    $ replace 's/^oru-slapdVersion: .*/oru-slapdVersion/'
+    $ setsid -w cfg32 -f oruslapd.conf edit cn=Configuration < <(sleep 1; pkill -INT -f 'cfg32 -f oruslapd.conf edit'; sleep 1) 2>&1 | tail -1 | sed "s|$TMPDIR/cfg32-[^/]*|PRIVATE|"
+    what you edited is kept in PRIVATE/oruslapd.conf
+    [130]
+    $ rm -r private/*
+
+An entry that its edit makes the same as another is a problem elsewhere in the file:
+
+    $ replace 's/^dn: .*/dn: cn=Referrals, cn=Network, cn=Configuration/'
+    $ in_terminal '(d)rop?' d -- cfg32 -f oruslapd.conf edit "$listener" | grep -c 'stands twice'
+    1
+    [1]
+
+The administrator's name and password must be right, when they are given:
+
+    $ echo wrong > password
+    $ cfg32 -f oruslapd.conf --key-file oruslapd.key -D cn=root -y password edit
+    cfg32: oruslapd.conf: not the administrator's DN and password [Invalid credentials (49)]
+    [3]
 
 VISUAL comes before EDITOR:
 

@@ -127,6 +127,6 @@ On a terminal, and when it is asked for, the name stands out:
 Without a name there is nothing to explain:
 
     $ cfg32 explain
-    attributes is required
-    Run with --help for more information.
+    cfg32: attributes is required
+      hint: x
     [2]

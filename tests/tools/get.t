@@ -77,7 +77,7 @@ With a DN it binds as the administrator; whose password it is has to be right:
     Configuration
     $ echo wrong > password
     $ cfg32 -f oruslapd.conf --key-file oruslapd.key -D cn=root -y password get cn=Configuration cn
-    cfg32: oruslapd.conf: Invalid credentials (49)
+    cfg32: oruslapd.conf: not the administrator's DN and password [Invalid credentials (49)]
     [3]
     $ cfg32 -f oruslapd.conf -D cn=root get cn=Configuration cn
     cfg32: -D needs a password: add -W or -y FILE
@@ -102,6 +102,6 @@ Without -f it is the server's own file, and without a server that is said:
 A missing argument is a usage error:
 
     $ cfg32 get cn=Configuration
-    attribute is required
-    Run with --help for more information.
+    cfg32: attribute is required
+      hint: `cfg32 get --help` tells what there is
     [2]

@@ -14,8 +14,8 @@ The size of the key is one that AES has:
     $ cfg32 keygen --bits 192 middle.key && stat --format=%s middle.key
     24
     $ cfg32 keygen --bits 100 odd.key
-    --bits: 100 not in {128,192,256}
-    Run with --help for more information.
+    cfg32: --bits: 100 not in {128,192,256}
+      hint: `cfg32 keygen --help` tells what there is
     [2]
 
 No two keys are the same:

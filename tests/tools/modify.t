@@ -118,7 +118,8 @@ What is done already is not done again, save for an entry that would be added tw
     > delete: oru-slapdSuffix
     > oru-slapdSuffix: o=x
     > -
-    > delete: x-none
+    > replace: x-none
+    > -
     > END
     unchanged
     $ stat -c "%y %z %i" conf conf.bak | cmp - before
@@ -131,7 +132,7 @@ One record that fails keeps all from the file:
     > oru-slapdPort: 1
     > 
     > dn: cn=Listener, cn=Network, cn=Configuration
-    > delete: oru-slapdSecurePort
+    > delete: oru-slapdSuffix
     > -
     > add: oru-slapdPort
     > oru-slapdPort: 2
@@ -213,6 +214,22 @@ A password may come in clear here, and is encoded; it is not shown:
      dn: cn=Network, cn=Configuration
      cn: Network
 
+What may have been cut off is not guessed: a replacement without values and without its "-" would
+delete, and a last line without newline may have lost its end. No password is quoted:
+
+    $ printf 'dn: cn=Configuration\nreplace: objectclass\n' | cfg32 -f conf modify
+    cfg32: standard input:2: a block without values needs the line "-" that ends it
+    [3]
+    $ printf 'dn: cn=Configuration\nreplace: oru-slapdPort\noru-slapdPort: 12' | cfg32 -f conf modify
+    cfg32: standard input:3: the last line has no newline at its end, as if it were cut off
+    [3]
+    $ printf 'dn: cn=Configuration\nreplace: oru-slapdAdminPW: Isar\n-\n' | cfg32 -f conf modify
+    cfg32: standard input:2: "oru-slapdAdminPW: ********" is not an attribute's name
+    [3]
+    $ cfg32 -f conf modify < .
+    cfg32: standard input: Is a directory
+    [3]
+
 Unusable lines of the file are kept in their own way by the change, and the backup is the file of
 before:
 
@@ -224,6 +241,8 @@ before:
     [3]
     $ cmp kept kept.before
     $ head -n 3 failing.ldif | cfg32 -f kept modify
+    cfg32: kept: not all of it could be used (`cfg32 check` tells more):
+      line 17: Value is not valid integer syntax, kept as oru-slapdInvalidLine
     $ diff -U0 kept.before kept | tail -n +3
     @@ -17 +17,2 @@
     -oru-slapdPort: many
@@ -237,7 +256,7 @@ before:
 
 A backup that can't be made keeps the change from the file, when there is one:
 
-    $ printf 'dn: cn=New, cn=Configuration\ndelete: x-none\n' > nothing.ldif
+    $ printf 'dn: cn=New, cn=Configuration\nreplace: x-none\n-\n' > nothing.ldif
     $ cfg32 -f conf --backup /nowhere/conf modify -l nothing.ldif
     unchanged
     $ head -n 3 failing.ldif | cfg32 -f conf --backup /nowhere/conf modify

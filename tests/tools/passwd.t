@@ -9,6 +9,7 @@ Setting a password from a prompt.
 It is asked for twice and not shown; what is stored is encoded:
 
     $ in_terminal "PW: " Isar "Again: " Isar -- cfg32 -f conf passwd cn=Configuration oru-slapdAdminPW
+    cfg32: without --key-file the password is only masked, which hides it from nobody who tries
     New oru-slapdAdminPW: 
     Again: 
     $ grep -c "oru-slapdAdminPW: {iMASK}>" conf
@@ -28,6 +29,7 @@ The same password is not encoded anew:
 
     $ stat -c "%y %z %i" conf conf.bak > before
     $ in_terminal "PW: " Isar "Again: " Isar -- cfg32 -f conf passwd cn=Configuration oru-slapdAdminPW
+    cfg32: without --key-file the password is only masked, which hides it from nobody who tries
     New oru-slapdAdminPW: 
     Again: 
     unchanged
@@ -36,6 +38,7 @@ The same password is not encoded anew:
 The administrator's own password may be asked for as well:
 
     $ in_terminal "PW: " Inn "Again: " Inn "cn=root: " Isar -- cfg32 -f conf -D cn=root -W passwd -n "$listener" oru-slapdDbUserPW
+    cfg32: without --key-file the password is only masked, which hides it from nobody who tries
     New oru-slapdDbUserPW: 
     Again: 
     Password of cn=root: 
@@ -53,6 +56,7 @@ The administrator's own password may be asked for as well:
 A dry run shows that it changes, and neither the old one nor the new one:
 
     $ in_terminal "PW: " Inn "Again: " Inn -- cfg32 -f conf passwd -n cn=Configuration ORU-slapdadminpw
+    cfg32: without --key-file the password is only masked, which hides it from nobody who tries
     New oru-slapdAdminPW: 
     Again: 
     --- conf
@@ -67,7 +71,7 @@ A dry run shows that it changes, and neither the old one nor the new one:
      dn: cn=Network, cn=Configuration
      cn: Network
     $ stat -c "%y %z %i" conf conf.bak | cmp - before
-    $ in_terminal "PW: " Inn "Again: " Inn -- cfg32 -f conf passwd -n --json cn=Configuration oru-slapdAdminPW | grep -v -e New -e Again | python3 -c 'import json, sys; print(json.load(sys.stdin)["diff"])'
+    $ in_terminal "PW: " Inn "Again: " Inn -- cfg32 -f conf passwd -n --json cn=Configuration oru-slapdAdminPW | grep -v -e New -e Again -e cfg32: | python3 -c 'import json, sys; print(json.load(sys.stdin)["diff"])'
     --- conf
     +++ conf
     @@ -6,7 +6,7 @@
@@ -90,15 +94,28 @@ With a key it is encrypted, and then shown as it is stored:
     $ grep -c "oru-slapdDbUserPW: {AES256}" conf
     1
 
+A key encrypts one that is only masked, though it is the same; after that there is nothing to do:
+
+    $ in_terminal "PW: " Inn "Again: " Inn -- cfg32 -f conf passwd cn=Configuration oru-slapdAdminPW | tail -1
+    Again: 
+    $ in_terminal "PW: " Inn "Again: " Inn -- cfg32 -f conf --key-file key passwd cn=Configuration oru-slapdAdminPW | tail -1
+    Again: 
+    $ grep -c "oru-slapdAdminPW: {AES256}" conf
+    1
+    $ in_terminal "PW: " Inn "Again: " Inn -- cfg32 -f conf --key-file key passwd cn=Configuration oru-slapdAdminPW | tail -1
+    unchanged
+
 Two different ones change nothing, nor does an empty one:
 
     $ stat -c "%y %z %i" conf conf.bak > before
     $ in_terminal "PW: " Isar "Again: " isar -- cfg32 -f conf passwd cn=Configuration oru-slapdAdminPW
+    cfg32: without --key-file the password is only masked, which hides it from nobody who tries
     New oru-slapdAdminPW: 
     Again: 
     cfg32: the two passwords differ
     [1]
     $ in_terminal "PW: " "" -- cfg32 -f conf passwd cn=Configuration oru-slapdAdminPW
+    cfg32: without --key-file the password is only masked, which hides it from nobody who tries
     New oru-slapdAdminPW: 
     cfg32: an empty password is not set
     [1]
@@ -108,6 +125,7 @@ One that is too long is refused, and not shown:
 
     $ long=$(printf 'x%.0s' {1..1025})
     $ printf "$long\n$long\n" | setsid -w cfg32 -f conf passwd cn=Configuration oru-slapdAdminPW 2>&1 | grep -v accepted:
+    cfg32: without --key-file the password is only masked, which hides it from nobody who tries
     New oru-slapdAdminPW: Again: cfg32: Password length must be 1 to 1024 characters [Invalid syntax (21)]
       oru-slapdAdminPW: ********
     [3]
@@ -115,11 +133,13 @@ One that is too long is refused, and not shown:
 Without a terminal it is read from standard input:
 
     $ printf "Lech\nLech\n" | setsid -w cfg32 -f conf passwd cn=Configuration oru-slapdAdminPW
+    cfg32: without --key-file the password is only masked, which hides it from nobody who tries
     New oru-slapdAdminPW: Again:  (no-eol)
     $ echo Lech > password
     $ cfg32 -f conf -D cn=root -y password unset cn=Configuration x-none
     unchanged
     $ setsid -w cfg32 -f conf passwd cn=Configuration oru-slapdAdminPW < /dev/null
+    cfg32: without --key-file the password is only masked, which hides it from nobody who tries
     New oru-slapdAdminPW: cfg32: an empty password is not set
     [1]
 

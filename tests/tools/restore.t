@@ -5,7 +5,7 @@ It puts a backup back, byte for byte, after showing what that changes, and keeps
     $ cp oruslapd.conf original
     $ cfg32 -f oruslapd.conf set cn=Configuration oru-slapdVersion 9
     $ cp oruslapd.conf changed
-    $ cfg32 -f oruslapd.conf restore | grep '^[-+]oru-slapdVersion'
+    $ cfg32 -f oruslapd.conf restore --yes | grep '^[-+]oru-slapdVersion'
     +oru-slapdVersion: 4.2.1
     -oru-slapdVersion: 9
     $ cmp original oruslapd.conf && cmp changed oruslapd.conf.before-restore && cmp original oruslapd.conf.bak
@@ -13,15 +13,15 @@ It puts a backup back, byte for byte, after showing what that changes, and keeps
 What is there already is not written:
 
     $ state_of oruslapd.conf > state
-    $ cfg32 -f oruslapd.conf restore
+    $ cfg32 -f oruslapd.conf restore --yes
     unchanged
     $ state_of oruslapd.conf | cmp - state
 
 A restore is undone by restoring what it kept, and that again:
 
-    $ cfg32 -f oruslapd.conf restore oruslapd.conf.before-restore > diff
+    $ cfg32 -f oruslapd.conf restore --yes oruslapd.conf.before-restore > diff
     $ cmp changed oruslapd.conf && cmp original oruslapd.conf.before-undo
-    $ cfg32 -f oruslapd.conf restore oruslapd.conf.before-undo > diff
+    $ cfg32 -f oruslapd.conf restore --yes oruslapd.conf.before-undo > diff
     $ cmp original oruslapd.conf
 
 A dry run only shows it:
@@ -52,19 +52,27 @@ A dry run only shows it:
 
 At a terminal it asks; another answer than yes leaves the file alone:
 
-    $ "$TOOLS"/in_terminal '[y/n]' n -- cfg32 -f oruslapd.conf restore small-change | tail -1
-    Restore? [y/n] n
+    $ "$TOOLS"/in_terminal '[y/n]' n -- cfg32 -f oruslapd.conf restore small-change | tail -1; (exit ${PIPESTATUS[0]})
+    cfg32: nothing was restored
+    [1]
     $ state_of oruslapd.conf | cmp - state
-    $ "$TOOLS"/in_terminal '[y/n]' y -- cfg32 -f oruslapd.conf restore small-change | tail -1
-    Restore? [y/n] y
+    $ "$TOOLS"/in_terminal '[y/n]' yes -- cfg32 -f oruslapd.conf restore small-change | tail -1; (exit ${PIPESTATUS[0]})
+    Restore? [y/n] yes
     $ cmp small-change oruslapd.conf
-    $ "$TOOLS"/in_terminal -- cfg32 -f oruslapd.conf restore --yes original > diff
+    $ cfg32 -f oruslapd.conf restore --yes original > diff
+    $ cmp original oruslapd.conf
+
+Where nobody can be asked, --yes says that it is meant:
+
+    $ cfg32 -f oruslapd.conf restore small-change > diff
+    cfg32: nobody can be asked here: --yes restores
+    [2]
     $ cmp original oruslapd.conf
 
 What can't be loaded is not restored, and it is said why; what a load would put aside is told:
 
     $ printf 'dn: cn=Configuration\ncn: x\n\ndn: no name\n' > broken
-    $ cfg32 -f oruslapd.conf restore broken
+    $ cfg32 -f oruslapd.conf restore --yes broken
     broken:4:8: error: Invalid character in RDN attribute: n [invalid-dn]
         4 | dn: no name
           |        ^
@@ -74,7 +82,7 @@ What can't be loaded is not restored, and it is said why; what a load would put 
     [1]
     $ cmp original oruslapd.conf
     $ printf 'dn: cn=Configuration\noru-slapdPort: 0\n' > doubtful
-    $ cfg32 -f oruslapd.conf restore doubtful 2>&1 > diff
+    $ cfg32 -f oruslapd.conf restore --yes doubtful 2>&1 > diff
     doubtful:2:16: error: Integer value out of range [invalid-value]
         2 | oru-slapdPort: 0
           |                ^
@@ -85,7 +93,7 @@ What can't be loaded is not restored, and it is said why; what a load would put 
 A file that can't be loaded is no obstacle:
 
     $ cp broken oruslapd.conf
-    $ cfg32 -f oruslapd.conf restore original > diff
+    $ cfg32 -f oruslapd.conf restore --yes original > diff
     $ cmp original oruslapd.conf && cmp broken oruslapd.conf.before-restore
 
 Neither is one that was not written to its end. It is not kept: the backup is the complete version.
@@ -93,28 +101,36 @@ Neither is one that was not written to its end. It is not kept: the backup is th
     $ rm oruslapd.conf.before-restore
     $ printf '# This file is being written. If it stays so, its backup is the complete version.\ndn: cn=C' > oruslapd.conf
     $ cp original oruslapd.conf.bak
-    $ cfg32 -f oruslapd.conf restore > diff
+    $ cfg32 -f oruslapd.conf restore --yes > diff
     $ cmp original oruslapd.conf && ls oruslapd.conf.before-restore
     ls: cannot access 'oruslapd.conf.before-restore': No such file or directory
     [2]
 
-Nor a file that is gone; the new one has the backup's mode:
+That version is in what a restore kept, when it was a restore that did not come to its end:
+
+    $ cp original oruslapd.conf.bak && cp changed oruslapd.conf.before-restore
+    $ printf '# This file is being written. If it stays so, its backup is the complete version.\ndn: cn=C' > oruslapd.conf
+    $ cfg32 -f oruslapd.conf restore --yes > diff
+    $ cmp changed oruslapd.conf
+    $ rm oruslapd.conf.before-restore && cp original oruslapd.conf
+
+Nor is a file that is gone; the new one has the backup's mode:
 
     $ rm oruslapd.conf && chmod 640 oruslapd.conf.bak
-    $ cfg32 -f oruslapd.conf restore > diff
+    $ cfg32 -f oruslapd.conf restore --yes > diff
     $ cmp original oruslapd.conf && stat --format=%a oruslapd.conf
     640
 
 Where the replaced file goes can be said, but not over what is restored:
 
-    $ cfg32 -f oruslapd.conf --backup kept restore changed > diff
+    $ cfg32 -f oruslapd.conf --backup kept restore --yes changed > diff
     $ cmp original kept && cmp changed oruslapd.conf
     $ cfg32 -f oruslapd.conf --backup kept restore kept
     cfg32: what is restored can't be overwritten: kept
     [2]
-    $ cfg32 -f oruslapd.conf restore nowhere
+    $ cfg32 -f oruslapd.conf restore --yes nowhere
     cfg32: nowhere: No such file or directory [Connection error (91)]
     [3]
-    $ rm -f oruslapd.conf.bak; cfg32 -f oruslapd.conf restore
+    $ rm -f oruslapd.conf.bak; cfg32 -f oruslapd.conf restore --yes
     cfg32: oruslapd.conf.bak: No such file or directory [Connection error (91)]
     [3]

@@ -57,10 +57,10 @@ It says of each what explain says:
 Another format is a usage error, and so are two:
 
     $ cfg32 schema --format xml
-    --format: xml not in {table,json,markdown}
-    Run with --help for more information.
+    cfg32: --format: xml not in {table,json,markdown}
+      hint: x
     [2]
     $ cfg32 schema --json --format table
-    --format excludes --json
-    Run with --help for more information.
+    cfg32: --format excludes --json
+      hint: x
     [2]

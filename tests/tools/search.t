@@ -45,8 +45,8 @@ Base and scope say where to look:
     cn: Emergency Worker
     
     $ cfg32 -f oruslapd.conf search -s everywhere
-    --scope: everywhere not in {base,one,sub}
-    Run with --help for more information.
+    cfg32: --scope: everywhere not in {base,one,sub}
+      hint: `cfg32 search --help` tells what there is
     [2]
 
 Without a filter every entry is found, also one without an objectclass:
@@ -120,6 +120,20 @@ Finding nothing is the answer no, and so is a base that is not there:
     [1]
     $ cfg32 -f oruslapd.conf search -b cn=nobody '(cn=*)'
     cfg32: oruslapd.conf: no entry cn=nobody [No such object (32)]
+    [1]
+
+What a filter can't say is refused, because it would find nothing or everything; a name that may be
+mistyped is told:
+
+    $ for filter in '(&(cn=a)(cn=b))' '(|(cn=a)(cn=b))' '(!(cn=a))' 'cn=Cli*' 'oru-slapdPort>=1' '(cn=a' 'cn=a)' '()' '=' '((cn=a))'; do
+    >     cfg32 -f oruslapd.conf search "$filter" > found 2>&1; echo "$? $(wc -l < found)"
+    > done | sort | uniq -c
+         10 2 1
+    $ cfg32 -f oruslapd.conf search '(!(cn=a))'
+    cfg32: (!(cn=a)) is no filter: it is one term, attribute=value or attribute=*
+    [2]
+    $ cfg32 -f oruslapd.conf search '(oru-slapdPrt=389)'
+    cfg32: the server knows no attribute oru-slapdPrt; did you mean oru-slapdPort?
     [1]
 
 A filter that its attribute does not allow is a failure:

@@ -96,6 +96,7 @@ A value that its syntax refuses is told with the file, the entry and the value:
     $ cfg32 -f conf set "$listener" oru-slapdSuffix $'o=a\nb' 2>&1 | grep -v accepted:
     cfg32: conf: Attribute would not read back as it is written [Invalid syntax (21)]
       entry: cn=Listener, cn=Network, cn=Configuration
+      attribute: oru-slapdSuffix
     [3]
 
 A name that the server does not know is refused, unless it is meant:
@@ -156,8 +157,8 @@ An attribute goes, or some of its values; what is not there is not missed:
 Without values there is nothing to set:
 
     $ cfg32 -f conf set "$listener" oru-slapdPort
-    value is required
-    Run with --help for more information.
+    cfg32: value is required
+      hint: `cfg32 set --help` tells what there is
     [2]
 
 The administrator's name and password, when they are given, must be right:
@@ -174,14 +175,14 @@ The administrator's name and password, when they are given, must be right:
 Colours are for people, unless they are asked for:
 
     $ cfg32 -f conf --color always set -n "$listener" oru-slapdPort 1
-    \x1b[1m--- conf\x1b[0m (esc)
-    \x1b[1m+++ conf\x1b[0m (esc)
-    \x1b[36m@@ -14,7 +14,7 @@\x1b[0m (esc)
+    [1m--- conf[0m
+    [1m+++ conf[0m
+    [36m@@ -14,7 +14,7 @@[0m
      # Plain port.
      dn: cn=Listener, cn=Network, cn=Configuration
      cn: Listener
-    \x1b[31m-oru-slapdPort: 1389\x1b[0m (esc)
-    \x1b[32m+oru-slapdPort: 1\x1b[0m (esc)
+    [31m-oru-slapdPort: 1389[0m
+    [32m+oru-slapdPort: 1[0m
      oru-slapdSetenv: -x
      oru-slapdUlimitNofile: -1
      x-house-telephone: 4410
@@ -199,7 +200,7 @@ A file that does not load, and one that is not there:
     $ sed 's/^dn: .*Network.*/dn: Network/' conf.before > broken
     $ cfg32 -f broken set cn=Configuration oru-slapdVersion 1
     cfg32: broken:11: Missing RDN value: Network [Invalid DN syntax (34)]
-      entry: <root>
+      entry: above all entries
       hint: `cfg32 check` tells everything that is wrong
     [3]
     $ cfg32 -f missing set cn=Configuration oru-slapdVersion 1
@@ -211,7 +212,7 @@ JSON is UTF-8, whatever the file's name is:
     $ cp conf.before $'conf\xff'
     $ cfg32 -f $'conf\xff' unset --json "$listener" x-none | iconv -f UTF-8 -t UTF-8
     {
-      "file": "conf\xef\xbf\xbd", (esc)
+      "file": "conf�",
       "result": "unchanged",
       "dryRun": false,
       "skipped": []

@@ -24,8 +24,8 @@ A terminal gets colours, a pipe does not:
     $ NO_COLOR=1 cfg32 --color always check doubtful | has_colour
     coloured
     $ cfg32 --color sometimes check doubtful
-    --color: sometimes not in {auto,always,never}
-    Run with --help for more information.
+    cfg32: --color: sometimes not in {auto,always,never}
+      hint: `cfg32 check --help` tells what there is
     [2]
 
 What takes longer than a second tells a terminal what it is doing, and takes that away again. Here it

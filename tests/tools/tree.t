@@ -18,7 +18,7 @@ It draws the entries below their parents:
 An entry is where to begin, and the style what to draw with:
 
     $ cfg32 -f oruslapd.conf tree cn=network,cn=configuration
-    ─ cn=Network, cn=Configuration (suffix)
+    ─ cn=Network, cn=Configuration
         ├─ cn=Client Listener
         ├─ cn=Management Listener
         ├─ cn=Connections
@@ -26,22 +26,21 @@ An entry is where to begin, and the style what to draw with:
         ├─ cn=Search Limits
         └─ cn=Referrals
     $ cfg32 -f oruslapd.conf tree cn=connections,cn=network,cn=configuration --style ascii
-    - cn=Connections, cn=Network, cn=Configuration (suffix)
+    - cn=Connections, cn=Network, cn=Configuration
         |
         +- cn=Emergency Worker
     $ cfg32 -f oruslapd.conf tree cn=connections,cn=network,cn=configuration --style cp437 | od -An -c -w16
      304       c   n   =   C   o   n   n   e   c   t   i   o   n   s
        ,       c   n   =   N   e   t   w   o   r   k   ,       c   n
-       =   C   o   n   f   i   g   u   r   a   t   i   o   n       (
-       s   u   f   f   i   x   )  \n                 300 304       c
-       n   =   E   m   e   r   g   e   n   c   y       W   o   r   k
-       e   r  \n
+       =   C   o   n   f   i   g   u   r   a   t   i   o   n  \n    
+                 300 304       c   n   =   E   m   e   r   g   e   n
+       c   y       W   o   r   k   e   r  \n
     $ cfg32 -f oruslapd.conf tree cn=nobody
     cfg32: oruslapd.conf: no entry cn=nobody [No such object (32)]
     [1]
     $ cfg32 -f oruslapd.conf tree --style curly
-    --style: curly not in {unicode,ascii,cp437}
-    Run with --help for more information.
+    cfg32: --style: curly not in {unicode,ascii,cp437}
+      hint: `cfg32 tree --help` tells what there is
     [2]
 
 An entry whose ancestors are missing hangs below the nearest one there is, with a mark; what is
@@ -70,19 +69,19 @@ missing stands below the drawing:
       "entries": [
         {
           "dn": "cn=Configuration",
-          "depth": 1,
+          "depth": 0,
           "missingAncestors": []
         },
         {
           "dn": "cn=b, cn=missing, cn=Configuration",
-          "depth": 3,
+          "depth": 1,
           "missingAncestors": [
             "cn=missing, cn=Configuration"
           ]
         },
         {
           "dn": "cn=Jörg, cn=b, cn=missing, cn=Configuration",
-          "depth": 4,
+          "depth": 2,
           "missingAncestors": []
         }
       ],

@@ -145,7 +145,7 @@ const same_change same_changes[] = {
      [](CfgHandle* h) {
          return modified(h, "cn=Front End, cn=Configuration", {{del, "oru-slapdWorkers", {}}});
      }},
-    {"a replacement by nothing", "dn: " + listener + "\nreplace: oru-slapdIpAddress\n",
+    {"a replacement by nothing", "dn: " + listener + "\nreplace: oru-slapdIpAddress\n-\n",
      [](CfgHandle* h) {
          return modified(h, listener, {{replace, "oru-slapdIpAddress", {}}});
      }},
@@ -257,10 +257,10 @@ TEST_F(update_test, WritesNothingWhenNothingWouldChange) {
         a + "replace: oru-slapdPort\noru-slapdPort: 389\n",
         a + "replace: oru-slapdPort\noru-slapdPort: 0389\n",
         a + "replace: oru-slapdSuffix\noru-slapdSuffix: o = x\noru-slapdSuffix: o=y\n",
-        a + "replace: x-none\n",
+        a + "replace: x-none\n-\n",
         a + "add: oru-slapdSuffix\noru-slapdSuffix: o=y\noru-slapdSuffix: o=x\n",
         a + "delete: oru-slapdSuffix\noru-slapdSuffix: o=z\n",
-        a + "delete: x-none\n",
+        a + "delete: x-none\n-\n",
         a + "delete: x-none\nx-none: 1\n",
         a + "changetype: add\ncn: a\noru-slapdSuffix: o=y\n",
         "dn: cn=b, cn=a, cn=Configuration\nreplace: oru-slapdDbUserPW\noru-slapdDbUserPW: "
@@ -271,6 +271,7 @@ TEST_F(update_test, WritesNothingWhenNothingWouldChange) {
     folder.write("conf", small);
     const identity before = file();
     how.merges = true;
+    how.may_be_gone = true;
     for (const std::string& row : rows) {
         SCOPED_TRACE(row);
         const update_result result = change(row);
@@ -336,9 +337,9 @@ TEST_F(update_test, TellsWhatIsWrongAndWhere) {
          "on nonleaf (66)]\n  entry: cn=a, cn=Configuration"},
         {"dn: cn=z, cn=Configuration\nchangetype: delete\n",
          "changes.ldif:1: Entry not found [No such object (32)]\n  entry: cn=z, cn=Configuration"},
-        {"\ndn: cn=z, cn=Configuration\ndelete: x\n",
+        {"\ndn: cn=z, cn=Configuration\ndelete: x\n-\n",
          "changes.ldif:2: Entry not found [No such object (32)]\n  entry: cn=z, cn=Configuration"},
-        {"dn: a\ndelete: x\n", "changes.ldif:1: "},
+        {"dn: a\ndelete: x\n-\n", "changes.ldif:1: "},
         {"dn:\nadd: x\nx: 1\n",
          "changes.ldif:3: Attribute would not read back as it is written [Invalid syntax (21)]"},
         {a + "add: x\nx:: YSA=\n",
@@ -371,16 +372,32 @@ TEST_F(update_test, WithoutASourceFailuresNameTheConfiguration) {
               options.file + ": Entry not found [No such object (32)]\n  entry: cn=z");
 }
 
+TEST_F(update_test, RefusesToDeleteAnAttributeThatIsNotThere) {
+    folder.write("conf", small);
+    EXPECT_THAT(failure_of("dn: cn=a, cn=Configuration\ndelete: x-none\n-\n"),
+                testing::HasSubstr("No such attribute (16)"));
+}
+
+TEST_F(update_test, GivesUpOnRecordsThatWereMadeForAnotherText) {
+    folder.write("conf", small);
+    const std::string other = small + "# Changed.\n";
+    how.based_on = &other;
+    EXPECT_THAT(
+        failure_of("dn: cn=a, cn=Configuration\nreplace: oru-slapdPort\noru-slapdPort: 1\n"),
+        testing::HasSubstr("DSA is busy (51)"));
+    EXPECT_EQ(folder.read("conf"), small);
+}
+
 TEST_F(update_test, TellsAllRecordsThatDoNotPassTheCheck) {
     folder.write("conf", small);
     const std::string message = failure_of(
-        "dn: a\ndelete: x\n\n"
+        "dn: a\ndelete: x\n-\n\n"
         "dn: cn=a, cn=Configuration\nreplace: oru-slapdPort\noru-slapdPort: 1\n\n"
         "dn: cn=z, cn=Configuration\nreplace: oru-slapdPort\noru-slapdPort: 0\n\n"
         "dn: cn=a, cn=Configuration\nchangetype: add\noru-slapdPort: x\n");
     EXPECT_THAT(message, testing::HasSubstr("changes.ldif:1: "));
-    EXPECT_THAT(message, testing::HasSubstr("\nchanges.ldif:10: "));
-    EXPECT_THAT(message, testing::HasSubstr("\nchanges.ldif:14: "));
+    EXPECT_THAT(message, testing::HasSubstr("\nchanges.ldif:11: "));
+    EXPECT_THAT(message, testing::HasSubstr("\nchanges.ldif:15: "));
     EXPECT_THAT(message, testing::Not(testing::HasSubstr("Already")));
 }
 
@@ -490,7 +507,7 @@ TEST_F(update_test, AFileThatAnotherProgramKeepsIsBusy) {
     struct stat status {};
     const unique_fd holder = open_regular(options.file.c_str(), status);
     ASSERT_EQ(flock(holder.get(), LOCK_EX), 0);
-    EXPECT_EQ(failure_of("dn: cn=a, cn=Configuration\ndelete: cn\n"),
+    EXPECT_EQ(failure_of("dn: cn=a, cn=Configuration\ndelete: cn\n-\n"),
               options.file + ": in use by another process [DSA is busy (51)]");
     EXPECT_EQ(file(), before);
 }
@@ -501,16 +518,16 @@ TEST_F(update_test, AProgramThatReadsKeepsTheFileFromBeingWritten) {
     struct stat status {};
     const unique_fd reader = open_regular(options.file.c_str(), status);
     ASSERT_EQ(flock(reader.get(), LOCK_SH), 0);
-    EXPECT_THAT(failure_of("dn: cn=a, cn=Configuration\ndelete: cn\n"),
+    EXPECT_THAT(failure_of("dn: cn=a, cn=Configuration\ndelete: cn\n-\n"),
                 testing::HasSubstr("[DSA is busy (51)]"));
     EXPECT_EQ(file(), before);
-    EXPECT_FALSE(change("dn: cn=a, cn=Configuration\ndelete: x-none\n").is_changed);
+    EXPECT_FALSE(change("dn: cn=a, cn=Configuration\nreplace: x-none\n-\n").is_changed);
 }
 
 TEST_F(update_test, UnusableLinesDoNotReachTheBackup) {
     const std::string before = small + "dn: cn=c, cn=Configuration\noru-slapdPort: x\n\n";
     folder.write("conf", before);
-    EXPECT_FALSE(change("dn: cn=c, cn=Configuration\ndelete: x-none\n").is_changed);
+    EXPECT_FALSE(change("dn: cn=c, cn=Configuration\nreplace: x-none\n-\n").is_changed);
     EXPECT_EQ(folder.read("conf"), before);
     EXPECT_EQ(files(), 1u);
 

@@ -119,9 +119,10 @@ void require_useful(const settings& options, const command& chosen) {
 int tell_usage_error(const CLI::App& parser, const CLI::ParseError& e) {
     const auto chosen = parser.get_subcommands();
     const std::vector<std::string> unknown = parser.remaining();
-    const bool has_no_command = chosen.empty() && !unknown.empty();
-    complain(fmt::format("{}\n  hint: `cfg32 {}--help` tells what there is",
-                         has_no_command ? "no command is called " + unknown.front() : e.what(),
+    const std::string message = !chosen.empty()   ? e.what()
+                                : unknown.empty() ? "no command is given"
+                                                  : "no command is called " + unknown.front();
+    complain(fmt::format("{}\n  hint: `cfg32 {}--help` tells what there is", message,
                          chosen.empty() ? "" : chosen.front()->get_name() + " "));
     return usage_error;
 }

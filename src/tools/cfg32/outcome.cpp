@@ -62,7 +62,8 @@ std::string told(const facts& known) {
         append_line(text, "system error", strerror(known.system_error));
     }
     append_line(text, "entry", known.entry == "<root>" ? "above all entries" : known.entry);
-    const bool has_line = !known.value.empty() && known.value.find('\n') == std::string::npos;
+    const bool has_line = known.code != CFG_NO_SUCH_ATTRIBUTE && !known.value.empty() &&
+                          known.value.find('\n') == std::string::npos;
     if (has_line && !known.attribute.empty()) {
         append_line(text, known.attribute, shown_value(known.attribute, known.value));
     } else {
@@ -78,6 +79,7 @@ struct own_message {
     const char* text;
 };
 constexpr own_message own_messages[] = {
+    {CFG_NO_SUCH_ATTRIBUTE, "there is no such attribute to delete"},
     {CFG_INVALID_CREDENTIALS, "not the administrator's DN and password"},
     {CFG_DECODING_ERROR, "a stored password can't be decoded with this key, or without one"},
     {162, "text that is not of the locale's character set"},

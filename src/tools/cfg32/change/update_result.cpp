@@ -17,10 +17,12 @@ namespace {
 json as_json(const settings& options, const update_result& result) {
     json skipped = json::array();
     for (const skipped_record& each : result.skipped) {
-        json object = {{"dn", utf8(each.dn)}, {"reason", utf8(each.reason)}};
+        json object = json::object();
         if (each.line > 0) {
             object["line"] = each.line;
         }
+        object["dn"] = utf8(each.dn);
+        object["reason"] = utf8(each.reason);
         skipped.push_back(std::move(object));
     }
     json document = {
