@@ -119,7 +119,8 @@ void require_useful(const settings& options, const command& chosen) {
 int tell_usage_error(const CLI::App& parser, const CLI::ParseError& e) {
     const auto chosen = parser.get_subcommands();
     const std::vector<std::string> unknown = parser.remaining();
-    const std::string message = !chosen.empty()   ? e.what()
+    const bool lacks_command = chosen.empty() && e.get_name() == "RequiredError";
+    const std::string message = !lacks_command    ? e.what()
                                 : unknown.empty() ? "no command is given"
                                                   : "no command is called " + unknown.front();
     complain(fmt::format("{}\n  hint: `cfg32 {}--help` tells what there is", message,
