@@ -41,6 +41,35 @@ TEST(AttributeWords, AUrlBeginsWithOneOfItsUsualWords) {
     EXPECT_THAT(example_value(row("oru-slapdReferral")), testing::StartsWith("ldap://"));
 }
 
+TEST(AttributeWords, NoExampleIsAPlaceholder) {
+    for (const _AttrType* type : all_attributes()) {
+        EXPECT_NE(example_value(*type), "example") << type->name;
+    }
+}
+
+struct example_row {
+    const char* name;
+    const char* value;
+};
+
+class ExampleValue : public testing::TestWithParam<example_row> {};
+
+TEST_P(ExampleValue, IsOneThatAnAdministratorCouldMean) {
+    EXPECT_EQ(example_value(row(GetParam().name)), GetParam().value);
+}
+
+INSTANTIATE_TEST_SUITE_P(Attributes, ExampleValue,
+                         testing::Values(example_row{"charset", "UTF-8"},
+                                         example_row{"version", "1"},
+                                         example_row{"oru-slapdPort", "389"},
+                                         example_row{"oru-slapdSecurePort", "636"},
+                                         example_row{"oru-slapdPwEncryption", "aes256"},
+                                         example_row{"oru-slapdDbName", "people"},
+                                         example_row{"oru-slapdAdminDN", "cn=root"},
+                                         example_row{"oru-slapdIpAddress", "192.0.2.10"},
+                                         example_row{"oru-auditVersion", "3"},
+                                         example_row{"oru-slapdPtaAttrMapping", "mail:uid"}));
+
 TEST(AttributeWords, ListsEveryAttributeOnceInOrder) {
     const std::vector<const _AttrType*> rows = all_attributes();
     EXPECT_EQ(rows.size(), 196U);

@@ -7,6 +7,8 @@
 #include <CLI/CLI.hpp>
 #include <algorithm>
 
+#include "file_lock.h"
+
 using namespace cfg32::tool;
 using testing::Contains;
 using testing::ElementsAre;
@@ -24,6 +26,7 @@ class CompletionWords : public testing::Test {
     CompletionWords() {
         program.add_option("-f,--file", text)->type_name("FILE");
         program.add_option("--color", text)->type_name("auto|never");
+        program.add_option("-D,--bind-dn", text)->type_name("DN");
         CLI::App* set = program.add_subcommand("set", "give an attribute these values");
         set->add_option("dn", text)->type_name("DN");
         set->add_option("attribute", text)->type_name("ATTR");
@@ -70,9 +73,10 @@ TEST_F(CompletionWords, ComeWithTheirDescriptions) {
 }
 
 TEST_F(CompletionWords, AreTheOptionsOfTheCommandAndTheSharedOnesAfterADash) {
-    EXPECT_THAT(words_of({"set", "-"}),
-                ElementsAre("--help", "-h", "--dry-run", "-n", "--file", "-f", "--color"));
-    EXPECT_THAT(words_of({"--"}), ElementsAre("--help", "-h", "--file", "-f", "--color"));
+    EXPECT_THAT(words_of({"set", "-"}), ElementsAre("--help", "-h", "--dry-run", "-n", "--file",
+                                                    "-f", "--color", "--bind-dn", "-D"));
+    EXPECT_THAT(words_of({"--"}),
+                ElementsAre("--help", "-h", "--file", "-f", "--color", "--bind-dn", "-D"));
 }
 
 TEST_F(CompletionWords, AreFilesWhereAFileIsExpected) {
@@ -94,6 +98,19 @@ TEST_F(CompletionWords, AreTheNamesOfTheFilesEntriesWhereADnIsExpected) {
                                      "cn=Client Listener, cn=Network, cn=Configuration"}));
     EXPECT_EQ(words_of({"search", std::string("--file=") + example, "-b", ""}), names);
     EXPECT_EQ(words_of({"search", std::string("-f") + example, "--base", ""}), names);
+}
+
+TEST_F(CompletionWords, AreTheAdministratorsWhereTheOneWhoBindsIsExpected) {
+    const std::vector<std::string> names = words_of({"-f", example, "-D", ""});
+    EXPECT_THAT(names, IsSupersetOf({"cn=root", "cn=jvoss, ou=staff, dc=example, dc=com"}));
+    EXPECT_THAT(names, Not(Contains("cn=Configuration")));
+    EXPECT_EQ(words_of({"-f", example, "set", "--bind-dn", ""}), names);
+}
+
+TEST_F(CompletionWords, AreThereWhileAnotherProgramHasLockedTheFile) {
+    const cfg32::locked_file locked(example, O_RDONLY, LOCK_EX);
+    ASSERT_TRUE(locked);
+    EXPECT_THAT(words_of({"-f", example, "set", ""}), Contains("cn=Configuration"));
 }
 
 TEST_F(CompletionWords, AreNoneForAFileThatIsNotThere) {

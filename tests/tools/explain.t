@@ -8,7 +8,7 @@ values, and one that is accepted:
       values:   one
       example:  389
 
-Several attributes, of each kind of syntax:
+Several attributes, of each kind of syntax, with a blank line between them:
 
     $ cfg32 explain oru-slapdAuditOperation oru-slapdSslCipherSpecs oru-slapdSuffix \
     >     oru-slapdAdminPW oru-slapdReferral oru-slapdDbName oru-slapdCachedAttributeAutoAdjustTime
@@ -18,31 +18,37 @@ Several attributes, of each kind of syntax:
                 in upper or lower case
       values:   one or several
       example:  ALL
+    
     oru-slapdSslCipherSpecs
       syntax:   an integer made of permitted bits (mask)
       accepts:  an integer made of the bits 0xff00, such as 12288
       values:   one
       example:  12288
+    
     oru-slapdSuffix
       syntax:   a distinguished name (dn)
       accepts:  a distinguished name, usually not an empty one
       values:   one or several
-      example:  ou=people, dc=example, dc=com
+      example:  dc=example, dc=com
+    
     oru-slapdAdminPW
       syntax:   a password (pw)
       accepts:  a password of 1 to 1024 bytes, or one that is encoded already
       values:   one
       example:  correct horse battery staple
+    
     oru-slapdReferral
       syntax:   text, usually a URL (url)
       accepts:  text, usually a URL that begins with ldap:// or ldaps://
       values:   one or several
-      example:  ldap://ldap.example.com:389
+      example:  ldap://ldap1.example.org:389
+    
     oru-slapdDbName
       syntax:   text (ces)
       accepts:  text of 1 to 8 bytes
       values:   one
-      example:  example
+      example:  people
+    
     oru-slapdCachedAttributeAutoAdjustTime
       syntax:   a time of day, Thhmmss (time)
       accepts:  a time of day as Thhmmss, from T000000 to T235959
@@ -61,6 +67,28 @@ all the same:
       values:   one
       example:  1
     [1]
+
+The same name twice is told twice:
+
+    $ cfg32 explain version version
+    version
+      syntax:   an integer (int)
+      accepts:  an integer that is 1
+      values:   one
+      example:  1
+    
+    version
+      syntax:   an integer (int)
+      accepts:  an integer that is 1
+      values:   one
+      example:  1
+
+An example is one that an administrator could mean:
+
+    $ cfg32 explain charset oru-slapdSecurePort oru-slapdPwEncryption | grep example
+      example:  UTF-8
+      example:  636
+      example:  aes256
 
 The beginning that most names share may be left out of what is meant:
 
@@ -91,7 +119,7 @@ JSON has the constraints one by one:
           "minimumLength": 1,
           "maximumLength": 8,
           "singleValued": true,
-          "example": "example"
+          "example": "people"
         },
         {
           "name": "oru-slapdReadOnly",
@@ -128,5 +156,5 @@ Without a name there is nothing to explain:
 
     $ cfg32 explain
     cfg32: attributes is required
-      hint: x
+      hint: `cfg32 explain --help` tells what there is
     [2]

@@ -33,14 +33,14 @@ Every attribute of the example file is there:
 
 For documents:
 
-    $ cfg32 schema --format markdown | grep -E 'attribute \||---|Port`|`cn'
+    $ cfg32 schema --format markdown | grep -E 'attribute \||---|Port`|`cn`'
     | attribute | syntax | values | accepts | example |
     |---|---|---|---|---|
-    | `cn` | cis | one | text, upper and lower case alike | `example` |
+    | `cn` | cis | one | text, upper and lower case alike | `Client Listener` |
     | `oru-slapdLdapCrlPort` | int | one | an integer from 1 to 65535 | `389` |
-    | `oru-slapdLogTALMPort` | int | one | an integer from 1 to 65535 | `389` |
+    | `oru-slapdLogTALMPort` | int | one | an integer from 1 to 65535 | `9443` |
     | `oru-slapdPort` | int | one | an integer from 1 to 65535 | `389` |
-    | `oru-slapdSecurePort` | int | one | an integer from 1 to 65535 | `389` |
+    | `oru-slapdSecurePort` | int | one | an integer from 1 to 65535 | `636` |
 
 For programs, by either option:
 
@@ -58,9 +58,9 @@ Another format is a usage error, and so are two:
 
     $ cfg32 schema --format xml
     cfg32: --format: xml not in {table,json,markdown}
-      hint: x
+      hint: `cfg32 schema --help` tells what there is
     [2]
     $ cfg32 schema --json --format table
-    cfg32: --format excludes --json
-      hint: x
+    cfg32: --json excludes --format
+      hint: `cfg32 schema --help` tells what there is
     [2]

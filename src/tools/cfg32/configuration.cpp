@@ -55,8 +55,11 @@ bool is_printable(const LDIF_Entry& root) try {
 }  // namespace
 
 configuration::configuration(const settings& options, std::string file_name)
+    : configuration(options, file_name, read_configuration(file_name)) {}
+
+configuration::configuration(const settings& options, std::string file_name, std::string text)
     : name_(std::move(file_name)),
-      text_(read_configuration(name_)),
+      text_(std::move(text)),
       key_(options),
       copy_(text_),
       handle_(cfg_init(), cfg_unbind) {

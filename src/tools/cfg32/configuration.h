@@ -24,6 +24,8 @@ class configuration {
     configuration(const settings& options, std::string file_name);
     /// The file that the options name, bound to with their credentials.
     explicit configuration(const settings& options);
+    /// A text that was read already, of the file of that name.
+    configuration(const settings& options, std::string file_name, std::string text);
 
     const std::string& name() const { return name_; }
     const std::string& text() const { return text_; }

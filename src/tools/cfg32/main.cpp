@@ -7,6 +7,7 @@
 #include <clocale>
 #include <cstdio>
 #include <iostream>
+#include <span>
 
 #include "LDIF_Exception.h"
 #include "choice_option.h"
@@ -116,6 +117,18 @@ void require_useful(const settings& options, const command& chosen) {
     require(options.is_json, prints, "--json");
 }
 
+/// The parser would take the next word for the value of "--option=".
+void require_values(std::span<char*> arguments) {
+    for (const std::string_view argument : arguments) {
+        if (argument == "--") {
+            return;
+        }
+        if (argument.starts_with("--") && argument.find('=') == argument.size() - 1) {
+            throw ended(usage_error, std::string(argument) + " is empty");
+        }
+    }
+}
+
 int tell_usage_error(const CLI::App& parser, const CLI::ParseError& e) {
     const auto chosen = parser.get_subcommands();
     const std::vector<std::string> unknown = parser.remaining();
@@ -183,6 +196,7 @@ int main(int argc, char** argv) {
     add_options_of(changes | prints, parser, options, "");
     const std::vector<parsed_command> all = add_commands(parser, options);
     try {
+        require_values({argv, static_cast<size_t>(argc)});
         parser.parse(argc, argv);
     } catch (const CLI::Success& asked_for_help) {
         parser.exit(asked_for_help);
@@ -190,6 +204,9 @@ int main(int argc, char** argv) {
         return flushed(done);
     } catch (const CLI::ParseError& e) {
         return tell_usage_error(parser, e);
+    } catch (const ended& e) {
+        complain(e.what());
+        return e.status();
     }
     choose_color(options.color);
     const auto chosen = std::find_if(

@@ -31,6 +31,17 @@ std::string content_of(int file, size_t expected, const std::string& name) {
     return text;
 }
 
+std::string text_of(const std::string& name, int operation) {
+    const locked_file file(name.c_str(), O_RDONLY, operation);
+    if (!file && errno == EWOULDBLOCK) {
+        fail(CFG_BUSY, name + ": in use by another process");
+    }
+    if (!file) {
+        fail_with_errno(name, CFG_CONNECT_ERROR);
+    }
+    return content_of(file.get(), static_cast<size_t>(file.status().st_size), name);
+}
+
 }  // namespace
 
 memory_file::memory_file(std::string_view text)
@@ -45,14 +56,9 @@ std::string memory_file::text() const { return content_of(file_.get(), 0, name_)
 
 std::string read_configuration(const std::string& name) {
     const progress reading("Reading " + name);
-    const locked_file file(name.c_str(), O_RDONLY, LOCK_SH);
-    if (!file && errno == EWOULDBLOCK) {
-        fail(CFG_BUSY, name + ": in use by another process");
-    }
-    if (!file) {
-        fail_with_errno(name, CFG_CONNECT_ERROR);
-    }
-    return content_of(file.get(), static_cast<size_t>(file.status().st_size), name);
+    return text_of(name, LOCK_SH);
 }
+
+std::string read_without_waiting(const std::string& name) { return text_of(name, without_lock); }
 
 }  // namespace cfg32::tool

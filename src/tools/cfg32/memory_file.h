@@ -26,4 +26,7 @@ class memory_file {
 /// it can't be read.
 std::string read_configuration(const std::string& name);
 
+/// The same without asking for the lock, which somebody may hold for long.
+std::string read_without_waiting(const std::string& name);
+
 }  // namespace cfg32::tool

@@ -2,8 +2,6 @@
 
 #include "change/update.h"
 
-#include <fstream>
-#include <iterator>
 #include <optional>
 
 #include "LDIF_File.h"
@@ -24,12 +22,6 @@ constexpr int simple_method = CFG_AUTH_SIMPLE;
 std::string renamed(std::string text, const std::string& from, const std::string& to) {
     const size_t place = text.find(from);
     return place == std::string::npos ? text : text.replace(place, from.size(), to);
-}
-
-/// Read without waiting for the lock: somebody may hold it for long.
-std::string present_text(const std::string& name) {
-    std::ifstream file(name, std::ios::binary);
-    return {std::istreambuf_iterator<char>(file), {}};
 }
 
 /// A private copy of the configuration in memory, loaded.
@@ -222,7 +214,7 @@ bool updater::is_written() {
         LDIF_File::replace(name(), options_.backup_name(), result_.after, result_.before);
         return true;
     } catch (const LDIF_Exception& e) {
-        if (e.ldapErr != CFG_BUSY || present_text(name()) == result_.before) {
+        if (e.ldapErr != CFG_BUSY || read_without_waiting(name()) == result_.before) {
             throw ended(failed, report(e, name()));
         }
         return false;  // somebody was faster: again, with what they left

@@ -22,7 +22,7 @@ constexpr const char* bash_script =
     R"(# Completion of cfg32 for bash. Load it with: source <(cfg32 completion bash)
 
 _cfg32() {
-    local rest=${COMP_LINE:0:COMP_POINT} word kind i
+    local rest=${COMP_LINE:0:COMP_POINT} word kind i program
     local -a words=()
     # Bash splits words at the characters of COMP_WORDBREAKS, too, "=" among them: what has no blank
     # before it belongs to the word before.
@@ -37,11 +37,15 @@ _cfg32() {
         words[-1]+=$word
         rest=${rest#"$word"}
     done
+    # The program of the line answers, wherever it lies; for another name of it the one of PATH.
+    program=${words[0]//[\"\'\\]/}
+    program=${program/#'~/'/$HOME/}
+    type -P -- "$program" >/dev/null || program=cfg32
     {
         read -r kind
         mapfile -t COMPREPLY
     } < <(printf '%s\0' "$COMP_WORDBREAKS" "${words[@]}" |
-        command cfg32 completion bash --candidates 2>/dev/null)
+        command "$program" completion bash --candidates 2>/dev/null)
     if [[ $kind == files ]]; then
         compopt -o default 2>/dev/null
     fi
@@ -55,13 +59,18 @@ constexpr const char* zsh_script = R"(#compdef cfg32
 # with: source <(cfg32 completion zsh)
 
 _cfg32() {
-    local kind line
+    local kind line program=${(Q)words[1]}
     local -a lines names descriptions
+    # The program of the line answers, wherever it lies; for another name of it the one of PATH.
+    program=${program/#'~/'/$HOME/}
+    whence -p -- "$program" >/dev/null || program=cfg32
     lines=("${(@f)$(printf '%s\0' '' "${(@Q)words[1,CURRENT-1]}" "${(Q)PREFIX}" |
-        command cfg32 completion zsh --candidates 2>/dev/null)}")
+        command "$program" completion zsh --candidates 2>/dev/null)}")
     kind=$lines[1]
     shift lines
     if [[ $kind == files ]]; then
+        # The file is what follows the option.
+        [[ $PREFIX == --*=* ]] && compset -P 1 '*='
         _files
         return
     fi
@@ -84,10 +93,18 @@ constexpr const char* fish_script =
 
 function __cfg32_candidates
     set -l current (commandline -ct)
-    set -l lines (printf '%s\0' '' (commandline -opc) "$current" |
-        command cfg32 completion fish --candidates 2>/dev/null)
+    set -l words (commandline -opc)
+    # The program of the line answers, wherever it lies; for another name of it the one of PATH.
+    set -l program (string replace -r '^~/' "$HOME/" -- $words[1])
+    command -sq -- $program; or set program cfg32
+    set -l lines (printf '%s\0' '' $words "$current" |
+        command $program completion fish --candidates 2>/dev/null)
     if test "$lines[1]" = files
-        __fish_complete_path "$current"
+        # The file is what follows the option.
+        set -l option (string match -r -- '^--[^=]*=' $current)
+        for path in (__fish_complete_path (string replace -- "$option" '' $current))
+            printf '%s%s\n' "$option" $path
+        end
         return
     end
     set -e lines[1]

@@ -5,6 +5,7 @@
 #include <CLI/CLI.hpp>
 #include <memory>
 #include <nlohmann/json.hpp>
+#include <utility>
 
 #include "LDIF_AttrType.h"
 #include "command.h"
@@ -47,7 +48,9 @@ int explain(const std::vector<std::string>& names, bool is_json) {
     if (is_json) {
         print_json(attributes_json(rows));
     } else {
+        const char* between = "";
         for (const _AttrType* row : rows) {
+            fmt::print("{}", std::exchange(between, "\n"));
             print_explained(*row);
         }
     }

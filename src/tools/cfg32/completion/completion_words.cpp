@@ -9,7 +9,9 @@
 #include <string_view>
 
 #include "LDIF_AttrType.h"
+#include "cfg32.h"
 #include "configuration.h"
+#include "memory_file.h"
 #include "outcome.h"
 #include "schema/attribute_words.h"
 #include "settings.h"
@@ -34,6 +36,7 @@ class typed_line {
     const CLI::Option* next_argument() const;
     std::string argument_of_type(std::string_view type) const;
     std::vector<std::string> entry_names() const;
+    std::vector<std::string> administrators() const;
 
     void take_long_option(std::string_view word);
     void take_short_options(std::string_view word);
@@ -141,20 +144,37 @@ std::string typed_line::argument_of_type(std::string_view type) const {
     return {};
 }
 
-/// The DNs of the file that the line names; none when it can't be read.
-std::vector<std::string> typed_line::entry_names() const try {
+/// What a file holds, as far as it can be used; nothing when it can't be read.
+std::vector<entry> entries_of_file(const std::string& typed_name) try {
     settings options;
-    options.file = with_home(file_);
-    const configuration file(options);
-    std::vector<std::string> names;
-    for_each_in_preorder(file.root(), [&](const LDIF_Entry& entry) {
-        if (!entry.is_root()) {
-            names.push_back(shown(entry.dn()));
-        }
-    });
-    return names;
+    options.file = with_home(typed_name);
+    const std::string name = options.file_name();
+    const configuration file(options, name, read_without_waiting(name));
+    return entries_below(file.root(), CFG_SCOPE_SUBTREE);
 } catch (const ended&) {
     return {};
+}
+
+/// The DNs of the file that the line names.
+std::vector<std::string> typed_line::entry_names() const {
+    std::vector<std::string> names;
+    for (const entry& each : entries_of_file(file_)) {
+        names.push_back(each.dn);
+    }
+    return names;
+}
+
+/// The DNs that the file that the line names lets bind.
+std::vector<std::string> typed_line::administrators() const {
+    std::vector<std::string> names;
+    for (const entry& each : entries_of_file(file_)) {
+        for (const attribute& stored : each.attributes) {
+            if (cisString(stored.name) == "oru-slapdAdminDN") {
+                names.insert(names.end(), stored.values.begin(), stored.values.end());
+            }
+        }
+    }
+    return names;
 }
 
 void typed_line::take(const std::string& word) {
@@ -258,6 +278,8 @@ completion_words typed_line::values(const CLI::Option& option) const {
     completion_words found{false, choices_of(option)};
     if (type == "FILE" || type == "BACKUP") {
         found.are_files = true;
+    } else if (option.check_name("--bind-dn")) {
+        append_names(found.words, "", administrators(), "");
     } else if (type == "DN") {
         append_names(found.words, "", entry_names(), "");
     } else if (type == "ATTR") {

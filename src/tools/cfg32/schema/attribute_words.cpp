@@ -18,6 +18,7 @@ namespace {
 enum class kind { text, word, time, integer, large, mask, name, password };
 
 /// A syntax. Bounds are told before the comma of its words; what follows "usually" is not enforced.
+/// The example is for an attribute that has none of its own.
 struct syntax {
     const char* name;
     from_str_operation* from_str;
@@ -54,6 +55,27 @@ constexpr int count_of_syntaxes = 0
 #undef SYNTAX
     ;
 static_assert(std::size(syntaxes) == count_of_syntaxes);
+
+struct attribute_example {
+    const char* name;
+    const char* value;
+};
+
+constexpr attribute_example examples[] = {
+#define EXAMPLE(name, value) {name, value},
+#include "schema/attribute_examples.def"
+#undef EXAMPLE
+};
+
+constexpr std::string_view names[] = {
+#define ATTRIBUTE(name, ...) name,
+#include "attributes.def"
+#undef ATTRIBUTE
+};
+
+static_assert(std::all_of(std::begin(examples), std::end(examples), [](const attribute_example& e) {
+    return std::find(std::begin(names), std::end(names), e.name) != std::end(names);
+}));
 
 const syntax& syntax_of(const _AttrType& type) {
     const auto is_of_type = [&](const syntax& row) { return row.from_str == type.fromStr; };
@@ -131,13 +153,9 @@ std::string words_in_words(const _AttrType& type) {
     return names_schemes ? words + "; without a key also imask" : words;
 }
 
-/// A number of this greatest value is a port.
-constexpr int64_t greatest_port = 65535;
-
 std::string example_number(const _AttrType& type) {
     const value_bounds bounds = bounds_of(type);
-    const int64_t usual =
-        bounds.maximum == greatest_port ? 389 : std::stoll(syntax_of(type).example);
+    const int64_t usual = std::stoll(syntax_of(type).example);
     return std::to_string(std::clamp(usual, bounds.minimum, bounds.maximum));
 }
 
@@ -146,13 +164,18 @@ std::string example_mask(const _AttrType& type) {
     return std::to_string(usual != 0 ? usual : type.bitmask);
 }
 
-std::string example_text(const _AttrType& type) {
-    const value_bounds bounds = bounds_of(type);
-    std::string text = syntax_of(type).example;
-    text.resize(std::max(text.size(), static_cast<size_t>(bounds.minimum)), 'x');
-    text.resize(bounds.maximum == 0 ? text.size()
-                                    : std::min(text.size(), static_cast<size_t>(bounds.maximum)));
-    return text;
+std::string example_of_syntax(const _AttrType& type) {
+    switch (syntax_of(type).of) {
+        case kind::integer:
+        case kind::large:
+            return example_number(type);
+        case kind::mask:
+            return example_mask(type);
+        case kind::word:
+            return words_of(type).empty() ? "" : words_of(type).front();
+        default:
+            return syntax_of(type).example;
+    }
 }
 
 }  // namespace
@@ -219,22 +242,11 @@ std::string accepted_values(const _AttrType& type) {
 }
 
 std::string example_value(const _AttrType& type) {
-    switch (syntax_of(type).of) {
-        case kind::integer:
-        case kind::large:
-            return example_number(type);
-        case kind::mask:
-            return example_mask(type);
-        case kind::word:
-            return words_of(type).empty() ? "" : words_of(type).front();
-        case kind::text:
-            if (!words_of(type).empty() && type.fromStr != urlFromStr) {
-                return words_of(type).front();
-            }
-            return example_text(type);
-        default:
-            return syntax_of(type).example;
-    }
+    const auto is_of_type = [&](const attribute_example& each) {
+        return type.name && type.compare(each.name) == 0;
+    };
+    const auto found = std::find_if(std::begin(examples), std::end(examples), is_of_type);
+    return found == std::end(examples) ? example_of_syntax(type) : found->value;
 }
 
 }  // namespace cfg32::tool
