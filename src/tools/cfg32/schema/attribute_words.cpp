@@ -67,15 +67,31 @@ constexpr attribute_example examples[] = {
 #undef EXAMPLE
 };
 
-constexpr std::string_view names[] = {
+constexpr const char* names[] = {
 #define ATTRIBUTE(name, ...) name,
 #include "attributes.def"
 #undef ATTRIBUTE
 };
 
-static_assert(std::all_of(std::begin(examples), std::end(examples), [](const attribute_example& e) {
-    return std::find(std::begin(names), std::end(names), e.name) != std::end(names);
-}));
+constexpr bool is_in_table(const char* name) {
+    for (const char* known : names) {
+        if (__builtin_strcmp(known, name) == 0) {
+            return true;
+        }
+    }
+    return false;
+}
+
+constexpr bool are_in_table() {
+    for (const attribute_example& each : examples) {
+        if (!is_in_table(each.name)) {
+            return false;
+        }
+    }
+    return true;
+}
+
+static_assert(are_in_table());
 
 const syntax& syntax_of(const _AttrType& type) {
     const auto is_of_type = [&](const syntax& row) { return row.from_str == type.fromStr; };
