@@ -111,10 +111,14 @@ Twenty problems of many kinds are all found, at their places and in their order,
     $ tail -n 1 report
     12 errors, 8 warnings
 
-Neither the bytes nor the times of the file have changed:
+Neither the bytes nor the times of the file have changed, not even the time of the last access:
 
     $ ls --full-time twenty.conf > after; sha256sum twenty.conf >> after
     $ cmp before after
+    $ touch -a -d 2001-02-03 twenty.conf && cfg32 check twenty.conf > /dev/null
+    [1]
+    $ stat --format=%x twenty.conf | cut -c 1-10
+    2001-02-03
 
 The formats for programs say the same:
 
@@ -130,6 +134,8 @@ The formats for programs say the same:
     1
     $ /usr/bin/python3 show.py < json | diff list -
     $ cfg32 check --json twenty.conf | cmp json -
+    $ "$TOOLS/valid_json" check < json
+    valid
 
     $ cat > sarif.py <<'END'
     > import json, sys
@@ -203,6 +209,51 @@ No password is in any format:
     0
     [1]
 
+That holds of names that are mistyped, go on on the next line, or have bytes in them that a load
+does not see, and of what follows them; nor does a place tell how long a password is:
+
+    $ printf '%s\n' 'dn: cn=Configuration' 'oru-slapdAdmin_PW: sesame' 'oru-slapdAdmin PW: sesame' \
+    >     'userPassword: sesame' 'oru-slapdAdminPWsesame' 'oru-slapdAdm' ' inPW: sesame' \
+    >     'oru-slapdInvalidLine: oru-slapdAdm: inPW: sesame' $'\roru-slapdPeerPW sesame' \
+    >     $'oru-slapdP\xffeerPW: sesame' 'oru-slapdMasterPW: {imask}>sesame' \
+    >     'oru-slapdMasterPW:' ' ses' ' ame' > names.conf
+    $ printf 'oru-slapdProxy\0Pw: sesame\noru-slapdProxyPw: sesame' >> names.conf
+    $ for format in text json sarif github; do cfg32 check --format $format names.conf; done |
+    > grep -E '\<(ses|ame)\>|sesame'
+    [1]
+    $ cfg32 check names.conf | tail -n 7
+    names.conf:15:15: error: NUL: the rest of the line is not seen [nul-byte]
+       15 | oru-slapdProxy?Pw: ********
+          |               ^
+    names.conf:16:19: error: last line has no newline at its end: its value is not used [missing-final-newline]
+       16 | oru-slapdProxyPw: ********
+          |                   ^~~~~~~~
+    8 errors, 6 warnings
+    $ cfg32 check --json names.conf > short
+    [1]
+    $ sed -i 's/sesame/open sesame/; s/ame$/amen/' names.conf
+    $ cfg32 check --json names.conf | cmp short -
+    $ cfg32 -f names.conf search --json 2> /dev/null | grep -E -c '\<(ses|amen)\>|sesame'
+    0
+    [1]
+
+A file with the line ends of other systems is shown without them, and a byte order mark is told:
+
+    $ printf '\357\273\277version: 1\r\n\r\ndn: cn=Configuration\r\noru-slapdPort:\r\n  70000\r\n' > other.conf
+    $ cfg32 check other.conf
+    other.conf:1:1: error: byte order mark, which becomes part of the first name: remove it [byte-order-mark]
+        1 | ?version: 1
+          | ^
+          = accepted: UTF-8 without a byte order mark
+    other.conf:5:3: error: Integer value out of range [invalid-value]
+        5 |   70000
+          |   ^~~~~
+          = accepted: an integer from 1 to 65535
+    2 errors
+    [1]
+    $ cfg32 check --json other.conf | "$TOOLS/valid_json" check
+    valid
+
 With the key, stored passwords are tried:
 
     $ sed '/^oru-slapdPeerPW/s/AES256}E/AES256}X/' oruslapd.conf > damaged.conf
@@ -243,18 +294,23 @@ A file that its writer left unfinished, and the copy of one that did not get tha
     $ mkdir left && cp good.conf left && touch left/.cfg32-0123456789abcdef.tmp left/.cfg32-x.tmp
     $ cfg32 check left/good.conf
     left/good.conf:1:1: warning: left/.cfg32-0123456789abcdef.tmp was left by a program that was killed: unless a backup is being made now, remove it [leftover-copy]
-        1 | version: 1
-          | ^
     1 warning
     [1]
+
+It is found as well beside the file that a symbolic link names:
+
+    $ ln -s left/good.conf link.conf
+    $ cfg32 check link.conf | sed 's/warning: .*left/warning: LEFT/'
+    link.conf:1:1: warning: LEFTover-copy]
+    1 warning
 
 What can't be asked for:
 
     $ cfg32 check --format xml good.conf
     cfg32: --format: xml not in {text,json,sarif,github}
-      hint: x
+      hint: `cfg32 check --help` tells what there is
     [2]
     $ cfg32 check --format text --json good.conf
-    cfg32: --format excludes --json
-      hint: x
+    cfg32: --json excludes --format
+      hint: `cfg32 check --help` tells what there is
     [2]

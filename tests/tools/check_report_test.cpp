@@ -54,6 +54,8 @@ const excerpt_row excerpts[] = {
     {"oru-slapdAdminPW: secret", 25, 1, "oru-slapdAdminPW: ********", "                  ^~~~~~~~"},
     {"oru-slapdAdminPW: secret", 1, 16, "oru-slapdAdminPW: ********", "^~~~~~~~~~~~~~~~"},
     {"oru-slapdAdminPW secret", 1, 23, "oru-slapdAdminPW ********", "^~~~~~~~~~~~~~~~~~~~~~~~~"},
+    {"oru-slapdPort: 70000\r", 16, 5, "oru-slapdPort: 70000", "               ^~~~~"},
+    {"\ufeffcn: x", 1, 1, "?cn: x", "^"},
     {"oru-slapdAdminPW=secret", 1, 1, "oru-slapdAdminPW=********", "^"},
     {"oru-slapdAdminPW:: secret", 20, 6, "oru-slapdAdminPW:: ********",
      "                   ^~~~~~~~"},
@@ -86,6 +88,19 @@ TEST(SourceExcerpt, HidesAPasswordThatGoesOnOnTheNextLine) {
     EXPECT_EQ(excerpts.of(problem_at(5, 4, 1)).line, " ********");
     EXPECT_EQ(excerpts.of(problem_at(2, 2, 1)).line, " b");
     EXPECT_EQ(source_excerpts(file).of(problem_at(5, 4, 1)).line, " ********");
+}
+
+TEST(SourceExcerpt, HidesWhatFollowsANameThatGoesOnOnTheNextLine) {
+    const file_text file(
+        "oru-slapdAdm\n\r inPW: secret\n\roru-slapdPeerPW: secret\n# c\n cn: a\n"
+        " oru-slapdPeerPW secret\n   \n oru-slapdPeerPW secret\n");
+    source_excerpts excerpts(file);
+    EXPECT_EQ(excerpts.of(problem_at(1, 1, 1)).line, "oru-slapdAdm");
+    EXPECT_EQ(excerpts.of(problem_at(2, 3, 1)).line, " ********");
+    EXPECT_EQ(excerpts.of(problem_at(3, 1, 1)).line, "?oru-slapdPeerPW: ********");
+    EXPECT_EQ(excerpts.of(problem_at(5, 1, 1)).line, " cn: a") << "comments are not continued";
+    EXPECT_EQ(excerpts.of(problem_at(6, 1, 1)).line, " oru-slapdPeerPW secret")
+        << "the value of cn";
 }
 
 /// A file with two problems.
@@ -148,7 +163,7 @@ TEST(JsonReport, HoldsWhatIsKnown) {
     EXPECT_EQ(report["files"][1]["problems"], nlohmann::json::array());
     EXPECT_EQ(report["files"][0]["problems"][1], nlohmann::json::parse(R"({
         "rule": "invalid-value", "severity": "error", "consequence": "kept-aside",
-        "message": "Wrong", "line": 2, "column": 16, "width": 5,
+        "text": "Wrong", "line": 2, "column": 16, "width": 5,
         "entry": "cn=M\ufffdnchen", "attribute": "oru-slapdPort", "accepted": "an integer",
         "result": 21, "extended": 1015})"));
     EXPECT_EQ(nlohmann::json::parse(json_report({})), nlohmann::json::parse(R"({"files": []})"));

@@ -37,7 +37,22 @@ entry entry_of(CfgHandle* handle, CfgMessage* node) {
 }
 
 bool is_read_differently(const problem& found) {
-    return found.broken->outcome != consequence::none || found.first_left_out > 0;
+    return found.outcome() != consequence::none || found.first_left_out > 0;
+}
+
+/// What becomes of a line that is not used as it stands.
+const char* fate_of(const problem& found) {
+    if (found.broken == &kind::missing_final_newline) {
+        return "its value is not used";
+    }
+    switch (found.outcome()) {
+        case consequence::kept_aside:
+            return "kept as oru-slapdInvalidLine";
+        case consequence::loses_text:
+            return "cut off there";
+        default:
+            return "left out";
+    }
 }
 
 /// False when an entry has a DN that nobody could name it by.
@@ -54,7 +69,7 @@ bool is_printable(const LDIF_Entry& root) try {
 
 }  // namespace
 
-configuration::configuration(const settings& options, std::string file_name)
+configuration::configuration(const settings& options, const std::string& file_name)
     : configuration(options, file_name, read_configuration(file_name)) {}
 
 configuration::configuration(const settings& options, std::string file_name, std::string text)
@@ -71,6 +86,8 @@ configuration::configuration(const settings& options, std::string file_name, std
     } else if (copy_.text() != text_) {
         note_left_out();
         load(text_);
+    } else if (loses_text(text_)) {
+        note_left_out();
     }
 }
 
@@ -104,7 +121,14 @@ void configuration::bind(const char* dn, const char* password) {
 
 void configuration::note_left_out() {
     left_out_ = unused_lines(text_, key_.get());
-    tell_unused(name_, "read from a private copy, because not all of it can be used", left_out_);
+    if (!left_out_.empty()) {
+        tell_unused(name_, "read from a private copy, because not all of it can be used",
+                    left_out_);
+    }
+}
+
+bool loses_text(std::string_view text) {
+    return text.find('\0') != std::string_view::npos || (!text.empty() && text.back() != '\n');
 }
 
 std::vector<problem> unused_lines(std::string_view text, aes_key_data* key) {
@@ -117,9 +141,7 @@ void tell_unused(const std::string& name, std::string_view what,
                  const std::vector<problem>& unused) {
     std::string message = fmt::format("{}: {} (`cfg32 check` tells more):", name, what);
     for (const problem& found : unused) {
-        const bool is_kept = found.broken->outcome == consequence::kept_aside;
-        message += fmt::format("\n  line {}: {}, {}", found.line, found.text,
-                               is_kept ? "kept as oru-slapdInvalidLine" : "left out");
+        message += fmt::format("\n  line {}: {}, {}", found.line, found.text, fate_of(found));
     }
     complain(message);
 }

@@ -21,7 +21,7 @@ namespace cfg32::tool {
 class configuration {
   public:
     /// Any file, bound to anonymously. Ends the command when it can't be read.
-    configuration(const settings& options, std::string file_name);
+    configuration(const settings& options, const std::string& file_name);
     /// The file that the options name, bound to with their credentials.
     explicit configuration(const settings& options);
     /// A text that was read already, of the file of that name.
@@ -55,6 +55,9 @@ class configuration {
     std::unique_ptr<CfgHandle, int (*)(CfgHandle*)> handle_;
     std::vector<problem> left_out_;
 };
+
+/// True when a load may not see all of a text, although it takes it as it is.
+bool loses_text(std::string_view text);
 
 /// The lines of a text that a load does not use, or not as they stand.
 std::vector<problem> unused_lines(std::string_view text, aes_key_data* key);

@@ -62,7 +62,7 @@ edited_text::findings edited_text::check(const std::string& draft, aes_key_data*
         if (line >= 1 && line <= lines) {
             each.line = line;
             found.in_draft.push_back(std::move(each));
-        } else if (is_new || each.broken->outcome == consequence::stops_load) {
+        } else if (is_new || each.outcome() == consequence::stops_load) {
             found.elsewhere.push_back(std::move(each));
         }
     }

@@ -3,6 +3,8 @@
 #include "hidden_passwords.h"
 
 #include <algorithm>
+#include <optional>
+#include <vector>
 
 #include "LDIF_AttrType.h"
 #include "LDIF_Util.h"
@@ -20,31 +22,214 @@ constexpr int clear_text = 1;  // answer of check_format
 
 const cisString kept_line_attribute = "oru-slapdInvalidLine";
 
+/// What people put between a name and a value.
+constexpr std::string_view separators = ":;,=< \t\v\f";
+
+/// What names of passwords have in them; of those that begin alike the longest first.
+constexpr std::string_view marks[] = {"password", "passwort", "passphrase", "passwd",
+                                      "pass",     "pwd",      "pw",         "secret"};
+
 /// What hides a password says how it is stored: an encrypted or hashed text hides itself.
 std::string shown_password(const std::string& stored) {
-    if (stored.empty()) {
-        return {};
-    }
-    const std::string encoded = decoder_input(stored);
-    if (check_format(encoded.c_str(), static_cast<int>(encoded.size())) == clear_text) {
-        return std::string(hidden_text);
-    }
-    const bool is_masked = encoded.starts_with(std::string(iMASK_BRACED, sizeof iMASK_BRACED));
-    return is_masked ? std::string(hidden_text) : stored;
+    const cisString tag = stored.substr(0, sizeof iMASK_BRACED);
+    const bool is_masked = tag == std::string(iMASK_BRACED, sizeof iMASK_BRACED);
+    const bool hides_itself =
+        stored.starts_with('{') && !is_masked &&
+        check_format(stored.c_str(), static_cast<int>(stored.size())) != clear_text;
+    return stored.empty() || hides_itself ? stored : std::string(hidden_text);
 }
 
-/// Name and value as they are meant, whatever stands between them.
+std::string lower(std::string_view text) {
+    std::string small(text);
+    std::transform(small.begin(), small.end(), small.begin(),
+                   [](char c) { return c >= 'A' && c <= 'Z' ? static_cast<char>(c | 0x20) : c; });
+    return small;
+}
+
+/// The part of a text behind the first mark of a password; none without one.
+std::optional<size_t> end_of_mark(std::string_view small) {
+    size_t begin = std::string_view::npos;
+    size_t end = 0;
+    for (const std::string_view mark : marks) {
+        const size_t found = small.find(mark);
+        if (found < begin) {
+            begin = found;
+            end = found + mark.size();
+        }
+    }
+    return begin == std::string_view::npos ? std::nullopt : std::optional(end);
+}
+
+/// What tells the names of the table's passwords apart, in lower case.
+const std::vector<std::string>& known_passwords() {
+    static const std::vector<std::string> all = [] {
+        constexpr std::string_view beginning = "oru-slapd";
+        std::vector<std::string> names;
+        for (const _AttrType* row : all_attributes()) {
+            if (is_password_attribute(row->name)) {
+                names.push_back(lower(row->name).substr(beginning.size()));
+            }
+        }
+        return names;
+    }();
+    return all;
+}
+
+/// Rather true than false: what is no attribute's name may be meant for a password's.
+bool is_password_name(std::string_view name) {
+    if (name.empty() || find_attribute(name)) {
+        return is_password_attribute(name);
+    }
+    const std::vector<std::string_view> near = near_attributes(name);
+    return end_of_mark(lower(name)) || std::any_of(near.begin(), near.end(), is_password_attribute);
+}
+
+/// How much of a password's name is one: the password may follow it without a separator.
+size_t length_of_name(std::string_view name) {
+    const std::string small = lower(name);
+    for (const std::string& known : known_passwords()) {
+        const size_t found = small.find(known);
+        if (found != std::string::npos) {
+            return found + known.size();
+        }
+    }
+    return nearest_attribute(name) ? name.size() : end_of_mark(small).value_or(name.size());
+}
+
+/// A line as it is meant.
 struct meant_line {
-    std::string_view name;
-    size_t value;  // where it begins
+    enum { other, kept, known_password, password } what = other;
+    size_t value = 0;  // where it begins
 };
 
-meant_line meant(std::string_view line) {
-    const std::string_view text = line.substr(leading_space(line));
-    const std::string_view name = text.substr(0, text.find_first_not_of(keyChar));
-    const size_t end = line.size() - text.size() + name.size();
-    return {name, std::min(line.find_first_not_of(":;,=< \t", end), line.size())};
+size_t behind_separators(std::string_view text, size_t begin) {
+    return std::min(text.find_first_not_of(separators, begin), text.size());
 }
+
+/// Where a name may end, each told from the line's front.
+struct line_parts {
+    explicit line_parts(std::string_view text)
+        : begin(behind_separators(text, leading_space(text))),
+          line(text.substr(begin)),
+          word(line.substr(0, line.find_first_of(separators))),
+          run(line.substr(0, line.find_first_not_of(keyChar))),
+          has_colon(line.find(':') != std::string_view::npos),
+          name(without_trailing_space(line.substr(0, line.find(':')))) {}
+
+    size_t begin;           // of what follows, in the text
+    std::string_view line;  // without blanks and separators at its front
+    std::string_view word;  // its beginning, up to a blank or separator
+    std::string_view run;   // its beginning, up to what no name has
+    bool has_colon;
+    std::string_view name;  // before the colon; the whole line without one
+};
+
+meant_line meant(std::string_view text) {
+    const line_parts parts(text);
+    const auto behind = [&](size_t length) {
+        return behind_separators(text, parts.begin + length);
+    };
+    if (cisString(std::string(parts.word)) == kept_line_attribute) {
+        return {meant_line::kept, behind(parts.word.size())};
+    }
+    if (is_password_attribute(parts.run)) {
+        return {parts.word == parts.run ? meant_line::known_password : meant_line::password,
+                behind(parts.run.size())};
+    }
+    const bool is_other = find_attribute(parts.word) != nullptr;
+    if (!is_other && (is_password_name(parts.word) || is_password_name(parts.run))) {
+        return {meant_line::password, behind(length_of_name(parts.word))};
+    }
+    const bool is_named = parts.has_colon ? is_password_name(parts.name)
+                                          : !is_other && end_of_mark(lower(parts.line));
+    return {is_named ? meant_line::password : meant_line::other, behind(parts.word.size())};
+}
+
+/// What follows the sign of a comment counts as a line; without a colon it is prose, in which no
+/// more than the first word does.
+meant_line meant_in_comment(std::string_view text) {
+    const std::string_view line =
+        text.substr(std::min(text.find_first_not_of("# \t"), text.size()));
+    const line_parts parts(line);
+    if (!parts.has_colon && !is_password_name(parts.word)) {
+        return {};
+    }
+    meant_line found = meant(line);
+    found.value += text.size() - line.size();
+    return found;
+}
+
+meant_line meant_in_line(std::string_view text) {
+    const bool is_comment = text.substr(leading_space(text)).starts_with('#');
+    return is_comment ? meant_in_comment(text) : meant(text);
+}
+
+/// Where what is to be hidden begins.
+std::optional<size_t> hidden_from(std::string_view text);
+
+/// The same of a line that was kept. A name that went on on the next line stands there with a colon
+/// where the line ended.
+std::optional<size_t> hidden_from_kept(std::string_view kept) {
+    if (const auto begin = hidden_from(kept)) {
+        return begin;
+    }
+    constexpr std::string_view inserted = ": ";
+    const size_t end = kept.find(inserted);
+    if (end == std::string_view::npos || find_attribute(kept.substr(0, end))) {
+        return {};
+    }
+    const size_t next = end + inserted.size();
+    const std::string joined = std::string(kept.substr(0, end)).append(kept.substr(next));
+    return hidden_from(joined) ? std::optional(next) : std::nullopt;
+}
+
+std::optional<size_t> hidden_from(std::string_view text) {
+    const meant_line line = meant_in_line(text);
+    if (line.what == meant_line::other || line.value == text.size()) {
+        return {};
+    }
+    const std::string value(text.substr(line.value));
+    if (line.what == meant_line::kept) {
+        const auto begin = hidden_from_kept(value);
+        return begin ? std::optional(line.value + *begin) : std::nullopt;
+    }
+    const bool is_visible =
+        line.what == meant_line::known_password && shown_password(value) == value;
+    return is_visible ? std::nullopt : std::optional(line.value);
+}
+
+/// A line without what makes no difference to a reader: carriage returns, NULs, bytes that are no
+/// characters.
+class judged_line {
+  public:
+    explicit judged_line(std::string_view line) : is_same_(is_clean(line)), text_(line) {
+        if (is_same_) {
+            return;
+        }
+        text_.clear();
+        const char* const front = line.data();
+        for (; !line.empty(); line.remove_prefix(first_character(line).bytes.size())) {
+            const character next = first_character(line);
+            if (next.is_valid && next.code != L'\r' && next.code != L'\0') {
+                text_ += next.bytes;
+                places_.resize(text_.size(), static_cast<size_t>(next.bytes.data() - front));
+            }
+        }
+    }
+
+    const std::string& text() const { return text_; }
+    /// Where a byte of the text stands in the line.
+    size_t place(size_t at) const { return is_same_ ? at : places_[at]; }
+
+  private:
+    static bool is_clean(std::string_view line) {
+        return is_plain(line) && line.find('\r') == std::string_view::npos;
+    }
+
+    bool is_same_;
+    std::string text_;
+    std::vector<size_t> places_;
+};
 
 }  // namespace
 
@@ -56,33 +241,26 @@ std::string shown_value(std::string_view attribute, std::string_view value) {
     if (is_password_attribute(attribute)) {
         return shown_password(std::string(value));
     }
-    const bool is_kept_line = cisString(std::string(attribute)) == kept_line_attribute;
-    return is_kept_line ? shown_line(value) : std::string(value);
+    if (cisString(std::string(attribute)) == kept_line_attribute) {
+        const judged_line judged(value);
+        const auto begin = hidden_from_kept(judged.text());
+        return begin ? std::string(value.substr(0, judged.place(*begin))).append(hidden_text)
+                     : std::string(value);
+    }
+    const bool is_hidden = !value.empty() && is_password_line(std::string(attribute) + ":");
+    return std::string(is_hidden ? hidden_text : value);
 }
 
 bool is_password_line(std::string_view line) {
-    const std::string_view name = meant(line).name;
-    if (name.empty() || find_attribute(name)) {
-        return is_password_attribute(name);
-    }
-    const auto nearest = nearest_attribute(name);
-    return nearest && is_password_attribute(*nearest);
+    const auto what = meant_in_line(judged_line(line).text()).what;
+    return what == meant_line::password || what == meant_line::known_password;
 }
 
 std::string shown_line(std::string_view line) {
-    const auto [name, begin] = meant(line);
-    if (begin == line.size()) {
-        return std::string(line);
-    }
-    const std::string front(line.substr(0, begin));
-    const std::string_view value = line.substr(begin);
-    if (cisString(std::string(name)) == kept_line_attribute) {
-        return front + shown_line(value);
-    }
-    if (!is_password_line(line)) {
-        return std::string(line);
-    }
-    return front + (find_attribute(name) ? shown_value(name, value) : std::string(hidden_text));
+    const judged_line judged(line);
+    const auto begin = hidden_from(judged.text());
+    return begin ? std::string(line.substr(0, judged.place(*begin))).append(hidden_text)
+                 : std::string(line);
 }
 
 }  // namespace cfg32::tool

@@ -14,12 +14,13 @@ inline constexpr std::string_view hidden_text = "********";
 /// True for the attributes whose values are passwords.
 bool is_password_attribute(std::string_view name);
 
-/// A value as people and programs may see it.
+/// A value as people and programs may see it. Like a line's, it is hidden as well where the name
+/// looks like a password's and the table does not know it as another attribute.
 std::string shown_value(std::string_view attribute, std::string_view value);
 
 /// A line of a file, or the name at its front, as it may be seen: what follows the name of a
-/// password is hidden, also where the name is mistyped, the colon is missing, or the line is one
-/// that was kept because it can't be used. Only the end of the line differs.
+/// password is hidden, also where the name is mistyped, the colon is missing, the line is a
+/// comment, or one that was kept because it can't be used. Only the end of the line differs.
 std::string shown_line(std::string_view line);
 
 /// True when all that follows this line's name is a password.

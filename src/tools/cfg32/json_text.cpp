@@ -16,7 +16,7 @@ json json_of(const entry& printed) {
         for (const std::string& value : each.values) {
             values.push_back(utf8(shown_value(each.name, value)));
         }
-        attributes[utf8(each.name)] = std::move(values);
+        attributes[utf8(shown_line(each.name))] = std::move(values);
     }
     return {{"dn", utf8(printed.dn)}, {"attributes", std::move(attributes)}};
 }

@@ -30,7 +30,7 @@ private_folder::~private_folder() {
 }
 
 std::string private_folder::write(const std::string& name, std::string_view text) const {
-    const std::string path = (path_ / name).string();
+    std::string path = (path_ / name).string();
     unique_fd file(open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, of_owner_only));
     if (!file || !replace_content(file.get(), text) || !file.close()) {
         fail_for_system(path, errno);

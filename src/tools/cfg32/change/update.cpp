@@ -115,8 +115,10 @@ void updater::load() {
 
 /// The change kept aside, or lost, what could not be used.
 void updater::tell_unused_lines() {
-    const std::vector<problem> unused =
-        is_repaired_ ? unused_lines(result_.before, key_.get()) : std::vector<problem>();
+    if (!is_repaired_ && !loses_text(result_.before)) {
+        return;
+    }
+    const std::vector<problem> unused = unused_lines(result_.before, key_.get());
     if (!unused.empty()) {
         tell_unused(name(), "not all of it could be used", unused);
     }

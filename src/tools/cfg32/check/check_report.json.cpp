@@ -11,6 +11,8 @@ namespace {
 
 const char* name_of(consequence outcome) {
     switch (outcome) {
+        case consequence::loses_text:
+            return "loses-text";
         case consequence::kept_aside:
             return "kept-aside";
         case consequence::stops_load:
@@ -24,7 +26,7 @@ const char* name_of(consequence outcome) {
 json described(const problem& each) {
     json object = {{"rule", each.broken->id},
                    {"severity", severity_name(each.broken->grade)},
-                   {"consequence", name_of(each.broken->outcome)},
+                   {"consequence", name_of(each.outcome())},
                    {"text", utf8(each.text)},
                    {"line", each.line},
                    {"column", each.column},

@@ -29,7 +29,9 @@ std::string body(const file_text& file, source_excerpts& excerpts, const problem
     const std::string number = fmt::format("{:>{}}", each.line, number_width);
     const std::string margin(number.size(), ' ');
     std::string text;
-    if (each.line <= file.line_count()) {
+    // The text of that line would have nothing to do with it.
+    const bool is_elsewhere = each.broken == &kind::leftover_copy;
+    if (each.line <= file.line_count() && !is_elsewhere) {
         const source_excerpt shown = excerpts.of(each);
         text += fmt::format("{} | {}\n", number, shown.line);
         text += fmt::format("{} | {}{}\n", margin, shown.indent,

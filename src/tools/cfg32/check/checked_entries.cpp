@@ -65,8 +65,6 @@ void checked_entries::report_second_value(const LDIF_Attribute& attribute, int l
     found.entry = entry;
     found.attribute = name;
     found.accepted = "one value";
-    found.result = 19;
-    found.extended = 1006;
 }
 
 int checked_entries::line_of(const LDIF_Value& value) const {
@@ -97,13 +95,13 @@ void checked_entries::close(entry_section&& section) {
                                 section.written,
                                 section.where,
                                 std::move(section.attributes),
-                                {{section.where, section.last}}});
+                                {{section.where, section.first, section.last}}});
             by_dn_.emplace(section.dn.hash(), &entries_.back());
         }
     }
     is_rewritten_ |= section.has_kept_line && !section.is_left_out;
     for (problem* each : section.stopping) {
-        each->first_left_out = section.where.line;
+        each->first_left_out = section.first;
         each->last_left_out = section.last;
     }
 }
@@ -124,23 +122,22 @@ void checked_entries::merge(checked_entry& known, entry_section& section) {
             found_.add(kind::unmergeable_entry, section.where,
                        fmt::format("entry stands twice, the first one on line {}, and the values "
                                    "of {} can't be compared{}",
-                                   known.where.line, e.attribute,
+                                   known.sections.front().first, e.attribute,
                                    is_password_attribute(e.attribute) ? " without the key" : ""));
         found.entry = section.written;
         found.attribute = e.attribute;
-        found.result = e.ldapErr;
-        found.extended = e.extErr;
+        take_codes(found, e);
         section.stopping.push_back(&found);
         section.is_left_out = true;
         return;
     }
-    known.sections.emplace_back(section.where, section.last);
+    known.sections.push_back({section.where, section.first, section.last});
     if (is_entry) {
         found_
             .add(kind::duplicate_entry, section.where,
                  fmt::format("entry stands twice, the first one on line {}; the next rewrite "
                              "merges them",
-                             known.where.line))
+                             known.sections.front().first))
             .entry = section.written;
     }
 }
@@ -176,19 +173,26 @@ void checked_entries::finish() {
 /// Below the nearest ancestor that is there, the others are missing. Where none is there, the entry
 /// is the topmost of its tree.
 void checked_entries::check_ancestors(const checked_entry& entry) {
+    constexpr int named = 3;
     std::string missing;
+    int count = 0;
     LDIF_DN ancestor = entry.dn;
     while (ancestor.rdns().size() > 1) {
         ancestor.remove_leaf();
         if (find(ancestor)) {
             break;
         }
-        missing.append(missing.empty() ? "" : " and ").append(in_quotes(shown(ancestor)));
+        if (++count <= named) {
+            missing.append(missing.empty() ? "" : " and ").append(in_quotes(shown(ancestor)));
+        }
         if (ancestor.rdns().size() == 1) {
             return;
         }
     }
-    if (!missing.empty()) {
+    if (count > named) {
+        missing += fmt::format(" and {} more", count - named);
+    }
+    if (count > 0) {
         found_.add(kind::missing_ancestor, entry.where, "no entry " + missing + " above this one")
             .entry = entry.written;
     }
@@ -200,8 +204,8 @@ void checked_entries::check_writing(const checked_entry& entry) {
     if (reason.empty()) {
         return;
     }
-    for (const auto& [where, last] : entry.sections) {
-        if (where.line == 0) {
+    for (const auto& [where, first, last] : entry.sections) {
+        if (first == 0) {
             continue;  // version and charset
         }
         if (!is_rewritten_ && entry.dn.empty()) {
@@ -218,13 +222,8 @@ void checked_entries::check_writing(const checked_entry& entry) {
                              "written: " +
                                  reason);
         found.entry = entry.written;
-        found.result = 21;
-        found.extended = 1005;
-        found.first_left_out = where.line;
+        found.first_left_out = first;
         found.last_left_out = last;
-        if (!is_rewritten_) {
-            return;
-        }
     }
 }
 

@@ -5,7 +5,6 @@
 #include <deque>
 #include <string>
 #include <unordered_map>
-#include <utility>
 #include <vector>
 
 #include "LDIF_Attribute.h"
@@ -19,6 +18,7 @@ struct entry_section {
     LDIF_DN dn;
     std::string written;  ///< the DN as it is written
     place where{};        ///< of the DN
+    int first = 0;        ///< the DN line
     int last = 0;         ///< line of the last attribute
     LDIF_Attributes attributes;
     bool is_left_out = false;
@@ -49,7 +49,12 @@ class checked_entries {
         std::string written;
         place where;
         LDIF_Attributes attributes;
-        std::vector<std::pair<place, int>> sections;  // DN and last line
+        struct lines {
+            place where;  // of the DN
+            int first;
+            int last;
+        };
+        std::vector<lines> sections;
     };
 
     checked_entry* find(const LDIF_DN& dn);

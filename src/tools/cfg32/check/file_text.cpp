@@ -13,6 +13,11 @@ namespace {
 /// What a load sees of a line: all before a NUL.
 std::string_view seen(std::string_view line) { return line.substr(0, line.find('\0')); }
 
+/// Carriage returns are not seen, neither at a line's front.
+std::string_view without_leading_returns(std::string_view line) {
+    return line.substr(std::min(line.find_first_not_of('\r'), line.size()));
+}
+
 /// Where the value begins in a line, as a load finds it: it does not see carriage returns.
 size_t value_begin(std::string_view line) {
     const size_t colon = line.find(':');
@@ -68,6 +73,32 @@ file_text::file_text(std::string_view text) : text_(text) {
             replace_invalid_bytes(number);
         }
     }
+    find_beginnings();
+}
+
+/// Comments and blank lines are not continued.
+void file_text::find_beginnings() {
+    bool is_open = false;
+    for (int number = 1; number <= line_count(); ++number) {
+        const std::string_view line = without_leading_returns(seen(this->line(number)));
+        const size_t blanks = leading_space(line);
+        if (is_open && blanks > 0) {
+            beginnings_.push_back(beginnings_.back());
+        } else {
+            beginnings_.push_back(number);
+            is_open = blanks < line.size() && !line.starts_with('#');
+        }
+    }
+}
+
+int file_text::beginning_of(int number) const {
+    const bool is_there = number >= 1 && number <= line_count();
+    return is_there ? beginnings_[static_cast<size_t>(number) - 1] : number;
+}
+
+std::string_view file_text::continuation(int number) const {
+    const std::string_view line = without_leading_returns(seen(this->line(number)));
+    return line.empty() ? line : line.substr(first_character(line).bytes.size());
 }
 
 std::string_view file_text::line(int number) const {
@@ -109,18 +140,34 @@ place file_text::name_place(int number) const {
 }
 
 place file_text::value_place(int number) const {
-    const std::string_view text = seen(line(number));
-    const size_t begin = value_begin(text);
-    return of_part(number, text, begin, without_trailing_blanks(text.substr(begin)));
+    std::string_view text = seen(line(number));
+    std::string_view value = without_trailing_blanks(text.substr(value_begin(text)));
+    const place nothing = of_part(number, text, value_begin(text), value);
+    while (value.empty()) {
+        if (!is_continuation(++number)) {
+            return nothing;
+        }
+        text = seen(line(number));
+        value = without_trailing_blanks(text.substr(leading_space(text)));
+    }
+    return of_part(number, text, static_cast<size_t>(value.data() - text.data()), value);
 }
 
 place file_text::value_place(int number, size_t offset) const {
-    const std::string_view text = seen(line(number));
+    const place whole = value_place(number);
+    std::string_view text = seen(line(number));
     size_t at = value_begin(text);
-    for (; offset > 0 && at < text.size(); ++at) {
-        offset -= text[at] == '\r' ? 0 : 1;
+    while (true) {
+        for (; offset > 0 && at < text.size(); ++at) {
+            offset -= text[at] == '\r' ? 0 : 1;
+        }
+        const bool is_last = !is_continuation(number + 1);
+        if (at < text.size() || is_last) {
+            return offset > 0 ? whole : of_part(number, text, at, {});
+        }
+        text = seen(line(++number));
+        at = static_cast<size_t>(continuation(number).data() - text.data());
     }
-    return offset > 0 ? value_place(number) : of_part(number, text, at, {});
 }
 
 }  // namespace cfg32::tool

@@ -32,6 +32,11 @@ class file_text {
     std::string_view line(int number) const;
     std::string_view text() const { return text_; }
 
+    /// The first line of the logical line that this line belongs to, as a load puts them together.
+    int beginning_of(int number) const;
+    /// What a continuation line adds.
+    std::string_view continuation(int number) const;
+
     /// The same text in which every byte that is not of the locale's character set is a "?".
     std::string_view readable() const { return readable_.empty() ? text_ : readable_; }
     /// The lines where there are such bytes before the NUL that may end the line.
@@ -39,18 +44,21 @@ class file_text {
 
     /// The name at the front of an attribute or DN line, or the whole of a line without a colon.
     place name_place(int number) const;
-    /// The value behind it, as far as it stands on this line; behind the line's end for none.
+    /// The value behind it, as far as it stands on this line or, where nothing does, on the first
+    /// of its continuation lines that has some of it; behind the line's end for none.
     place value_place(int number) const;
-    /// The character that stands so many bytes into the value; the whole value when it does not
-    /// stand on this line.
+    /// The character that stands so many bytes into the value.
     place value_place(int number, size_t offset) const;
 
   private:
     void replace_invalid_bytes(int number);
+    void find_beginnings();
+    bool is_continuation(int number) const { return beginning_of(number) < number; }
 
     std::string_view text_;
     std::vector<size_t> begins_;
-    std::string readable_;  // empty when nothing is invalid
+    std::vector<int> beginnings_;  // of the logical lines, by the numbers of the physical ones
+    std::string readable_;         // empty when nothing is invalid
     std::vector<place> invalid_bytes_;
 };
 

@@ -10,13 +10,19 @@
 namespace cfg32::tool {
 
 const std::vector<const rule*> rules = {
-#define RULE(name, id, grade, outcome, summary) &kind::name,
+#define RULE(name, ...) &kind::name,
 #include "check/problem_rules.def"
 #undef RULE
 };
 
 size_t index_of(const rule& wanted) {
     return static_cast<size_t>(std::find(rules.begin(), rules.end(), &wanted) - rules.begin());
+}
+
+bool can_be_loaded(const std::vector<problem>& problems) {
+    return std::none_of(problems.begin(), problems.end(), [](const problem& each) {
+        return each.outcome() == consequence::stops_load;
+    });
 }
 
 std::string loadable_part(std::string_view text, const std::vector<problem>& problems) {
@@ -27,6 +33,9 @@ std::string loadable_part(std::string_view text, const std::vector<problem>& pro
         }
     }
     std::sort(left_out.begin(), left_out.end());
+    while (text.starts_with(byte_order_mark)) {
+        text.remove_prefix(byte_order_mark.size());
+    }
     std::string part;
     int skipped_to = 0;
     auto range = left_out.begin();
@@ -45,12 +54,6 @@ std::string loadable_part(std::string_view text, const std::vector<problem>& pro
         part.erase(0, unfinished_mark.size());
     }
     return part;
-}
-
-bool can_be_loaded(const std::vector<problem>& problems) {
-    return std::none_of(problems.begin(), problems.end(), [](const problem& each) {
-        return each.broken->outcome == consequence::stops_load;
-    });
 }
 
 }  // namespace cfg32::tool

@@ -2,6 +2,7 @@
 
 // What can be wrong with a configuration file.
 
+#include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -15,6 +16,7 @@ enum class severity { error, warning };
 /// What a load makes of a problem.
 enum class consequence {
     none,        ///< nothing
+    loses_text,  ///< part of the line is not seen
     kept_aside,  ///< the line becomes an oru-slapdInvalidLine attribute, and the file is rewritten
     stops_load   ///< no load until it is mended
 };
@@ -24,6 +26,8 @@ struct rule {
     const char* id;  ///< as it is printed in brackets: lower case, words joined by "-"
     severity grade;
     consequence outcome;
+    int result;           ///< LDAP result code that a load or a change usually gives, 0 for none
+    int extended;         ///< extended code, 0 for none
     const char* summary;  ///< what is wrong, for lists of rules
 };
 
@@ -39,16 +43,21 @@ struct problem {
     std::string accepted;   ///< what would be accepted instead, in words, or empty
     int result = 0;         ///< LDAP result code that a load or a change would give, 0 for none
     int extended = 0;       ///< extended code, 0 for none
+    std::optional<consequence> own_outcome = {};  ///< where it is not that of the rule
     // The lines that have to be left out for a load, and then a write, to succeed (both included),
     // 0 if none.
     int first_left_out = 0;
     int last_left_out = 0;
+
+    /// What a load makes of it.
+    consequence outcome() const { return own_outcome.value_or(broken->outcome); }
 };
 
 /// The rules by name.
 namespace kind {
-#define RULE(name, id, grade, outcome, summary) \
-    inline constexpr rule name = {id, severity::grade, consequence::outcome, summary};
+#define RULE(name, id, grade, outcome, result, extended, summary)                \
+    inline constexpr rule name = {id,     severity::grade, consequence::outcome, \
+                                  result, extended,        summary};
 #include "check/problem_rules.def"
 #undef RULE
 }  // namespace kind
@@ -63,10 +72,14 @@ size_t index_of(const rule& wanted);
 /// passwords are tried as well.
 std::vector<problem> find_problems(std::string_view text, aes_key_data* key);
 
-/// True when none of the problems stops a load.
+/// True when a load of the file succeeds.
 bool can_be_loaded(const std::vector<problem>& problems);
 
-/// The text without the lines that a load would stop at, so that it can be read.
+/// The byte order mark of UTF-8, with which some editors begin a file.
+inline constexpr std::string_view byte_order_mark = "\xef\xbb\xbf";
+
+/// The text without the lines that a load would stop at and without entries that can't be printed,
+/// so that it can be read.
 std::string loadable_part(std::string_view text, const std::vector<problem>& problems);
 
 }  // namespace cfg32::tool

@@ -2,6 +2,7 @@
 
 #include <fmt/format.h>
 
+#include <algorithm>
 #include <cerrno>
 
 #include "LDIF_File.h"
@@ -24,13 +25,12 @@ void problem_finder::attribute_line() {
     if (open_) {
         open_->last = last_;
     }
-    if (is_unreadable()) {
-        return;
-    }
+    const bool is_readable = !is_unreadable();
     check_spelling();
+    if (!is_readable) {
+        return check_unreadable_value();
+    }
     if (!line_.hasSeparator) {
-        add(kind::missing_separator, name_place(), "no colon after the attribute's name").accepted =
-            "name: value";
         return keep_aside();
     }
     try {
@@ -47,6 +47,8 @@ void problem_finder::attribute_line() {
 /// What can be said of a line without its value.
 void problem_finder::check_spelling() {
     if (!line_.hasSeparator) {
+        add(kind::missing_separator, name_place(), "no colon after the attribute's name").accepted =
+            "name: value";
         return;
     }
     check_literal();
@@ -58,20 +60,41 @@ void problem_finder::check_spelling() {
     }
 }
 
+/// Whatever the bytes are that can't be read: as many others of no meaning are no better in their
+/// place. A load does not come so far.
+void problem_finder::check_unreadable_value() {
+    if (!line_.hasSeparator) {
+        return;
+    }
+    try {
+        LDIF_Attribute(key_, line_, {});
+    } catch (const LDIF_Exception& e) {
+        if (e.sysErrno == ENOMEM) {
+            throw;
+        }
+        report_refused(e);
+    }
+}
+
 /// Other readers of LDIF would decode the value, or fetch it.
 void problem_finder::check_literal() {
     const std::string_view line = file_.line(line_.lineNumber);
     const size_t colon = line.find(':');
     const bool is_marked = line_.hasSeparator && !line_.value.empty() && colon + 1 < line.size() &&
                            (line[colon + 1] == ':' || line[colon + 1] == '<');
-    if (is_marked) {
-        add(kind::literal_base64, value_place(),
-            line[colon + 1] == ':' ? "\"::\" is not understood: the value is taken as it stands, "
-                                     "not as base64"
-                                   : "\":<\" is not understood: the value is taken as it stands, "
-                                     "not as a reference")
-            .accepted = "name: value";
+    if (!is_marked) {
+        return;
     }
+    std::string text =
+        "\":<\" is not understood: the value is taken as it stands, not as a reference";
+    if (line[colon + 1] == ':') {
+        const size_t end = std::min(line.find_first_not_of(':', colon), line.size());
+        const std::string_view colons = line.substr(colon, end - colon);
+        text = fmt::format("\"{}\" is not understood: the value {}, not {}base64", colons,
+                           colons.size() == 2 ? "is taken as it stands" : "is what follows them",
+                           colons.size() == 2 ? "as " : "");
+    }
+    add(kind::literal_base64, value_place(), text).accepted = "name: value";
 }
 
 void problem_finder::check_unknown_name() {
@@ -145,8 +168,6 @@ void problem_finder::repeated_header(const LDIF_Attribute& attribute) {
                                     attribute.name().text(), first)
                       : fmt::format("a {} line stands above the first entry or not at all",
                                     attribute.name().text()));
-    found.result = 19;
-    found.extended = 1006;
     found.first_left_out = line_.lineNumber;
     found.last_left_out = last_;
 }
@@ -155,8 +176,6 @@ void problem_finder::add_to_run() {
     if (!run_) {
         run_ = &add(kind::attribute_outside, name_place(), "");
         run_->attribute.clear();
-        run_->result = 65;
-        run_->extended = 1007;
         run_->first_left_out = line_.lineNumber;
     }
     ++run_lines_;
@@ -183,8 +202,7 @@ void problem_finder::check_value(const LDIF_Value& value) {
     }
     if (key_ && is_password_attribute(line_.attribute) && !is_decodable(line_.value, key_)) {
         add(kind::undecodable_password, value_place(),
-            "stored password can't be decoded with this key")
-            .result = 84;
+            "stored password can't be decoded with this key");
     }
 }
 

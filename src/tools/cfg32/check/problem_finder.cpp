@@ -7,6 +7,7 @@
 #include "LDIF_File.h"
 #include "LDIF_Util.h"
 #include "check/dn_findings.h"
+#include "check/shown_lines.h"
 #include "hidden_passwords.h"
 #include "line_source.h"
 #include "outcome.h"
@@ -21,19 +22,12 @@ bool begins_with_blank(const LDIF_Line& line) {
 
 }  // namespace
 
-void take_codes(problem& found, const LDIF_Exception& e) {
-    found.result = e.ldapErr;
-    found.extended = e.extErr;
-}
-
 std::vector<problem> problem_finder::run() {
     if (file_.text().starts_with(unfinished_mark)) {
         problem& found = found_.add(kind::unfinished_write, {1, 1, file_.name_place(1).width},
                                     "file was not written to its end: restore the backup, which is "
                                     "the complete version");
         found.first_left_out = found.last_left_out = 1;
-        found.result = 80;
-        found.extended = 1002;
     }
     check_bytes();
     line_source source(file_.readable());
@@ -41,8 +35,11 @@ std::vector<problem> problem_finder::run() {
         last_ = line_.next(source, last_);
         follow();
     } while (line_.type != LDIF_Line::endOfFile);
-    check_final_newline();
     entries_.finish();
+    shown_lines lines(file_);
+    for (problem& found : found_.all()) {
+        lines.hide_length(found);
+    }
     return found_.sorted();
 }
 
@@ -52,7 +49,6 @@ void problem_finder::check_bytes() {
                                     "bytes that are no character in this locale; a file with other "
                                     "than ASCII text needs the locale it was written in");
         found.first_left_out = found.last_left_out = where.line;
-        found.result = found.extended = 162;
         unreadable_[where.line] = &found;
     }
     const std::string_view text = file_.text();
@@ -70,9 +66,6 @@ void problem_finder::check_bytes() {
 }
 
 void problem_finder::follow() {
-    if (line_.lineNumber <= file_.line_count()) {
-        last_logical_line_ = line_.lineNumber;
-    }
     switch (line_.type) {
         case LDIF_Line::comment:
             return comment();
@@ -125,6 +118,7 @@ void problem_finder::dn_line() {
     open_.emplace();
     open_->written = line_.value;
     open_->where = value_place();
+    open_->first = line_.lineNumber;
     open_->last = last_;
     check_literal();
     if (is_readable) {
@@ -154,8 +148,7 @@ void problem_finder::parse_dn(entry_section& section) {
         section.stopping.push_back(&found);
         return;
     }
-    const bool is_cut_off = last_ == file_.line_count() && !file_.text().ends_with('\n');
-    if (section.dn.empty() && !is_cut_off) {
+    if (section.dn.empty()) {
         add(kind::empty_dn, section.where,
             "DN line without a DN: its attributes go where version and charset are");
     }
@@ -179,7 +172,6 @@ void problem_finder::dn_without_colon(entry_section& section) {
     }
     problem& found = add(kind::invalid_dn, where,
                          "line begins with \"dn\" and has no colon, so it counts as a DN line");
-    found.result = 34;
     section.stopping.push_back(&found);
 }
 
@@ -193,38 +185,12 @@ void problem_finder::require_headers() {
     }
 }
 
-/// A line that the end of the file ends may have been cut off, so a load does without its value.
-void problem_finder::check_final_newline() {
-    const int number = file_.line_count();
-    if (number == 0 || file_.text().ends_with('\n')) {
-        return;
-    }
-    const auto begin = file_.line(last_logical_line_).data() - file_.text().data();
-    const std::string text(file_.readable().substr(static_cast<size_t>(begin)));
-    const std::string with_newline = text + "\n";
-    line_source source(with_newline);
-    LDIF_Line line;
-    line.next(source, 0);
-    const bool has_value = line.type == LDIF_Line::attr || line.type == LDIF_Line::dn;
-    if (has_value && !line.value.empty()) {
-        const std::string_view end = file_.line(number);
-        problem& found =
-            found_.add(kind::missing_final_newline, {number, count_characters(end) + 1, 1},
-                       "last line has no newline at its end: its value is not used");
-        found.attribute = line.type == LDIF_Line::attr ? shown_line(line.attribute) : "";
-    }
-}
-
 problem& problem_finder::add(const rule& broken, const place& where, std::string text) {
     problem& found = found_.add(broken, where, std::move(text));
     found.entry = open_ ? open_->written : "";
     const bool has_name = line_.type == LDIF_Line::attr && line_.hasSeparator;
     found.attribute = has_name ? shown_line(line_.attribute) : "";
     return found;
-}
-
-std::vector<problem> find_problems(std::string_view text, aes_key_data* key) {
-    return problem_finder(text, key).run();
 }
 
 }  // namespace cfg32::tool

@@ -18,7 +18,7 @@
 
 namespace cfg32::tool {
 
-/// One pass over a file's text.
+/// One pass over a file's text, judged as a load reads it.
 class problem_finder {
   public:
     problem_finder(std::string_view text, aes_key_data* key)
@@ -28,7 +28,6 @@ class problem_finder {
 
   private:
     void check_bytes();
-    void check_final_newline();
     void follow();
 
     bool is_unreadable();
@@ -41,6 +40,7 @@ class problem_finder {
 
     void attribute_line();
     void check_spelling();
+    void check_unreadable_value();
     void take();
     void keep_aside();
     void add_outside(LDIF_Attribute&& attribute);
@@ -62,9 +62,8 @@ class problem_finder {
     findings found_;
     checked_entries entries_;
 
-    LDIF_Line line_;  // the logical line, from its lineNumber
-    int last_ = 0;    // to here
-    int last_logical_line_ = 0;
+    LDIF_Line line_;                         // the logical line, from its lineNumber
+    int last_ = 0;                           // to here
     std::map<int, problem*> unreadable_;     // lines that have invalid bytes
     problem* unreadable_comment_ = nullptr;  // directly before the line
     std::optional<entry_section> open_;
@@ -74,7 +73,5 @@ class problem_finder {
     std::map<cisString, int> header_lines_;                 // 0 for one that a load adds by itself
     std::unordered_map<std::string, std::string> nearest_;  // names that are not in the table
 };
-
-void take_codes(problem& found, const LDIF_Exception& e);
 
 }  // namespace cfg32::tool

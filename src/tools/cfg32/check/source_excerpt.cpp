@@ -27,10 +27,11 @@ struct cell {
     size_t width;  // in columns
 };
 
-/// Marks that change the direction of writing would make a line look like another.
-bool changes_direction(wchar_t code) {
-    return code == 0x200e || code == 0x200f || (code >= 0x202a && code <= 0x202e) ||
-           (code >= 0x2066 && code <= 0x2069);
+/// Marks that are not seen, and those that change the direction of writing, would make a line look
+/// like another.
+bool misleads(wchar_t code) {
+    return code == 0xfeff || code == 0x200e || code == 0x200f ||
+           (code >= 0x202a && code <= 0x202e) || (code >= 0x2066 && code <= 0x2069);
 }
 
 cell shown(const character& next, size_t column) {
@@ -38,7 +39,7 @@ cell shown(const character& next, size_t column) {
         const size_t width = tab_stop - column % tab_stop;
         return {std::string(width, ' '), width};
     }
-    const int width = next.is_valid && !changes_direction(next.code) ? wcwidth(next.code) : -1;
+    const int width = next.is_valid && !misleads(next.code) ? wcwidth(next.code) : -1;
     if (width < 0 || next.code == L'\0') {
         return {"?", 1};
     }
@@ -99,34 +100,12 @@ std::string harmless(std::string_view text) {
     return text_of(cells.begin(), cells.end());
 }
 
-/// Finds the first physical line of the logical one, of which it depends what is hidden.
-void source_excerpts::find_beginning(int number) {
-    int first = number;
-    while (first > 1 && first != number_ && leading_space(file_.line(first)) > 0) {
-        --first;
-    }
-    const int before = beginning_;
-    beginning_ = first == number_ ? beginning_ : first;
-    number_ = number;
-    if (beginning_ != before) {
-        const std::string_view line = file_.line(beginning_);
-        is_hidden_ = is_password_line(line) || shown_line(line) != line;
-    }
-}
-
-/// A line without what is not to be seen.
-std::string source_excerpts::line_as_shown(int number) {
-    const std::string_view line = file_.line(number);
-    find_beginning(number);
-    if (beginning_ == number) {
-        return shown_line(line);
-    }
-    return is_hidden_ ? " " + std::string(hidden_text) : std::string(line);
-}
-
 source_excerpt source_excerpts::of(const problem& shown_problem) {
-    const std::string line = line_as_shown(shown_problem.line);
+    std::string line = lines_.at(shown_problem.line);
     const bool is_hidden = line != file_.line(shown_problem.line);
+    if (!is_hidden && line.ends_with('\r')) {
+        line.pop_back();
+    }
     const std::vector<cell> cells = cells_of(line);
     // What reaches into a hidden value is marked as all of it: not even its length shows.
     const size_t hidden = is_hidden ? cells.size() - hidden_text.size() : cells.size();

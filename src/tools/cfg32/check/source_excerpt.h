@@ -7,6 +7,7 @@
 
 #include "check/file_text.h"
 #include "check/problem.h"
+#include "check/shown_lines.h"
 
 namespace cfg32::tool {
 
@@ -21,19 +22,13 @@ struct source_excerpt {
 /// Shows the lines of a file, passwords hidden. Quickest in their order.
 class source_excerpts {
   public:
-    explicit source_excerpts(const file_text& file) : file_(file) {}
+    explicit source_excerpts(const file_text& file) : file_(file), lines_(file) {}
 
     source_excerpt of(const problem& shown);
 
   private:
-    std::string line_as_shown(int number);
-    void find_beginning(int number);
-
     const file_text& file_;
-    // The last line that was asked for, and the one that it continues.
-    int number_ = 0;
-    int beginning_ = 0;
-    bool is_hidden_ = false;  // what continues it
+    shown_lines lines_;
 };
 
 /// Text without control characters and bytes that are no characters: a "?" stands for each.

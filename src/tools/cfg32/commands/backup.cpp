@@ -23,7 +23,7 @@ void require_good(const std::string& name, const std::string& text, const std::s
         return;
     }
     const auto found = std::find_if(problems.begin(), problems.end(), [](const problem& each) {
-        return each.broken->outcome == consequence::stops_load;
+        return each.outcome() == consequence::stops_load;
     });
     throw ended(answer_is_no,
                 fmt::format("{}:{}: {}; {} stays as it is (name another file to copy to)", name,

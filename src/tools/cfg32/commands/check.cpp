@@ -38,16 +38,26 @@ bool is_unfinished_copy(std::string_view name) {
     return std::all_of(number.begin(), number.end(), [](unsigned char c) { return isxdigit(c); });
 }
 
-/// The copies beside a file. A folder that can't be listed shows none.
-std::vector<problem> find_leftover_copies(const std::string& file_name) {
-    const auto folder = std::filesystem::path(file_name).parent_path();
-    std::vector<std::string> names;
+/// A folder that can't be listed has none.
+void add_unfinished_copies(const std::filesystem::path& folder, std::vector<std::string>& names) {
     std::error_code ignored;
     for (auto entry = std::filesystem::directory_iterator(folder.empty() ? "." : folder, ignored);
          entry != std::filesystem::directory_iterator(); entry.increment(ignored)) {
         if (is_unfinished_copy(entry->path().filename().native())) {
             names.push_back(folder / entry->path().filename());
         }
+    }
+}
+
+/// The copies beside a file, and beside the one that a symbolic link names.
+std::vector<problem> find_leftover_copies(const std::string& file_name) {
+    const auto folder = std::filesystem::path(file_name).parent_path();
+    std::error_code ignored;
+    const auto real_folder = std::filesystem::canonical(file_name, ignored).parent_path();
+    std::vector<std::string> names;
+    add_unfinished_copies(folder, names);
+    if (!std::filesystem::equivalent(folder.empty() ? "." : folder, real_folder, ignored)) {
+        add_unfinished_copies(real_folder, names);
     }
     std::sort(names.begin(), names.end());
     std::vector<problem> found;
@@ -87,7 +97,10 @@ int check(const settings& options, const arguments& given) {
             files.push_back(std::move(*file));
         }
     }
-    const std::string report = (options.is_json ? json_report : given.report)(files);
+    const std::string report = [&] {
+        const progress reporting("Putting the report together");
+        return (options.is_json ? json_report : given.report)(files);
+    }();
     fwrite(report.data(), 1, report.size(), stdout);
     if (files.size() < names.size()) {
         return failed;

@@ -26,13 +26,13 @@ struct arguments {
 /// Where the file that is replaced is kept: never in the place of the backup that replaces it.
 std::string keeping_place(const settings& options, const std::string& source) {
     if (options.has_no_backup || !options.backup_option.empty()) {
-        const std::string place = options.backup_name();
+        std::string place = options.backup_name();
         if (is_same(place, source)) {
             throw ended(usage_error, "what is restored can't be overwritten: " + place);
         }
         return place;
     }
-    const std::string place = options.file_name() + ".before-restore";
+    std::string place = options.file_name() + ".before-restore";
     return is_same(place, source) ? options.file_name() + ".before-undo" : place;
 }
 
@@ -42,7 +42,8 @@ std::string newest_backup(const settings& options) {
     std::string newest = name + ".bak";
     if (is_there(name) && read_configuration(name).starts_with(unfinished_mark)) {
         for (const char* other : {".before-restore", ".before-undo"}) {
-            newest = is_newer(name + other, newest) ? name + other : newest;
+            const std::string candidate = name + other;
+            newest = is_newer(candidate, newest) ? candidate : newest;
         }
     }
     return newest;

@@ -97,7 +97,7 @@ option_list visible_options(const CLI::App& parser) {
 
 /// The options of the command and those that every command shares.
 option_list typed_line::known_options() const {
-    const option_list shared = visible_options(program_);
+    option_list shared = visible_options(program_);
     if (!command_) {
         return shared;
     }

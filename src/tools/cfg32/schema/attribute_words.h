@@ -49,4 +49,7 @@ std::string example_value(const _AttrType& type);
 /// "oru-slapd"; none when nothing is near.
 std::optional<std::string> nearest_attribute(std::string_view name);
 
+/// Every name in the table that the text may mean, the nearest one first.
+std::vector<std::string_view> near_attributes(std::string_view name);
+
 }  // namespace cfg32::tool

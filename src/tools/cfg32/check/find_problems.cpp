@@ -1,0 +1,132 @@
+// Every problem of a text: of what stands there, and of what a load sees of its last line.
+
+#include <algorithm>
+#include <iterator>
+
+#include "LDIF_Line.h"
+#include "check/file_text.h"
+#include "check/findings.h"
+#include "check/problem_finder.h"
+#include "check/shown_lines.h"
+#include "hidden_passwords.h"
+#include "line_source.h"
+
+namespace cfg32::tool {
+
+namespace {
+
+/// A text whose last line has no newline. The line may have been cut off, so a load does without
+/// its value: what a load does follows from the text as it is, but what is wrong with the line is
+/// told of the value that stands there.
+class cut_off_text {
+  public:
+    cut_off_text(std::string_view text, aes_key_data* key)
+        : file_(text),
+          written_(std::string(text) + "\n"),
+          line_(file_.beginning_of(file_.line_count())),
+          loaded_(problem_finder(text, key).run()),
+          meant_(problem_finder(written_, key).run()) {}
+
+    std::vector<problem> problems();
+
+  private:
+    bool is_at_end(const problem& each) const { return each.line >= line_; }
+    LDIF_Line cut_off_line() const;
+    void take_what_is_loaded(problem& meant);
+    problem missing_newline(const LDIF_Line& line) const;
+
+    const file_text file_;
+    const std::string written_;
+    const int line_;  // where the last logical line begins
+    std::vector<problem> loaded_;
+    std::vector<problem> meant_;
+};
+
+std::vector<problem> cut_off_text::problems() {
+    const LDIF_Line line = cut_off_line();
+    const bool has_value = line.type == LDIF_Line::attr || line.type == LDIF_Line::dn;
+    if (!has_value || line.value.empty()) {
+        return loaded_;
+    }
+    std::erase_if(meant_, [&](const problem& each) { return !is_at_end(each); });
+    std::for_each(meant_.begin(), meant_.end(), [&](problem& each) { take_what_is_loaded(each); });
+    meant_.push_back(missing_newline(line));
+    std::erase_if(loaded_, [&](const problem& each) { return is_at_end(each); });
+    std::move(meant_.begin(), meant_.end(), std::back_inserter(loaded_));
+    sort_by_place(loaded_);
+    return std::move(loaded_);
+}
+
+/// The last line as it is written.
+LDIF_Line cut_off_text::cut_off_line() const {
+    const std::string_view all = file_.readable();
+    const auto begin = static_cast<size_t>(file_.line(line_).data() - file_.text().data());
+    const std::string text = std::string(all.substr(begin)) + "\n";
+    cfg32::line_source source(text);
+    LDIF_Line line;
+    line.next(source, 0);
+    return line;
+}
+
+/// A load may see the same in what is left of the line. Each of its problems is taken once.
+void cut_off_text::take_what_is_loaded(problem& meant) {
+    const auto same = std::find_if(loaded_.begin(), loaded_.end(), [&](const problem& each) {
+        return is_at_end(each) && each.broken == meant.broken;
+    });
+    if (same == loaded_.end()) {
+        meant.own_outcome = consequence::none;
+        meant.result = meant.extended = 0;
+        meant.first_left_out = meant.last_left_out = 0;
+        return;
+    }
+    meant.first_left_out = same->first_left_out;
+    meant.last_left_out = same->last_left_out;
+    loaded_.erase(same);
+}
+
+/// What a load finds wrong with the rest of the line is the missing newline's fault.
+problem cut_off_text::missing_newline(const LDIF_Line& line) const {
+    const int last = file_.line_count();
+    findings made;
+    problem& found =
+        made.add(kind::missing_final_newline, {last, count_characters(file_.line(last)) + 1, 1},
+                 "last line has no newline at its end: its value is not used");
+    found.attribute = line.type == LDIF_Line::attr ? shown_line(line.attribute) : "";
+    for (const problem& each : loaded_) {
+        if (is_at_end(each)) {
+            found.own_outcome = std::max(found.outcome(), each.outcome());
+            found.result = std::max(found.result, each.result);
+            found.first_left_out = std::max(found.first_left_out, each.first_left_out);
+            found.last_left_out = std::max(found.last_left_out, each.last_left_out);
+        }
+    }
+    shown_lines(file_).hide_length(found);
+    return found;
+}
+
+std::vector<problem> problems_of_lines(std::string_view text, aes_key_data* key) {
+    const bool is_cut_off = !text.empty() && text.back() != '\n';
+    return is_cut_off ? cut_off_text(text, key).problems() : problem_finder(text, key).run();
+}
+
+}  // namespace
+
+/// Behind a byte order mark everything is judged as if the mark were not there.
+std::vector<problem> find_problems(std::string_view text, aes_key_data* key) {
+    if (!text.starts_with(byte_order_mark)) {
+        return problems_of_lines(text, key);
+    }
+    std::vector<problem> problems = find_problems(text.substr(byte_order_mark.size()), key);
+    const int width = count_characters(byte_order_mark);
+    for (problem& each : problems) {
+        each.column += each.line == 1 ? width : 0;
+    }
+    findings mark;
+    mark.add(kind::byte_order_mark, {1, 1, width},
+             "byte order mark, which becomes part of the first name: remove it")
+        .accepted = "UTF-8 without a byte order mark";
+    problems.insert(problems.begin(), std::move(mark.all().front()));
+    return problems;
+}
+
+}  // namespace cfg32::tool
