@@ -75,9 +75,9 @@ TEST(ReadLdif, TakesWhatIsWellFormed) {
          {"add cn=a@1 | add x@2 =1@2 =3@4 | add y@3 =2@3"}},
         {"the version may stand above the first record",
          add,
-         "# c\nversion: 1\ndn: cn=a\ncn: a",
+         "# c\nversion: 1\ndn: cn=a\ncn: a\n",
          {"add cn=a@3 | add cn@4 =a@4"}},
-        {"or apart from it", add, "version:1\n\ndn: cn=a\ncn: a", {"add cn=a@3 | add cn@4 =a@4"}},
+        {"or apart from it", add, "version:1\n\ndn: cn=a\ncn: a\n", {"add cn=a@3 | add cn@4 =a@4"}},
         {"a changetype, in any case",
          remove,
          "dn: cn=a\nchangetype: ADD\ncn: a\n",
@@ -94,10 +94,14 @@ TEST(ReadLdif, TakesWhatIsWellFormed) {
          modify,
          "dn: cn=a\nReplace: x\nX: 1\n-\n",
          {"modify cn=a@1 | replace x@2 =1@3"}},
-        {"the last block's end may be missing",
+        {"the end of the last block may be missing, if it has values",
          modify,
-         "dn: cn=a\ndelete: x\n\ndn: cn=b\ndelete: y",
-         {"modify cn=a@1 | delete x@2", "modify cn=b@4 | delete y@5"}},
+         "dn: cn=a\ndelete: x\nx: 1\n\ndn: cn=b\nreplace: y\ny: 2\n",
+         {"modify cn=a@1 | delete x@2 =1@3", "modify cn=b@5 | replace y@6 =2@7"}},
+        {"a last line without newline, if it is a comment",
+         remove,
+         "dn: cn=a\n# c",
+         {"delete cn=a@1"}},
         {"a replacement by nothing",
          modify,
          "dn: cn=a\nreplace: x\n-\n",
@@ -220,6 +224,14 @@ TEST(ReadLdif, SaysWhatIsWrongAndWhere) {
          blocks + "delete: x\n- \n",
          {"4: text after the \"-\" that ends a block"}},
         {"an addition of nothing", modify, blocks + "add: x\n-\n", {"3: no values to add"}},
+        {"a replacement by nothing that may be cut off",
+         modify,
+         blocks + "replace: x\n",
+         {"3: a block without values needs the line \"-\" that ends it"}},
+        {"a last line that may be cut off",
+         add,
+         "dn: cn=a\ncn: a",
+         {"2: the last line has no newline at its end, as if it were cut off"}},
         {"a modification of nothing", modify, blocks, {"1: a modification without changes"}},
         {"a DN alone is no modification",
          modify,
@@ -279,11 +291,12 @@ TEST(ReadLdif, DecodesBase64Strictly) {
 }
 
 TEST(ReadLdif, GoesOnAtTheNextBlankLine) {
-    EXPECT_THAT(read("dn: cn=a\noops\nalso oops\n\ndn: cn=b\ndelete: x\n\n\nnor this\n\ndn: cn=c\n"
-                     "delete: y\n",
-                     modify),
-                ElementsAre("2: a line without a colon", "modify cn=b@5 | delete x@6",
-                            "9: a line without a colon", "modify cn=c@11 | delete y@12"));
+    EXPECT_THAT(
+        read("dn: cn=a\noops\nalso oops\n\ndn: cn=b\ndelete: x\n-\n\n\nnor this\n\ndn: cn=c\n"
+             "delete: y\n-\n",
+             modify),
+        ElementsAre("2: a line without a colon", "modify cn=b@5 | delete x@6",
+                    "10: a line without a colon", "modify cn=c@12 | delete y@13"));
 }
 
 }  // namespace cfg32::tool
