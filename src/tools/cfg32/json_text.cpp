@@ -12,11 +12,11 @@ namespace cfg32::tool {
 json json_of(const entry& printed) {
     json attributes = json::object();
     for (const attribute& each : printed.attributes) {
-        json values = json::array();
+        // Names of which a part is hidden may look the same.
+        json& values = attributes.emplace(utf8(shown_line(each.name)), json::array()).first.value();
         for (const std::string& value : each.values) {
             values.push_back(utf8(shown_value(each.name, value)));
         }
-        attributes[utf8(shown_line(each.name))] = std::move(values);
     }
     return {{"dn", utf8(printed.dn)}, {"attributes", std::move(attributes)}};
 }
