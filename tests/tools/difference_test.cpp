@@ -12,6 +12,7 @@
 #include "change/ldif_reader.h"
 #include "change/update.h"
 #include "hidden_passwords.h"
+#include "key.h"
 #include "ldif_writer.h"
 #include "password.h"
 #include "temporary_folder.h"

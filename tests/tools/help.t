@@ -50,7 +50,7 @@ Each command has its own:
     
     Positionals:
       dn DN                       the entry
-      attribute ATTR              the attribute to set
+      attribute ATTR              its attribute
       value VALUE                 all the values it is to have; "--" goes before one like "-x"
     
     Options:

@@ -252,6 +252,7 @@ TEST_F(error, DumpWithoutMemoryIsNullAndLeavesTheHandleAlone) {
     EXPECT_EQ(cfg_dump_exception(&handle), nullptr);
     EXPECT_EQ(handle.dumpText, nullptr);
     EXPECT_EQ(cfg_get_errno(&handle), 90);
+    cfg_reset(&handle);  // while what the exception counts with is there
 }
 
 TEST_F(error, ResetDeletesTheWholeChainThroughItsDestructors) {

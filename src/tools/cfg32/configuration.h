@@ -8,6 +8,7 @@
 #include "LDIF_Entry.h"
 #include "check/problem.h"
 #include "entry.h"
+#include "key.h"
 #include "memory_file.h"
 #include "settings.h"
 

@@ -5,9 +5,12 @@
 #include <cstdio>
 #include <nlohmann/json.hpp>
 
+#include "configuration.h"
 #include "hidden_passwords.h"
 
 namespace cfg32::tool {
+
+namespace {
 
 json json_of(const entry& printed) {
     json attributes = json::object();
@@ -29,9 +32,25 @@ json json_of(const std::vector<problem>& left_out) {
     return list;
 }
 
+}  // namespace
+
 void print_json(const json& value) {
     const std::string text = value.dump(2) + "\n";
     fwrite(text.data(), 1, text.size(), stdout);
+}
+
+void print_objects(json entries, const configuration& file) {
+    print_json({{"file", utf8(file.name())},
+                {"entries", std::move(entries)},
+                {"leftOut", json_of(file.left_out())}});
+}
+
+void print_entries(const std::vector<entry>& entries, const configuration& file) {
+    json list = json::array();
+    for (const entry& each : entries) {
+        list.push_back(json_of(each));
+    }
+    print_objects(std::move(list), file);
 }
 
 }  // namespace cfg32::tool

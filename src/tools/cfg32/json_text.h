@@ -3,21 +3,22 @@
 #include <nlohmann/json_fwd.hpp>
 #include <vector>
 
-#include "check/problem.h"
 #include "entry.h"
 #include "utf8.h"
 
 namespace cfg32::tool {
 
+class configuration;
+
 /// JSON objects keep the order in which their members were given.
 using json = nlohmann::ordered_json;
 
-/// An entry, with its passwords only as far as they may be seen.
-json json_of(const entry& printed);
-
-/// What was left out when a file was read.
-json json_of(const std::vector<problem>& left_out);
-
 void print_json(const json& value);
+
+/// Prints what was found of a file's entries, an object each, and what was left out of it.
+void print_objects(json entries, const configuration& file);
+
+/// Prints entries so, with their passwords only as far as they may be seen.
+void print_entries(const std::vector<entry>& entries, const configuration& file);
 
 }  // namespace cfg32::tool

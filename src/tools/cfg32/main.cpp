@@ -1,8 +1,10 @@
 // The administrator's command.
 
+#include <fmt/format.h>
 #include <sodium.h>
 #include <sys/prctl.h>
 
+#include <CLI/CLI.hpp>
 #include <algorithm>
 #include <clocale>
 #include <cstdio>
@@ -10,7 +12,7 @@
 #include <span>
 
 #include "LDIF_Exception.h"
-#include "choice_option.h"
+#include "arguments.h"
 #include "command.h"
 #include "outcome.h"
 #include "terminal.h"
@@ -66,12 +68,11 @@ void add_shared_options(CLI::App& parser, settings& options) {
     add_flag("--no-backup", options.has_no_backup, "make no backup")->excludes(backup);
     prompt->needs(dn)->excludes(file);
     file->needs(dn);
-    add_choice<color_choice>(parser, "--color", options.color,
-                             {{"auto", color_choice::automatic},
-                              {"always", color_choice::always},
-                              {"never", color_choice::never}},
-                             "else auto, which respects NO_COLOR")
-        ->group(shared_options);
+    add_choice(parser, "--color", "else auto, which respects NO_COLOR", options.color,
+               {{"auto", color_choice::automatic},
+                {"always", color_choice::always},
+                {"never", color_choice::never}});
+    parser.get_option("--color")->group(shared_options);
 }
 
 /// The options that go with a command's traits. They are taken before its name as well.

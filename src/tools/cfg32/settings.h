@@ -6,8 +6,6 @@
 
 #include "secret.h"
 
-struct aes_key_data;
-
 namespace cfg32::tool {
 
 enum class color_choice { automatic, always, never };
@@ -30,20 +28,6 @@ struct settings {
     std::string backup_name() const;
     /// The password that goes with bind_dn, from the prompt or the file.
     secret bind_password() const;
-};
-
-/// The key that --key-file names, if it does, for as long as the object lives.
-class key {
-  public:
-    explicit key(const settings& options);
-    key(const key&) = delete;
-    key& operator=(const key&) = delete;
-    ~key();
-
-    aes_key_data* get() const { return data_; }
-
-  private:
-    aes_key_data* data_ = nullptr;
 };
 
 }  // namespace cfg32::tool

@@ -2,10 +2,11 @@
 
 #include "change/ldif_command.h"
 
-#include <CLI/CLI.hpp>
 #include <cerrno>
 #include <cstdio>
+#include <memory>
 
+#include "arguments.h"
 #include "change/ldif_reader.h"
 #include "outcome.h"
 
@@ -84,12 +85,10 @@ void require_none(const std::vector<skipped_record>& bad) {
 
 std::shared_ptr<ldif_options> add_ldif_options(CLI::App& parser) {
     auto given = std::make_shared<ldif_options>();
-    parser
-        .add_option("-l,--ldif", given->file,
-                    "read the changes from this file; else from standard input")
-        ->type_name("FILE");
-    parser.add_flag("-c,--continue", given->how.goes_on,
-                    "leave out records that fail, and say which");
+    add_argument(parser, "-l,--ldif", "FILE",
+                 "read the changes from this file; else from standard input", given->file);
+    add_flag(parser, "-c,--continue", "leave out records that fail, and say which",
+             given->how.goes_on);
     return given;
 }
 

@@ -8,6 +8,7 @@
 #include "cfg32.h"
 #include "change/record_changes.h"
 #include "configuration.h"
+#include "key.h"
 #include "memory_file.h"
 #include "outcome.h"
 #include "terminal.h"

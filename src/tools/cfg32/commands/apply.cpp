@@ -1,7 +1,8 @@
 // cfg32 apply: makes the configuration the same as another file's.
 
-#include <CLI/CLI.hpp>
+#include <memory>
 
+#include "arguments.h"
 #include "change/update.h"
 #include "command.h"
 #include "configuration.h"
@@ -43,9 +44,8 @@ int apply_all(const settings& options, const std::string& wanted_name) {
 
 action define_apply(CLI::App& parser, settings& options) {
     const auto wanted = std::make_shared<std::string>();
-    parser.add_option("wanted", *wanted, "the file that has the wanted content")
-        ->type_name("FILE")
-        ->required();
+    add_argument(parser, "wanted", "FILE", "the file that has the wanted content", *wanted,
+                 presence::required);
     return [wanted, &options] { return apply_all(options, *wanted); };
 }
 

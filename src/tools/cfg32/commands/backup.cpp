@@ -2,10 +2,11 @@
 
 #include <fcntl.h>
 #include <fmt/format.h>
+#include <memory>
 
-#include <CLI/CLI.hpp>
 #include <algorithm>
 
+#include "arguments.h"
 #include "check/problem.h"
 #include "command.h"
 #include "configuration.h"
@@ -48,8 +49,8 @@ int backup(const settings& options, const std::string& given_target) {
 
 action define_backup(CLI::App& parser, settings& options) {
     const auto target = std::make_shared<std::string>();
-    parser.add_option("backup", *target, "the copy; else what --backup says, or FILE.bak")
-        ->type_name("BACKUP");
+    add_argument(parser, "backup", "BACKUP", "the copy; else what --backup says, or FILE.bak",
+                 *target);
     return [target, &options] { return backup(options, *target); };
 }
 

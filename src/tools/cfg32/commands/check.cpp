@@ -1,15 +1,17 @@
 // cfg32 check: every problem of a file at once, without changing it.
 
 #include <fmt/format.h>
+#include <memory>
 
 #include <algorithm>
 #include <cctype>
 #include <filesystem>
 #include <optional>
 
+#include "arguments.h"
 #include "check/check_report.h"
-#include "choice_option.h"
 #include "command.h"
+#include "key.h"
 #include "memory_file.h"
 #include "outcome.h"
 #include "terminal.h"
@@ -114,15 +116,13 @@ int check(const settings& options, const arguments& given) {
 
 action define_check(CLI::App& parser, settings& options) {
     const auto given = std::make_shared<arguments>();
-    parser.add_option("file", given->files, "what to check; else the configuration file")
-        ->type_name("FILE");
-    const auto format = add_choice<report_format>(parser, "--format", given->report,
-                                                  {{"text", text_report},
-                                                   {"json", json_report},
-                                                   {"sarif", sarif_report},
-                                                   {"github", github_report}},
-                                                  "how to print the problems; else text");
-    parser.get_option("--json")->description("the same as --format json")->excludes(format);
+    add_argument(parser, "file", "FILE", "what to check; else the configuration file",
+                 given->files);
+    add_format(parser, "how to print the problems; else text", given->report,
+               {{"text", text_report},
+                {"json", json_report},
+                {"sarif", sarif_report},
+                {"github", github_report}});
     return [given, &options] { return check(options, *given); };
 }
 

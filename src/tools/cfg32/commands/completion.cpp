@@ -8,7 +8,7 @@
 #include <iterator>
 #include <memory>
 
-#include "choice_option.h"
+#include "arguments.h"
 #include "command.h"
 #include "completion/completion_words.h"
 #include "completion/shell_word.h"
@@ -191,13 +191,11 @@ int try_candidates(const CLI::App& program, const std::string& shell_name) {
 action define_completion(CLI::App& parser, settings&) {
     const auto name = std::make_shared<std::string>();
     const auto asks = std::make_shared<bool>(false);
-    add_choice<std::string>(parser, "shell", *name,
-                            {{"bash", "bash"}, {"zsh", "zsh"}, {"fish", "fish"}},
-                            "the shell that reads the script")
-        ->required();
-    parser.add_flag("--candidates", *asks)->group("");  // for the scripts alone: not in the help
+    add_choice(parser, "shell", "the shell that reads the script", *name,
+               {{"bash", "bash"}, {"zsh", "zsh"}, {"fish", "fish"}}, presence::required);
+    add_flag(parser, "--candidates", "", *asks);  // for the scripts alone: not in the help
     return [&parser, name, asks] {
-        return *asks ? try_candidates(*parser.get_parent(), *name) : print_script(*name);
+        return *asks ? try_candidates(program_of(parser), *name) : print_script(*name);
     };
 }
 

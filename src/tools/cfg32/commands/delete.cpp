@@ -1,7 +1,8 @@
 // cfg32 delete: deletes entries.
 
-#include <CLI/CLI.hpp>
+#include <memory>
 
+#include "arguments.h"
 #include "change/ldif_command.h"
 
 namespace cfg32::tool {
@@ -23,11 +24,10 @@ int delete_entries(const settings& options, const std::vector<std::string>& dns,
 action define_delete(CLI::App& parser, settings& options) {
     const auto given = add_ldif_options(parser);
     const auto dns = std::make_shared<std::vector<std::string>>();
-    parser.add_flag("-r,--recursive", given->how.deletes_trees,
-                    "delete an entry with everything below it");
-    parser.add_option("dn", *dns, "the entries to delete; without any, LDIF names them")
-        ->type_name("DN")
-        ->excludes(parser.get_option("--ldif"));
+    add_flag(parser, "-r,--recursive", "delete an entry with everything below it",
+             given->how.deletes_trees);
+    add_argument(parser, "dn", "DN", "the entries to delete; without any, LDIF names them", *dns);
+    exclude(parser, "dn", "--ldif");
     return [&options, given, dns] {
         return dns->empty() ? update_from_ldif(options, *given, change_record::remove, true)
                             : delete_entries(options, *dns, given->how);

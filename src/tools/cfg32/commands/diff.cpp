@@ -1,10 +1,11 @@
 // cfg32 diff: tells what differs between two files.
 
 #include <fmt/format.h>
+#include <memory>
 
 #include <nlohmann/json.hpp>
 
-#include "choice_option.h"
+#include "arguments.h"
 #include "command.h"
 #include "configuration.h"
 #include "diff/difference.h"
@@ -135,13 +136,10 @@ int diff(const settings& options, const arguments& given) {
 
 action define_diff(CLI::App& parser, settings& options) {
     const auto given = std::make_shared<arguments>();
-    parser.add_option("from", given->from, "the file of before")->type_name("FILE")->required();
-    parser.add_option("to", given->to, "the file of after")->type_name("FILE")->required();
-    const auto format = add_choice<diff_format>(
-        parser, "--format", given->format,
-        {{"ldif", as_ldif}, {"text", as_text}, {"json", as_json}},
-        "changes that `cfg32 modify` takes, lines to read, or JSON; else ldif");
-    parser.get_option("--json")->description("the same as --format json")->excludes(format);
+    add_argument(parser, "from", "FILE", "the file of before", given->from, presence::required);
+    add_argument(parser, "to", "FILE", "the file of after", given->to, presence::required);
+    add_format(parser, "changes that `cfg32 modify` takes, lines to read, or JSON; else ldif",
+               given->format, {{"ldif", as_ldif}, {"text", as_text}, {"json", as_json}});
     return [given, &options] { return diff(options, *given); };
 }
 

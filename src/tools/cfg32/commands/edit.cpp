@@ -2,8 +2,8 @@
 
 #include <fmt/format.h>
 #include <unistd.h>
+#include <memory>
 
-#include <CLI/CLI.hpp>
 #include <climits>
 #include <csignal>
 #include <cstdio>
@@ -13,6 +13,7 @@
 
 #include "LDIF_Exception.h"
 #include "LDIF_File.h"
+#include "arguments.h"
 #include "check/check_report.h"
 #include "command.h"
 #include "configuration.h"
@@ -152,9 +153,8 @@ void session::keep_draft() {
 
 action define_edit(CLI::App& parser, settings& options) {
     const auto dn = std::make_shared<std::string>();
-    parser.add_option("dn", *dn, "the entry to edit; else the whole file")->type_name("DN");
-    parser.footer("The editor is the one that VISUAL or EDITOR names, else vi.\n" +
-                  parser.get_footer());
+    add_argument(parser, "dn", "DN", "the entry to edit; else the whole file", *dn);
+    add_footer(parser, "The editor is the one that VISUAL or EDITOR names, else vi.");
     return [dn, &options] {
         require_bind(options);
         return session(options, *dn).run();

@@ -2,14 +2,12 @@
 
 #include <fmt/format.h>
 
-#include <CLI/CLI.hpp>
 #include <memory>
-#include <nlohmann/json.hpp>
 #include <utility>
 
 #include "LDIF_AttrType.h"
+#include "arguments.h"
 #include "command.h"
-#include "json_text.h"
 #include "outcome.h"
 #include "schema/attribute_json.h"
 #include "schema/attribute_words.h"
@@ -46,7 +44,7 @@ int explain(const std::vector<std::string>& names, bool is_json) {
         }
     }
     if (is_json) {
-        print_json(attributes_json(rows));
+        print_attributes_json(rows);
     } else {
         const char* between = "";
         for (const _AttrType* row : rows) {
@@ -61,9 +59,8 @@ int explain(const std::vector<std::string>& names, bool is_json) {
 
 action define_explain(CLI::App& parser, settings& options) {
     const auto names = std::make_shared<std::vector<std::string>>();
-    parser.add_option("attributes", *names, "names of attributes, in upper or lower case")
-        ->type_name("ATTR")
-        ->required();
+    add_argument(parser, "attributes", "ATTR", "names of attributes, in upper or lower case",
+                 *names, presence::required);
     return [names, &options] { return explain(*names, options.is_json); };
 }
 

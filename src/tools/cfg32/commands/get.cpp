@@ -1,10 +1,9 @@
 // cfg32 get: prints the values of an attribute.
 
 #include <fmt/format.h>
+#include <memory>
 
-#include <CLI/CLI.hpp>
-#include <nlohmann/json.hpp>
-
+#include "arguments.h"
 #include "cfg32.h"
 #include "command.h"
 #include "configuration.h"
@@ -17,20 +16,15 @@ namespace cfg32::tool {
 
 namespace {
 
-struct arguments {
-    std::string dn;
-    std::string attribute;
-};
-
 /// The entry with that attribute alone; without attributes when it has it not.
-entry asked_for(const configuration& file, const arguments& given) {
+entry asked_for(const configuration& file, const attribute_of_entry& given) {
     entry read = entry_of(file.entry_at(given.dn));
     std::erase_if(read.attributes,
                   [&](const attribute& each) { return cisString(each.name) != given.attribute; });
     return read;
 }
 
-[[noreturn]] void tell_missing(const configuration& file, const arguments& given) {
+[[noreturn]] void tell_missing(const configuration& file, const attribute_of_entry& given) {
     const auto meant =
         find_attribute(given.attribute) ? std::nullopt : nearest_attribute(given.attribute);
     throw ended(
@@ -40,13 +34,11 @@ entry asked_for(const configuration& file, const arguments& given) {
                     CFG_NO_SUCH_ATTRIBUTE));
 }
 
-int get(const settings& options, const arguments& given) {
+int get(const settings& options, const attribute_of_entry& given) {
     const configuration file(options);
     const entry read = asked_for(file, given);
     if (options.is_json) {
-        print_json({{"file", utf8(file.name())},
-                    {"entries", {json_of(read)}},
-                    {"leftOut", json_of(file.left_out())}});
+        print_entries({read}, file);
     }
     if (read.attributes.empty()) {
         tell_missing(file, given);
@@ -62,11 +54,8 @@ int get(const settings& options, const arguments& given) {
 }  // namespace
 
 action define_get(CLI::App& parser, settings& options) {
-    const auto given = std::make_shared<arguments>();
-    parser.add_option("dn", given->dn, "the entry")->type_name("DN")->required();
-    parser.add_option("attribute", given->attribute, "the attribute")
-        ->type_name("ATTR")
-        ->required();
+    const auto given = std::make_shared<attribute_of_entry>();
+    add_attribute_of_entry(parser, *given);
     return [given, &options] { return get(options, *given); };
 }
 

@@ -3,11 +3,12 @@
 #include <fcntl.h>
 #include <sodium.h>
 #include <unistd.h>
+#include <memory>
 
 #include <array>
 #include <cerrno>
 
-#include "choice_option.h"
+#include "arguments.h"
 #include "command.h"
 #include "disk.h"
 #include "private_folder.h"
@@ -52,11 +53,10 @@ int keygen(const arguments& given) {
 
 action define_keygen(CLI::App& parser, settings&) {
     const auto given = std::make_shared<arguments>();
-    parser.add_option("file", given->file, "the key file, which must not be there yet")
-        ->type_name("FILE")
-        ->required();
-    add_choice<size_t>(parser, "--bits", given->bytes, {{"128", 16}, {"192", 24}, {"256", 32}},
-                       "the size of the key; else 256");
+    add_argument(parser, "file", "FILE", "the key file, which must not be there yet", given->file,
+                 presence::required);
+    add_choice(parser, "--bits", "the size of the key; else 256", given->bytes,
+               {{"128", 16}, {"192", 24}, {"256", 32}});
     return [given] { return keygen(*given); };
 }
 

@@ -1,22 +1,19 @@
 // cfg32 passwd: sets a password from a prompt.
 
-#include <CLI/CLI.hpp>
+#include <memory>
 
 #include "LDIF_Value.h"
+#include "arguments.h"
 #include "change/attribute_change.h"
 #include "command.h"
 #include "hidden_passwords.h"
+#include "key.h"
 #include "outcome.h"
 #include "terminal.h"
 
 namespace cfg32::tool {
 
 namespace {
-
-struct arguments {
-    std::string dn;
-    std::string attribute;
-};
 
 /// The password, typed twice.
 secret ask_new_password(const std::string& attribute) {
@@ -45,7 +42,7 @@ std::string encoded(const std::string& attribute, const secret& password, const 
     }
 }
 
-int passwd(const settings& options, const arguments& given) {
+int passwd(const settings& options, const attribute_of_entry& given) {
     if (!is_password_attribute(given.attribute)) {
         throw ended(usage_error, given.attribute + " is no password: use `cfg32 set`");
     }
@@ -64,11 +61,8 @@ int passwd(const settings& options, const arguments& given) {
 }  // namespace
 
 action define_passwd(CLI::App& parser, settings& options) {
-    auto given = std::make_shared<arguments>();
-    parser.add_option("dn", given->dn, "the entry")->type_name("DN")->required();
-    parser.add_option("attribute", given->attribute, "the password's attribute")
-        ->type_name("ATTR")
-        ->required();
+    auto given = std::make_shared<attribute_of_entry>();
+    add_attribute_of_entry(parser, *given);
     return [&options, given] { return passwd(options, *given); };
 }
 

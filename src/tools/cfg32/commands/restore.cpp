@@ -2,10 +2,10 @@
 
 #include <fmt/format.h>
 #include <sys/stat.h>
-
-#include <CLI/CLI.hpp>
+#include <memory>
 
 #include "LDIF_File.h"
+#include "arguments.h"
 #include "check/check_report.h"
 #include "check/problem.h"
 #include "command.h"
@@ -103,10 +103,9 @@ int restore(const settings& options, const arguments& given) {
 
 action define_restore(CLI::App& parser, settings& options) {
     const auto given = std::make_shared<arguments>();
-    parser.add_option("backup", given->backup, "the backup; else FILE.bak")->type_name("BACKUP");
-    parser.add_flag("--yes", given->is_confirmed, "don't ask");
-    parser.footer("What is replaced is kept as FILE.before-restore, or where --backup says.\n" +
-                  parser.get_footer());
+    add_argument(parser, "backup", "BACKUP", "the backup; else FILE.bak", given->backup);
+    add_flag(parser, "--yes", "don't ask", given->is_confirmed);
+    add_footer(parser, "What is replaced is kept as FILE.before-restore, or where --backup says.");
     return [given, &options] { return restore(options, *given); };
 }
 

@@ -4,12 +4,10 @@
 
 #include <algorithm>
 #include <memory>
-#include <nlohmann/json.hpp>
 
 #include "LDIF_AttrType.h"
-#include "choice_option.h"
+#include "arguments.h"
 #include "command.h"
-#include "json_text.h"
 #include "outcome.h"
 #include "schema/attribute_json.h"
 #include "schema/attribute_words.h"
@@ -42,8 +40,6 @@ void print_table(const row_list& rows) {
     }
 }
 
-void print_as_json(const row_list& rows) { print_json(attributes_json(rows)); }
-
 void print_markdown(const row_list& rows) {
     fmt::print("| attribute | syntax | values | accepts | example |\n|---|---|---|---|---|\n");
     for (const _AttrType* row : rows) {
@@ -57,13 +53,11 @@ void print_markdown(const row_list& rows) {
 action define_schema(CLI::App& parser, settings& options) {
     using printer = void (*)(const row_list& rows);
     const auto print = std::make_shared<printer>(print_table);
-    const auto format = add_choice<printer>(
-        parser, "--format", *print,
-        {{"table", print_table}, {"json", print_as_json}, {"markdown", print_markdown}},
-        "how to print the list; else as a table");
-    parser.get_option("--json")->description("the same as --format json")->excludes(format);
+    add_format(
+        parser, "how to print the list; else as a table", *print,
+        {{"table", print_table}, {"json", print_attributes_json}, {"markdown", print_markdown}});
     return [print, &options] {
-        (options.is_json ? print_as_json : *print)(all_attributes());
+        (options.is_json ? print_attributes_json : *print)(all_attributes());
         return done;
     };
 }

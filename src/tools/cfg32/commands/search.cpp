@@ -1,12 +1,12 @@
 // cfg32 search: prints entries.
 
 #include <fmt/format.h>
+#include <memory>
 
 #include <algorithm>
-#include <nlohmann/json.hpp>
 
+#include "arguments.h"
 #include "cfg32.h"
-#include "choice_option.h"
 #include "command.h"
 #include "configuration.h"
 #include "json_text.h"
@@ -99,21 +99,11 @@ std::vector<entry> found_entries(const configuration& file, const arguments& giv
     return entries;
 }
 
-void print_as_json(const configuration& file, const std::vector<entry>& entries) {
-    json list = json::array();
-    for (const entry& found : entries) {
-        list.push_back(json_of(found));
-    }
-    print_json({{"file", utf8(file.name())},
-                {"entries", std::move(list)},
-                {"leftOut", json_of(file.left_out())}});
-}
-
 int search(const settings& options, const arguments& given) {
     const configuration file(options);
     const std::vector<entry> entries = found_entries(file, given);
     if (options.is_json) {
-        print_as_json(file, entries);
+        print_entries(entries, file);
     } else {
         for (const entry& found : entries) {
             fmt::print("{}", ldif(found, !given.is_not_wrapped));
@@ -126,19 +116,15 @@ int search(const settings& options, const arguments& given) {
 
 action define_search(CLI::App& parser, settings& options) {
     const auto given = std::make_shared<arguments>();
-    parser.add_option("-b,--base", given->base, "where to begin; else cn=Configuration")
-        ->type_name("DN");
-    add_choice<int>(
-        parser, "-s,--scope", given->scope,
-        {{"base", CFG_SCOPE_BASE}, {"one", CFG_SCOPE_ONELEVEL}, {"sub", CFG_SCOPE_SUBTREE}},
-        "that entry, those directly below it, or all from it on; else sub");
-    parser.add_flag("--no-wrap", given->is_not_wrapped, "don't fold long lines");
-    parser
-        .add_option("filter", given->filter,
-                    "attribute=value, or attribute=* for any value; else every entry")
-        ->type_name("FILTER");
-    parser.add_option("attributes", given->attributes, "the attributes to print; else all")
-        ->type_name("ATTR");
+    add_argument(parser, "-b,--base", "DN", "where to begin; else cn=Configuration", given->base);
+    add_choice(parser, "-s,--scope",
+               "that entry, those directly below it, or all from it on; else sub", given->scope,
+               {{"base", CFG_SCOPE_BASE}, {"one", CFG_SCOPE_ONELEVEL}, {"sub", CFG_SCOPE_SUBTREE}});
+    add_flag(parser, "--no-wrap", "don't fold long lines", given->is_not_wrapped);
+    add_argument(parser, "filter", "FILTER",
+                 "attribute=value, or attribute=* for any value; else every entry", given->filter);
+    add_argument(parser, "attributes", "ATTR", "the attributes to print; else all",
+                 given->attributes);
     return [given, &options] {
         tell_filter_from_attribute(*given);
         if (!given->filter.empty()) {

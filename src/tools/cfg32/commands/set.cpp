@@ -1,7 +1,8 @@
 // cfg32 set: gives an attribute these values.
 
-#include <CLI/CLI.hpp>
+#include <memory>
 
+#include "arguments.h"
 #include "change/attribute_change.h"
 #include "command.h"
 #include "outcome.h"
@@ -11,9 +12,7 @@ namespace cfg32::tool {
 
 namespace {
 
-struct arguments {
-    std::string dn;
-    std::string attribute;
+struct arguments : attribute_of_entry {
     std::vector<std::string> values;
     bool takes_any_name = false;
 };
@@ -42,17 +41,12 @@ int set(const settings& options, const arguments& given) {
 
 action define_set(CLI::App& parser, settings& options) {
     auto given = std::make_shared<arguments>();
-    parser.add_option("dn", given->dn, "the entry")->type_name("DN")->required();
-    parser.add_option("attribute", given->attribute, "the attribute to set")
-        ->type_name("ATTR")
-        ->required();
-    parser
-        .add_option("value", given->values,
-                    "all the values it is to have; \"--\" goes before one like \"-x\"")
-        ->type_name("VALUE")
-        ->required();
-    parser.add_flag("--unknown-attribute", given->takes_any_name,
-                    "take a name that the server does not know");
+    add_attribute_of_entry(parser, *given);
+    add_argument(parser, "value", "VALUE",
+                 "all the values it is to have; \"--\" goes before one like \"-x\"", given->values,
+                 presence::required);
+    add_flag(parser, "--unknown-attribute", "take a name that the server does not know",
+             given->takes_any_name);
     return [&options, given] { return set(options, *given); };
 }
 

@@ -2,6 +2,7 @@
 
 #include <fmt/format.h>
 #include <langinfo.h>
+#include <memory>
 
 #include <algorithm>
 #include <array>
@@ -9,7 +10,7 @@
 #include <set>
 
 #include "LDIF_File.h"
-#include "choice_option.h"
+#include "arguments.h"
 #include "command.h"
 #include "configuration.h"
 #include "json_text.h"
@@ -144,9 +145,7 @@ void print_as_json(const configuration& file, const LDIF_Entry& base) {
                         {"depth", depth_below(base, node, file.root())},
                         {"missingAncestors", std::move(missing)}});
     });
-    print_json({{"file", utf8(file.name())},
-                {"entries", std::move(list)},
-                {"leftOut", json_of(file.left_out())}});
+    print_objects(std::move(list), file);
 }
 
 int tree(const settings& options, const arguments& given) {
@@ -164,10 +163,9 @@ int tree(const settings& options, const arguments& given) {
 
 action define_tree(CLI::App& parser, settings& options) {
     const auto given = std::make_shared<arguments>();
-    add_choice<drawing_style>(parser, "--style", given->style,
-                              {{"unicode", unicode}, {"ascii", ascii}, {"cp437", cp437}},
-                              "the characters to draw with; else what the locale has");
-    parser.add_option("base", given->base, "the entry to begin at; else all")->type_name("DN");
+    add_choice(parser, "--style", "the characters to draw with; else what the locale has",
+               given->style, {{"unicode", unicode}, {"ascii", ascii}, {"cp437", cp437}});
+    add_argument(parser, "base", "DN", "the entry to begin at; else all", given->base);
     return [given, &options] { return tree(options, *given); };
 }
 

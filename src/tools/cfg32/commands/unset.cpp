@@ -1,7 +1,8 @@
 // cfg32 unset: removes an attribute, or some of its values.
 
-#include <CLI/CLI.hpp>
+#include <memory>
 
+#include "arguments.h"
 #include "change/attribute_change.h"
 #include "command.h"
 
@@ -9,9 +10,7 @@ namespace cfg32::tool {
 
 namespace {
 
-struct arguments {
-    std::string dn;
-    std::string attribute;
+struct arguments : attribute_of_entry {
     std::vector<std::string> values;
 };
 
@@ -19,12 +18,9 @@ struct arguments {
 
 action define_unset(CLI::App& parser, settings& options) {
     auto given = std::make_shared<arguments>();
-    parser.add_option("dn", given->dn, "the entry")->type_name("DN")->required();
-    parser.add_option("attribute", given->attribute, "the attribute")
-        ->type_name("ATTR")
-        ->required();
-    parser.add_option("value", given->values, "the values to remove; without any, all of them")
-        ->type_name("VALUE");
+    add_attribute_of_entry(parser, *given);
+    add_argument(parser, "value", "VALUE", "the values to remove; without any, all of them",
+                 given->values);
     return [&options, given] {
         require_no_secrets(given->attribute, given->values);
         return change_attribute(options, given->dn,

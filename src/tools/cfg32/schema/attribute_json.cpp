@@ -6,15 +6,14 @@
 #include <string>
 
 #include "LDIF_AttrType.h"
+#include "json_text.h"
 #include "schema/attribute_words.h"
-
-using nlohmann::ordered_json;
 
 namespace cfg32::tool {
 
 namespace {
 
-void add_bounds(ordered_json& object, const value_bounds& bounds) {
+void add_bounds(json& object, const value_bounds& bounds) {
     if (bounds.what == bounded::number) {
         object["minimum"] = bounds.minimum;
         object["maximum"] = bounds.maximum;
@@ -27,8 +26,8 @@ void add_bounds(ordered_json& object, const value_bounds& bounds) {
     }
 }
 
-ordered_json attribute_json(const _AttrType& row) {
-    ordered_json object;
+json attribute_json(const _AttrType& row) {
+    json object;
     object["name"] = row.name;
     object["syntax"] = syntax_name(row);
     object["description"] = syntax_in_words(row);
@@ -48,12 +47,12 @@ ordered_json attribute_json(const _AttrType& row) {
 
 }  // namespace
 
-ordered_json attributes_json(const std::vector<const _AttrType*>& rows) {
-    ordered_json list = ordered_json::array();
+void print_attributes_json(const std::vector<const _AttrType*>& rows) {
+    json list = json::array();
     for (const _AttrType* row : rows) {
         list.push_back(attribute_json(*row));
     }
-    return {{"attributes", list}};
+    print_json({{"attributes", list}});
 }
 
 }  // namespace cfg32::tool
