@@ -28,3 +28,13 @@ under another name it is copied:
     cfg32: oruslapd.conf:850: Invalid character in RDN attribute: n; oruslapd.conf.bak stays as it is (name another file to copy to)
     [1]
     $ cfg32 -f oruslapd.conf backup broken && cmp oruslapd.conf broken
+
+It waits for one who is writing, but not for ever:
+
+    $ cfg32 -f oruslapd.conf --no-backup restore --yes copy > diff
+    $ flock oruslapd.conf cfg32 -f oruslapd.conf backup late
+    cfg32: oruslapd.conf: in use by another process [DSA is busy (51)]
+    [3]
+    $ ls late
+    ls: cannot access 'late': No such file or directory
+    [2]

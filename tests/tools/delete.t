@@ -40,8 +40,9 @@ What is not there can't be deleted:
       entry: cn=Listener, cn=Network, cn=Configuration
     [3]
     $ cfg32 -f conf delete ""
-    cfg32: conf: The lines above all entries can only be modified [Invalid DN syntax (34)]
-    [3]
+    cfg32: dn: is empty
+      hint: `cfg32 delete --help` tells what there is
+    [2]
     $ cfg32 -f conf delete "no name"
     cfg32: conf: Invalid character in RDN attribute: n [Invalid DN syntax (34)]
       entry: no name

@@ -233,3 +233,60 @@ A file that can't be loaded is edited until it can:
     
     dn: cn=Configuration
     cn: x
+
+Without room for it the file stays as it was, and the edit is kept:
+
+    $ state_of broken.conf > state
+    $ edit_by 'ulimit -S -f unlimited; yes "# a comment" | head -1000 > comments; cat comments "$1" > both; cat both > "$1"'
+    $ (ulimit -S -f 8; cfg32 -f broken.conf edit 2>&1 || echo "[$?]") | sed "s|$TMPDIR/cfg32-[^/]*|PRIVATE|"
+    what you edited is kept in PRIVATE/broken.conf
+    cfg32: broken.conf: System error writing file [Unknown error (80)]
+      system error: File too large
+    [3]
+    $ state_of broken.conf | cmp - state
+    $ cat private/*/* | wc -l && rm -r private/*
+    1005
+
+So it is when an editor moves the draft away, or keeps it locked:
+
+    $ edit_by 'mv "$1" "$1.new"'
+    $ cfg32 -f broken.conf edit 2>&1 | sed "s|$TMPDIR/cfg32-[^/]*|PRIVATE|"
+    what you edited is kept in PRIVATE
+    cfg32: PRIVATE/broken.conf: No such file or directory [Connection error (91)]
+    [3]
+    $ ls private/* && rm -r private/*
+    broken.conf.new
+    $ edit_by '(flock 9; sleep 3) 9< "$1" > /dev/null 2>&1 & sleep 0.2; echo "# more" >> "$1"'
+    $ cfg32 -f broken.conf edit && tail -1 broken.conf
+    # more
+
+Of an entry's draft the lines are the draft's, and of the rest the file's:
+
+    $ . "$TOOLS/scratch.sh"
+    $ edit_by 'printf "oru-slapdPort: 1\noru-slapdPort: 2\n" >> "$1"'
+    $ in_terminal '(d)rop?' d -- cfg32 -f oruslapd.conf edit "$listener"
+    PRIVATE/oruslapd.conf:10:16: error: another value of oru-slapdPort, which takes only one; the first one stands on line 7 [second-value]
+       10 | oru-slapdPort: 1
+          |                ^
+          = accepted: one value
+    PRIVATE/oruslapd.conf:11:16: error: another value of oru-slapdPort, which takes only one; the first one stands on line 7 [second-value]
+       11 | oru-slapdPort: 2
+          |                ^
+          = accepted: one value
+    2 errors
+    (e)dit again, (w)rite or (d)rop? d
+    cfg32: dropped; nothing was written
+    [1]
+    $ edit_by 'sed -i "s/^dn:.*/dn: cn=Referrals, cn=Network, cn=Configuration\n# 1\n# 2/" "$1"'
+    $ in_terminal '(d)rop?' d -- cfg32 -f oruslapd.conf edit "$listener"
+    oruslapd.conf:170:5: warning: entry stands twice, the first one on line 2 of what you edited; the next rewrite merges them [duplicate-entry]
+      170 | dn: cn=Referrals, cn=Network, cn=Configuration
+          |     ^~~~~~~~~~~~~~~~~~~~~~~~~~~~~~~~~~~~~~~~~~
+    oruslapd.conf:171:5: error: another value of cn, which takes only one; the first one stands on line 5 of what you edited [second-value]
+      171 | cn: Referrals
+          |     ^~~~~~~~~
+          = accepted: one value
+    1 error, 1 warning
+    (e)dit again, (w)rite or (d)rop? d
+    cfg32: dropped; nothing was written
+    [1]

@@ -363,7 +363,7 @@ TEST(FindProblems, SaysWhatALoadDoesWithADamagedFile) {
     mutation mutate;
     int loaded = 0;
     int rewritten = 0;
-    constexpr int rounds = 2000;
+    constexpr int rounds = 700;
     for (int i = 0; i < rounds && !testing::Test::HasFailure(); ++i) {
         std::string text = example;
         for (size_t count = 1 + mutate.below(4); count > 0 && !text.empty(); --count) {

@@ -105,3 +105,38 @@ A missing argument is a usage error:
     cfg32: attribute is required
       hint: `cfg32 get --help` tells what there is
     [2]
+
+What a message shows can't control a terminal:
+
+    $ cfg32 -f "$(printf 'a\033[31m')" get cn=x cn
+    cfg32: a?[31m: No such file or directory [Connection error (91)]
+    [3]
+
+What a value holds can't control a terminal either; a program gets it as it is:
+
+    $ printf 'dn: cn=x\nnuv-instanceDesc: \033[8mx\302\2331m\n' > control.conf
+    $ "$TOOLS"/in_terminal -- cfg32 -f control.conf get cn=x nuv-instanceDesc
+    ?[8mx?1m
+    $ cfg32 -f control.conf get cn=x nuv-instanceDesc | od -An -c | tr -s ' '
+     033 [ 8 m x 302 233 1 m \n
+    $ cfg32 -f control.conf search -b cn=x
+    dn: cn=x
+    nuv-instanceDesc:: G1s4bXjCmzFt
+    
+    $ printf 'dn: cn=x\nnuv-instanceDesc: y\n' > other.conf
+    $ cfg32 diff --format text control.conf other.conf
+      cn=x
+    -   nuv-instanceDesc: ?[8mx?1m
+    +   nuv-instanceDesc: y
+    [1]
+    $ cfg32 -f control.conf restore -n other.conf
+    other.conf:2:1: error: no entry "cn=Configuration": nobody can bind as administrator [missing-configuration]
+        2 | nuv-instanceDesc: y
+          | ^
+    1 error
+    --- control.conf
+    +++ control.conf
+    @@ -1,2 +1,2 @@
+     dn: cn=x
+    -nuv-instanceDesc: ?[8mx?1m
+    +nuv-instanceDesc: y

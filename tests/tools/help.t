@@ -108,3 +108,57 @@ Help that did not arrive is a failure:
     $ cfg32 --version >/dev/full
     cfg32: standard output can't be written
     [3]
+
+Every word means itself; a list in brackets is no list:
+
+    $ . "$TOOLS/scratch.sh"
+    $ entry="cn=Referrals, cn=Network, cn=Configuration"
+    $ cfg32 -f oruslapd.conf unset "$entry" oru-slapdReferral '[]' '[a,b]'
+    unchanged
+    $ cfg32 -f oruslapd.conf set "$entry" oru-slapdReferral '[ldap://a:389,ldap://b:389]' '{}' '%%' -- '[--x]' -n -y set
+    $ cfg32 -f oruslapd.conf get "$entry" oru-slapdReferral
+    [ldap://a:389,ldap://b:389]
+    {}
+    %%
+    [--x]
+    -n
+    -y
+    set
+    $ cfg32 check '[a,b]'
+    cfg32: [a,b]: No such file or directory [Connection error (91)]
+    [3]
+    $ cfg32 explain '[cn]'
+    cfg32: no attribute is called [cn]
+    [1]
+    $ cfg32 -f '[x]' get cn=x cn
+    cfg32: [x]: No such file or directory [Connection error (91)]
+    [3]
+    $ cfg32 keygen k --bits '[128]' 2>&1 | head -1
+    cfg32: --bits: [128] not in {128,192,256}
+
+An empty word comes from a variable that is not set: it is no name, no DN and no file. Of commands
+that would take another one's place for it, none does anything:
+
+    $ for command in "get XX cn" "get cn=x XX" "set XX charset x" "unset cn=Configuration XX" \
+    >     "edit XX" "restore --yes XX" "backup XX" "modify -l XX" "delete XX" "tree XX" "check XX" \
+    >     "search -b XX" "search XX" "apply XX" "keygen XX" "-f XX tree" "tree -D XX"; do
+    >     words=(); for word in $command; do words+=("${word/XX/}"); done
+    >     cfg32 "${words[@]}" 2> message; echo "$? $(head -1 message)"
+    > done
+    2 cfg32: dn: is empty
+    2 cfg32: attribute: is empty
+    2 cfg32: dn: is empty
+    2 cfg32: attribute: is empty
+    2 cfg32: dn: is empty
+    2 cfg32: backup: is empty
+    2 cfg32: backup: is empty
+    2 cfg32: --ldif: is empty
+    2 cfg32: dn: is empty
+    2 cfg32: base: is empty
+    2 cfg32: file: is empty
+    2 cfg32: --base: is empty
+    2 cfg32: filter: is empty
+    2 cfg32: wanted: is empty
+    2 cfg32: file: is empty
+    2 cfg32: --file: is empty
+    2 cfg32: --bind-dn: is empty

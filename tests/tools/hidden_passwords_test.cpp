@@ -63,6 +63,18 @@ const row lines[] = {
     {"oru-slapdInvalidLine: oru-slapdAdm: inPW: secret",
      "oru-slapdInvalidLine: oru-slapdAdm: ********"},
     {"oru-slapdInvalidLine: oru-slapdPort: pass", ""},
+    // Of a line that was not ended, or with a name that was broken.
+    {"oru-slapdPort: 389 oru-slapdAdminPW: secret",
+     "oru-slapdPort: 389 oru-slapdAdminPW: ********"},
+    {"oru-slapdPort: xoru-slapdAdminPW: secret", "oru-slapdPort: xoru-slapdAdminPW: ********"},
+    {"x: oru-slapdAdminPW= secret", "x: oru-slapdAdminPW= ********"},
+    {"x: oru-slapdAdminPW: {AES256}abc", ""},
+    {"# old value: oru-slapdAdminPW: secret", "# old value: oru-slapdAdminPW: ********"},
+    {"oru-slapdAdm:inPW: secret", "oru-slapdAdm:inPW: ********"},
+    {"oru-slap::dAdminPW: secret", "oru-slap::dAdminPW: ********"},
+    {"oru\u2010slapd\u2010Admin\u2010P\u2010W: secret",
+     "oru\u2010slapd\u2010Admin\u2010P\u2010W: ********"},
+    {"nuv-instanceDesc: the adminPW of old, see below: none", ""},
     // What is not seen of a line.
     {"\roru-slapdAdminPW: secret\r", "\roru-slapdAdminPW: ********"},
     {"oru-slapd\rAdminPW: secret", "oru-slapd\rAdminPW: ********"},
@@ -80,6 +92,37 @@ TEST(HiddenPasswords, AreNotSeenInALine) {
     for (const row& each : lines) {
         EXPECT_EQ(shown_line(each.given), each.shown.empty() ? each.given : each.shown);
     }
+}
+
+TEST(HiddenPasswords, WhatIsKeptInWhatIsKeptIsHidden) {
+    std::string line = "oru-slapdAdminPW: secret";
+    for (int i = 0; i < 20000; ++i) {
+        line = "oru-slapdInvalidLine: " + line;
+    }
+    EXPECT_EQ(shown_line(line).find("secret"), std::string::npos);
+    std::string kept = "oru-slapdInvalidLine: ";
+    for (int i = 0; i < 40; ++i) {
+        kept += "oru-slapdInvalidLine=";
+    }
+    EXPECT_EQ(shown_line(kept + "z: z: z: z").find('z'), std::string::npos);
+}
+
+TEST(HiddenPasswords, TheLineBelowANameWithoutAPasswordIsOne) {
+    EXPECT_TRUE(is_password_below("oru-slapdAdminPW:", "secret"));
+    EXPECT_TRUE(is_password_below("oru-slapdAdminPW: \r", "secret"));
+    EXPECT_FALSE(is_password_below("oru-slapdAdminPW: x", "secret"));
+    EXPECT_FALSE(is_password_below("oru-slapdAdminPW:", "cn: x"));
+    EXPECT_FALSE(is_password_below("oru-slapdAdminPW:", "# x"));
+    EXPECT_FALSE(is_password_below("oru-slapdAdminPW:", ""));
+    EXPECT_FALSE(is_password_below("oru-slapdPort:", "secret"));
+    const std::vector<std::string> given = {"oru-slapdAdminPW:", "Isar:", "x:"};
+    const std::vector<std::string> shown = {"oru-slapdAdminPW:", "********", "x:"};
+    EXPECT_EQ(shown_values("oru-slapdInvalidLine", given), shown);
+}
+
+TEST(HiddenPasswords, AreNotSeenInAMessage) {
+    EXPECT_EQ(shown_text("entry: cn=xoru-slapdAdminPW: secret\nport: 1\n"),
+              "entry: cn=xoru-slapdAdminPW: ********\nport: 1\n");
 }
 
 struct value_row {

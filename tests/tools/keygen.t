@@ -37,3 +37,12 @@ The key serves:
     $ . "$TOOLS/scratch.sh"
     $ cfg32 -f oruslapd.conf --key-file new.key get cn=Configuration cn
     Configuration
+
+A disk that is full leaves no piece of a key:
+
+    $ (ulimit -f 0; cfg32 keygen full.key 2>&1 || echo "[$?]") | cat
+    cfg32: full.key: File too large
+    [3]
+    $ ls full.key
+    ls: cannot access 'full.key': No such file or directory
+    [2]

@@ -27,7 +27,9 @@ TEST(LdifLine, StandsAsItIsOrInBase64) {
         {std::string("a\0b", 3), "x:: YQBi\n"},
         {"\xc3\xb6", "x:: w7Y=\n"},
         {"\xff", "x:: /w==\n"},
-        {"\x7f\t", "x: \x7f\t\n"},
+        {"a\tb", "x: a\tb\n"},
+        {"\x7f", "x:: fw==\n"},
+        {"\x1b[8m", "x:: G1s4bQ==\n"},
     };
     for (const auto& row : rows) {
         EXPECT_EQ(ldif_line("x", row.value), row.expected);

@@ -224,8 +224,16 @@ delete, and a last line without newline may have lost its end. No password is qu
     cfg32: standard input:3: the last line has no newline at its end, as if it were cut off
     [3]
     $ printf 'dn: cn=Configuration\nreplace: oru-slapdAdminPW: Isar\n-\n' | cfg32 -f conf modify
-    cfg32: standard input:2: "oru-slapdAdminPW: ********" is not an attribute's name
+    cfg32: standard input:2: "oru-slapdAdminPW ..." is not an attribute's name
     [3]
+    $ printf 'dn: cn=Configuration\nreplace: oru-slapdAdmn Isar\n-\n' | cfg32 -f conf modify
+    cfg32: standard input:2: "oru-slapdAdmn ..." is not an attribute's name
+    [3]
+    $ printf 'dn: cn=Configuration\nchangetype:\n modify\n oru-slapdAdminPW: Isar\n' | cfg32 -f conf modify
+    cfg32: standard input:2: "modifyoru-slapdAdminPW" is no changetype: add, modify and delete are
+    [3]
+    $ printf 'dn: cn=Configuration\nreplace: oru-slapdPort\noru-slapdPort: 390\n oru-slapdAdminPW: Isar\n' | cfg32 -f conf modify 2>&1 | grep Isar
+    [1]
     $ cfg32 -f conf modify < .
     cfg32: standard input: Is a directory
     [3]
@@ -262,5 +270,6 @@ A backup that can't be made keeps the change from the file, when there is one:
     $ head -n 3 failing.ldif | cfg32 -f conf --backup /nowhere/conf modify
     cfg32: conf: Unable to backup the configuration file: "conf"  [Insufficient access (50)]
       system error: No such file or directory
+      backup: /nowhere/conf
     [3]
     $ stat -c "%y %z %i" conf conf.bak | cmp - before

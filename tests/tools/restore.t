@@ -134,3 +134,39 @@ Where the replaced file goes can be said, but not over what is restored:
     $ rm -f oruslapd.conf.bak; cfg32 -f oruslapd.conf restore --yes
     cfg32: oruslapd.conf.bak: No such file or directory [Connection error (91)]
     [3]
+
+Without room for it the file stays as it was:
+
+    $ printf 'dn: cn=Configuration\ncn: x\n' > oruslapd.conf
+    $ state_of oruslapd.conf > state
+    $ (ulimit -f 8; cfg32 -f oruslapd.conf restore --yes original 2>&1 || echo "[$?]") | tail -3
+    cfg32: oruslapd.conf: System error writing file [Unknown error (80)]
+      system error: File too large
+    [3]
+    $ state_of oruslapd.conf | cmp - state
+
+What can't be shown is not done:
+
+    $ cp original oruslapd.conf && state_of oruslapd.conf > state
+    $ cfg32 -f oruslapd.conf restore --yes changed > /dev/full
+    cfg32: standard output can't be written
+    [3]
+    $ state_of oruslapd.conf | cmp - state
+
+Of a file that is gone the backup knows the administrator:
+
+    $ cp original backup && rm oruslapd.conf && echo wrong > password
+    $ cfg32 -f oruslapd.conf --key-file oruslapd.key -D cn=root -y password restore --yes backup
+    cfg32: backup: not the administrator's DN and password [Invalid credentials (49)]
+    [3]
+    $ ls oruslapd.conf
+    ls: cannot access 'oruslapd.conf': No such file or directory
+    [2]
+
+Where a symbolic link means the file that is gone, it is made there:
+
+    $ mkdir real && ln -s real/link oruslapd.conf && ln -s conf real/link
+    $ cfg32 -f oruslapd.conf restore --yes backup > diff
+    $ cmp backup real/conf && readlink oruslapd.conf real/link
+    real/link
+    conf

@@ -149,3 +149,30 @@ Reading leaves the file alone:
     $ state_of oruslapd.conf > before
     $ cfg32 -f oruslapd.conf search > all.ldif
     $ state_of oruslapd.conf | cmp - before
+
+Text that the locale has no characters for is told as that:
+
+    $ printf 'dn: cn=Configuration\ncn: x\n' > ascii.conf
+    $ LC_ALL=C cfg32 -f ascii.conf search cn=Jörg
+    cfg32: ascii.conf: text that is not of the locale's character set [Unusable input character (162)]
+    [3]
+
+Two attributes whose names hide a password, and so look the same, both show their values:
+
+    $ printf 'dn: cn=Configuration\noru-slapdAdminPW one: 1\noru-slapdAdminPW two: 2\n' > meet.conf
+    $ cfg32 -f meet.conf --json search
+    {
+      "file": "meet.conf",
+      "entries": [
+        {
+          "dn": "cn=Configuration",
+          "attributes": {
+            "oru-slapdAdminPW ********": [
+              "********",
+              "********"
+            ]
+          }
+        }
+      ],
+      "leftOut": []
+    }

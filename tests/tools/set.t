@@ -217,3 +217,19 @@ JSON is UTF-8, whatever the file's name is:
       "dryRun": false,
       "skipped": []
     }
+
+A signal at any time leaves the file as it was, or with the change, and nothing beside it:
+
+    $ . "$TOOLS/scratch.sh"
+    $ mkdir signals && cp oruslapd.conf signals/conf
+    $ cfg32 -f signals/conf set cn=Configuration oru-slapdVersion 1
+    $ sed '/^oru-slapdVersion/d' signals/conf > rest
+    $ for i in $(seq 100 130); do
+    >     timeout -s INT "0.0$((i % 20 + 1))" cfg32 -f signals/conf set cn=Configuration oru-slapdVersion $i
+    >     sed '/^oru-slapdVersion/d' signals/conf | cmp - rest
+    >     grep -c '^oru-slapdVersion: ' signals/conf
+    > done | sort -u
+    1
+    $ ls -A signals
+    conf
+    conf.bak

@@ -9,6 +9,8 @@
 #include <iterator>
 
 #include "LDIF_Exception.h"
+#include "LDIF_File.h"
+#include "after_reading.h"
 #include "cfg32.h"
 #include "cfg32_platform.h"
 #include "change/ldif_reader.h"
@@ -386,6 +388,37 @@ TEST_F(update_test, GivesUpOnRecordsThatWereMadeForAnotherText) {
         failure_of("dn: cn=a, cn=Configuration\nreplace: oru-slapdPort\noru-slapdPort: 1\n"),
         testing::HasSubstr("DSA is busy (51)"));
     EXPECT_EQ(folder.read("conf"), small);
+}
+
+TEST_F(update_test, BeginsAgainWithWhatSomebodyElseWroteMeanwhile) {
+    std::string before = small;
+    for (int i = 0; i < 2000; ++i) {  // it takes a while to load
+        before += "dn: cn=e" + std::to_string(i) + ", cn=a, cn=Configuration\ncn: e\n\n";
+    }
+    const std::string theirs = before + "dn: cn=theirs, cn=Configuration\ncn: theirs\n\n";
+    constexpr int most_tries = 100;
+    for (int i = 0; i < most_tries; ++i) {
+        folder.write("conf", before);
+        bool were_faster = false;
+        update_result result;
+        {
+            const tests::after_reading somebody(options.file, [&] {
+                try {
+                    LDIF_File::replace(options.file, "", theirs, before);
+                    were_faster = true;
+                } catch (const LDIF_Exception&) {  // they came too late
+                }
+            });
+            result = change("dn: cn=ours, cn=Configuration\nchangetype: add\ncn: ours\n");
+        }
+        if (were_faster) {
+            EXPECT_EQ(result.before, theirs);
+            EXPECT_EQ(folder.read("conf"), theirs + "dn: cn=ours, cn=Configuration\ncn: ours\n\n");
+            EXPECT_EQ(folder.read("conf.bak"), theirs);
+            return;
+        }
+    }
+    FAIL() << "nobody else was fast enough";
 }
 
 TEST_F(update_test, TellsAllRecordsThatDoNotPassTheCheck) {

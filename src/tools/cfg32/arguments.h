@@ -4,25 +4,32 @@
 // compile than all that a command does: few files include it.
 
 #include <functional>
+#include <span>
 #include <string>
 #include <utility>
 #include <vector>
 
 namespace CLI {
 class App;
-}
+class ParseError;
+}  // namespace CLI
 
 namespace cfg32::tool {
 
 enum class presence { optional, required };
 
 /// Adds an argument ("dn") or an option with a value ("-b,--base"). The type is what stands for the
-/// value in the help.
+/// value in the help. An empty one is a usage error: it comes from a variable of a script that is
+/// not set, and means nothing that should be guessed.
 void add_argument(CLI::App& parser, const char* names, const char* type, const char* description,
                   std::string& value, presence needed = presence::optional);
 /// The same for all the arguments that follow.
 void add_argument(CLI::App& parser, const char* names, const char* type, const char* description,
                   std::vector<std::string>& values, presence needed = presence::optional);
+
+/// Adds an attribute's values: all the arguments that follow, also empty ones.
+void add_values(CLI::App& parser, const char* description, std::vector<std::string>& values,
+                presence needed = presence::optional);
 
 /// Adds an option without a value. One without a description is not in the help.
 void add_flag(CLI::App& parser, const char* names, const char* description, bool& value);
@@ -77,6 +84,12 @@ struct attribute_of_entry {
 
 /// Adds the arguments that name it.
 void add_attribute_of_entry(CLI::App& parser, attribute_of_entry& given);
+
+/// Parses the program's arguments, each as it is. Throws CLI::ParseError.
+void parse(CLI::App& parser, std::span<char* const> arguments);
+
+/// What the error says, with the words as they were given.
+std::string message_of(const CLI::ParseError& e);
 
 /// The parser of the whole command line, of which the given one is a command's.
 const CLI::App& program_of(const CLI::App& command);

@@ -43,15 +43,15 @@ bool is_read_differently(const problem& found) {
 /// What becomes of a line that is not used as it stands.
 const char* fate_of(const problem& found) {
     if (found.broken == &kind::missing_final_newline) {
-        return "its value is not used";
+        return "";  // the text tells it
     }
     switch (found.outcome()) {
         case consequence::kept_aside:
-            return "kept as oru-slapdInvalidLine";
+            return ", kept as oru-slapdInvalidLine";
         case consequence::loses_text:
-            return "cut off there";
+            return ", cut off there";
         default:
-            return "left out";
+            return ", left out";
     }
 }
 
@@ -107,13 +107,15 @@ void configuration::load(std::string_view text) {
 
 configuration::configuration(const settings& options)
     : configuration(options, options.file_name()) {
-    if (!options.bind_dn.empty()) {
-        bind(options.bind_dn.c_str(), options.bind_password().c_str());
-    }
+    bind(options);
 }
 
-void configuration::bind(const char* dn, const char* password) {
-    const int code = cfg_bind_s(handle_.get(), dn, password, CFG_AUTH_SIMPLE);
+void configuration::bind(const settings& options) {
+    if (options.bind_dn.empty()) {
+        return;
+    }
+    const int code = cfg_bind_s(handle_.get(), options.bind_dn.c_str(),
+                                options.bind_password().c_str(), CFG_AUTH_SIMPLE);
     if (code != CFG_SUCCESS) {
         fail(handle_.get(), code, name_);
     }
@@ -141,7 +143,7 @@ void tell_unused(const std::string& name, std::string_view what,
                  const std::vector<problem>& unused) {
     std::string message = fmt::format("{}: {} (`cfg32 check` tells more):", name, what);
     for (const problem& found : unused) {
-        message += fmt::format("\n  line {}: {}, {}", found.line, found.text, fate_of(found));
+        message += fmt::format("\n  line {}: {}{}", found.line, found.text, fate_of(found));
     }
     complain(message);
 }
@@ -166,9 +168,9 @@ std::vector<entry> configuration::search(const std::string& base, int scope,
     return entries;
 }
 
-void require_bind(const settings& options) {
+void require_bind(const settings& options, const std::string& file_name) {
     if (!options.bind_dn.empty()) {
-        const configuration bound(options);
+        configuration(options, file_name).bind(options);
     }
 }
 

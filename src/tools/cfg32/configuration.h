@@ -25,6 +25,8 @@ class configuration {
     configuration(const settings& options, const std::string& file_name);
     /// The file that the options name, bound to with their credentials.
     explicit configuration(const settings& options);
+    /// Binds as the options say. Ends the command when that fails.
+    void bind(const settings& options);
     /// A text that was read already, of the file of that name.
     configuration(const settings& options, std::string file_name, std::string text);
 
@@ -46,7 +48,6 @@ class configuration {
   private:
     bool is_loaded(std::string_view text);
     void load(std::string_view text);
-    void bind(const char* dn, const char* password);
     void note_left_out();
 
     std::string name_;
@@ -68,7 +69,7 @@ void tell_unused(const std::string& name, std::string_view what,
                  const std::vector<problem>& unused);
 
 /// Ends the command when the options name somebody who can't bind to the file.
-void require_bind(const settings& options);
+void require_bind(const settings& options, const std::string& file_name);
 
 /// An entry's printable form.
 entry entry_of(const LDIF_Entry& node);

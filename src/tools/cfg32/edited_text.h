@@ -23,7 +23,7 @@ class edited_text {
     /// The problems that a person should look at before a draft is written.
     struct findings {
         std::vector<problem> in_draft;   ///< their lines are those of the draft
-        std::vector<problem> elsewhere;  ///< new ones, and those that stop a load
+        std::vector<problem> elsewhere;  ///< new ones, and those that stop a load, by the file's
         bool is_loadable;                ///< the whole text with the draft
     };
     findings check(const std::string& draft, aes_key_data* key) const;

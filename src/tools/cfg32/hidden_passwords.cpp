@@ -3,6 +3,7 @@
 #include "hidden_passwords.h"
 
 #include <algorithm>
+#include <cctype>
 #include <optional>
 #include <vector>
 
@@ -164,13 +165,16 @@ meant_line meant_in_line(std::string_view text) {
     return is_comment ? meant_in_comment(text) : meant(text);
 }
 
+/// A line is kept once. What is kept in what was kept is not looked at for ever.
+constexpr int most_kept = 3;
+
 /// Where what is to be hidden begins.
-std::optional<size_t> hidden_from(std::string_view text);
+std::optional<size_t> hidden_from(std::string_view text, int kept_in = 0);
 
 /// The same of a line that was kept. A name that went on on the next line stands there with a colon
 /// where the line ended.
-std::optional<size_t> hidden_from_kept(std::string_view kept) {
-    if (const auto begin = hidden_from(kept)) {
+std::optional<size_t> hidden_from_kept(std::string_view kept, int kept_in = 1) {
+    if (const auto begin = hidden_from(kept, kept_in)) {
         return begin;
     }
     constexpr std::string_view inserted = ": ";
@@ -180,22 +184,61 @@ std::optional<size_t> hidden_from_kept(std::string_view kept) {
     }
     const size_t next = end + inserted.size();
     const std::string joined = std::string(kept.substr(0, end)).append(kept.substr(next));
-    return hidden_from(joined) ? std::optional(next) : std::nullopt;
+    return hidden_from(joined, kept_in) ? std::optional(next) : std::nullopt;
 }
 
-std::optional<size_t> hidden_from(std::string_view text) {
+std::optional<size_t> hidden_from(std::string_view text, int kept_in) {
     const meant_line line = meant_in_line(text);
     if (line.what == meant_line::other || line.value == text.size()) {
         return {};
     }
-    const std::string value(text.substr(line.value));
-    if (line.what == meant_line::kept) {
-        const auto begin = hidden_from_kept(value);
+    const std::string_view value = text.substr(line.value);
+    if (line.what == meant_line::kept && kept_in < most_kept) {
+        const auto begin = hidden_from_kept(value, kept_in + 1);
         return begin ? std::optional(line.value + *begin) : std::nullopt;
     }
     const bool is_visible =
-        line.what == meant_line::known_password && shown_password(value) == value;
+        line.what == meant_line::known_password && shown_password(std::string(value)) == value;
     return is_visible ? std::nullopt : std::optional(line.value);
+}
+
+/// Where a password begins whose name stands anywhere in a line: the line before was not ended, a
+/// name was broken by what no name has. A colon or "=" follows the name.
+std::optional<size_t> behind_any_name(std::string_view text) {
+    if (text.find_first_of(":=") == std::string_view::npos) {
+        return {};
+    }
+    std::string letters;
+    std::vector<size_t> places;
+    for (size_t i = 0; i < text.size(); ++i) {
+        if (is_ascii(text[i]) && isalnum(static_cast<unsigned char>(text[i]))) {
+            letters += text[i];
+            places.push_back(i);
+        }
+    }
+    letters = lower(letters);
+    std::optional<size_t> first;
+    for (const std::string& name : known_passwords()) {
+        for (size_t at = letters.find(name); at != std::string::npos;
+             at = letters.find(name, at + 1)) {
+            const size_t end = places[at + name.size() - 1] + 1;
+            const size_t next = text.find_first_not_of(" \t\"'", end);
+            if (next != std::string_view::npos && (text[next] == ':' || text[next] == '=')) {
+                first = std::min(behind_separators(text, next), first.value_or(text.size()));
+            }
+        }
+    }
+    return first;
+}
+
+/// A line of a text, without what stands behind any password's name.
+std::string without_any_password(std::string line) {
+    const auto begin = behind_any_name(line);
+    if (begin && *begin < line.size()) {
+        const std::string value = line.substr(*begin);
+        line.replace(*begin, std::string::npos, shown_password(value));
+    }
+    return line;
 }
 
 /// A line without what makes no difference to a reader: carriage returns, NULs, bytes that are no
@@ -245,10 +288,24 @@ std::string shown_value(std::string_view attribute, std::string_view value) {
         const judged_line judged(value);
         const auto begin = hidden_from_kept(judged.text());
         return begin ? std::string(value.substr(0, judged.place(*begin))).append(hidden_text)
-                     : std::string(value);
+                     : without_any_password(std::string(value));
     }
     const bool is_hidden = !value.empty() && is_password_line(std::string(attribute) + ":");
-    return std::string(is_hidden ? hidden_text : value);
+    return is_hidden ? std::string(hidden_text) : without_any_password(std::string(value));
+}
+
+std::vector<std::string> shown_values(std::string_view attribute,
+                                      const std::vector<std::string>& values) {
+    std::vector<std::string> shown;
+    std::string_view above;
+    for (const std::string& value : values) {
+        const std::string_view kept = std::string_view(value).substr(0, value.find(':'));
+        const bool is_below = cisString(std::string(attribute)) == kept_line_attribute &&
+                              is_password_below(above, kept);
+        shown.push_back(is_below ? std::string(hidden_text) : shown_value(attribute, value));
+        above = value;
+    }
+    return shown;
 }
 
 bool is_password_line(std::string_view line) {
@@ -260,7 +317,26 @@ std::string shown_line(std::string_view line) {
     const judged_line judged(line);
     const auto begin = hidden_from(judged.text());
     return begin ? std::string(line.substr(0, judged.place(*begin))).append(hidden_text)
-                 : std::string(line);
+                 : without_any_password(std::string(line));
+}
+
+bool is_password_below(std::string_view above, std::string_view line) {
+    const std::string_view ended = above.substr(0, above.find_last_not_of(" \t\r\n") + 1);
+    return ended.ends_with(':') && is_password_line(ended) && !line.empty() &&
+           line.find_first_of(":#") == std::string_view::npos;
+}
+
+std::string shown_text(std::string_view text) {
+    std::string shown;
+    for (;;) {
+        const size_t end = text.find('\n');
+        shown += without_any_password(std::string(text.substr(0, end)));
+        if (end == std::string_view::npos) {
+            return shown;
+        }
+        shown += '\n';
+        text.remove_prefix(end + 1);
+    }
 }
 
 }  // namespace cfg32::tool

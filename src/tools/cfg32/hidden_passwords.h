@@ -5,6 +5,7 @@
 
 #include <string>
 #include <string_view>
+#include <vector>
 
 namespace cfg32::tool {
 
@@ -22,6 +23,18 @@ std::string shown_value(std::string_view attribute, std::string_view value);
 /// password is hidden, also where the name is mistyped, the colon is missing, the line is a
 /// comment, or one that was kept because it can't be used. Only the end of the line differs.
 std::string shown_line(std::string_view line);
+
+/// The values of an attribute, each as it may be seen below the one before.
+std::vector<std::string> shown_values(std::string_view attribute,
+                                      const std::vector<std::string>& values);
+
+/// A message or a name as it may be seen: in each of its lines what stands behind a password's name
+/// and a colon is hidden.
+std::string shown_text(std::string_view text);
+
+/// True when the line is the password of the line above it, which has its name and no value: an
+/// editor may have broken it there.
+bool is_password_below(std::string_view above, std::string_view line);
 
 /// True when all that follows this line's name is a password.
 bool is_password_line(std::string_view line);

@@ -17,11 +17,11 @@ json json_of(const entry& printed) {
     for (const attribute& each : printed.attributes) {
         // Names of which a part is hidden may look the same.
         json& values = attributes.emplace(utf8(shown_line(each.name)), json::array()).first.value();
-        for (const std::string& value : each.values) {
-            values.push_back(utf8(shown_value(each.name, value)));
+        for (const std::string& value : shown_values(each.name, each.values)) {
+            values.push_back(utf8(value));
         }
     }
-    return {{"dn", utf8(printed.dn)}, {"attributes", std::move(attributes)}};
+    return {{"dn", utf8(shown_text(printed.dn))}, {"attributes", std::move(attributes)}};
 }
 
 json json_of(const std::vector<problem>& left_out) {

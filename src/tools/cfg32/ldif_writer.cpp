@@ -12,9 +12,10 @@ namespace {
 
 constexpr size_t line_length = 76;
 
-/// A value that stands in the text as it is (RFC 2849, SAFE-STRING, and no blank at its end).
+/// A value that stands in the text as it is (RFC 2849, SAFE-STRING, but without what steers a
+/// terminal, and with no blank at its end).
 bool is_safe(std::string_view value) {
-    const auto is_safe_byte = [](char c) { return c > 0 && c != '\n' && c != '\r'; };
+    const auto is_safe_byte = [](char c) { return (c >= ' ' && c < 0x7f) || c == '\t'; };
     return value.empty() ||
            (std::all_of(value.begin(), value.end(), is_safe_byte) && value.front() != ' ' &&
             value.front() != ':' && value.front() != '<' && value.back() != ' ');

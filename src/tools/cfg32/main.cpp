@@ -7,6 +7,7 @@
 #include <CLI/CLI.hpp>
 #include <algorithm>
 #include <clocale>
+#include <csignal>
 #include <cstdio>
 #include <iostream>
 #include <span>
@@ -37,42 +38,34 @@ class plain_help : public CLI::Formatter {
     }
 };
 
-/// An empty name is an unset variable of a script, and means nothing that should be guessed.
-const CLI::Validator not_empty(
-    [](const std::string& text) { return text.empty() ? std::string("is empty") : std::string(); },
-    "");
-
 constexpr const char* shared_options = "Options of every command";
 
 void add_shared_options(CLI::App& parser, settings& options) {
-    const auto add = [&](const char* names, std::string& value, const char* type,
-                         const char* description) {
-        return parser.add_option(names, value, description)
-            ->type_name(type)
-            ->check(not_empty)
-            ->group(shared_options);
-    };
-    const auto add_flag = [&](const char* names, bool& value, const char* description) {
-        return parser.add_flag(names, value, description)->group(shared_options);
-    };
-    add("-f,--file", options.file, "FILE", "the configuration file; else the server's own");
-    const auto dn =
-        add("-D,--bind-dn", options.bind_dn, "DN", "bind as the administrator; else anonymously");
-    const auto prompt =
-        add_flag("-W,--ask-password", options.asks_password, "with -D: ask for the password");
-    const auto file = add("-y,--password-file", options.password_file, "FILE",
-                          "with -D: the password is the first line of a file");
-    add("--key-file", options.key_file, "FILE", "the key of encoded passwords");
-    const auto backup = add("--backup", options.backup_option, "FILE",
-                            "where a change puts the file of before; else FILE.bak");
-    add_flag("--no-backup", options.has_no_backup, "make no backup")->excludes(backup);
-    prompt->needs(dn)->excludes(file);
-    file->needs(dn);
+    add_argument(parser, "-f,--file", "FILE", "the configuration file; else the server's own",
+                 options.file);
+    add_argument(parser, "-D,--bind-dn", "DN", "bind as the administrator; else anonymously",
+                 options.bind_dn);
+    add_flag(parser, "-W,--ask-password", "with -D: ask for the password", options.asks_password);
+    add_argument(parser, "-y,--password-file", "FILE",
+                 "with -D: the password is the first line of a file", options.password_file);
+    add_argument(parser, "--key-file", "FILE", "the key of encoded passwords", options.key_file);
+    add_argument(parser, "--backup", "FILE",
+                 "where a change puts the file of before; else FILE.bak", options.backup_option);
+    add_flag(parser, "--no-backup", "make no backup", options.has_no_backup);
     add_choice(parser, "--color", "else auto, which respects NO_COLOR", options.color,
                {{"auto", color_choice::automatic},
                 {"always", color_choice::always},
                 {"never", color_choice::never}});
-    parser.get_option("--color")->group(shared_options);
+    for (CLI::Option* option : parser.get_options()) {
+        if (option != parser.get_help_ptr() && option != parser.get_version_ptr()) {
+            option->group(shared_options);
+        }
+    }
+    exclude(parser, "--no-backup", "--backup");
+    exclude(parser, "-W", "-y");
+    for (const char* password : {"-W", "-y"}) {
+        parser.get_option(password)->needs(parser.get_option("-D"));
+    }
 }
 
 /// The options that go with a command's traits. They are taken before its name as well.
@@ -119,7 +112,7 @@ void require_useful(const settings& options, const command& chosen) {
 }
 
 /// The parser would take the next word for the value of "--option=".
-void require_values(std::span<char*> arguments) {
+void require_values(std::span<char* const> arguments) {
     for (const std::string_view argument : arguments) {
         if (argument == "--") {
             return;
@@ -134,7 +127,7 @@ int tell_usage_error(const CLI::App& parser, const CLI::ParseError& e) {
     const auto chosen = parser.get_subcommands();
     const std::vector<std::string> unknown = parser.remaining();
     const bool lacks_command = chosen.empty() && e.get_name() == "RequiredError";
-    const std::string message = !lacks_command    ? e.what()
+    const std::string message = !lacks_command    ? message_of(e)
                                 : unknown.empty() ? "no command is given"
                                                   : "no command is called " + unknown.front();
     complain(fmt::format("{}\n  hint: `cfg32 {}--help` tells what there is", message,
@@ -182,6 +175,7 @@ void choose_locale() {
 
 int main(int argc, char** argv) {
     keep_memory_private();
+    signal(SIGXFSZ, SIG_IGN);  // a file that may not grow is a failure like a full disk
     choose_locale();
     if (sodium_init() < 0) {
         complain("there is no source of random numbers");
@@ -197,8 +191,9 @@ int main(int argc, char** argv) {
     add_options_of(changes | prints, parser, options, "");
     const std::vector<parsed_command> all = add_commands(parser, options);
     try {
-        require_values({argv, static_cast<size_t>(argc)});
-        parser.parse(argc, argv);
+        const std::span<char* const> arguments(argv, static_cast<size_t>(argc));
+        require_values(arguments);
+        parse(parser, arguments);
     } catch (const CLI::Success& asked_for_help) {
         parser.exit(asked_for_help);
         std::cout.flush();

@@ -10,7 +10,6 @@
 
 #include "cfg32.h"
 #include "disk.h"
-#include "file_lock.h"
 #include "outcome.h"
 #include "terminal.h"
 
@@ -31,7 +30,7 @@ std::string content_of(int file, size_t expected, const std::string& name) {
     return text;
 }
 
-std::string text_of(const std::string& name, int operation) {
+locked_file opened(const std::string& name, int operation) {
     // Reading leaves not even the time of access behind; others' files do not allow that.
     locked_file file(name.c_str(), O_RDONLY | O_NOATIME, operation);
     if (!file && errno == EPERM) {
@@ -43,10 +42,16 @@ std::string text_of(const std::string& name, int operation) {
     if (!file) {
         fail_with_errno(name, CFG_CONNECT_ERROR);
     }
-    return content_of(file.get(), static_cast<size_t>(file.status().st_size), name);
+    return file;
 }
 
 }  // namespace
+
+locked_file locked_configuration(const std::string& name) { return opened(name, LOCK_SH); }
+
+std::string text_of(const locked_file& file, const std::string& name) {
+    return content_of(file.get(), static_cast<size_t>(file.status().st_size), name);
+}
 
 memory_file::memory_file(std::string_view text)
     : file_(memfd_create("configuration", MFD_CLOEXEC)),
@@ -60,9 +65,11 @@ std::string memory_file::text() const { return content_of(file_.get(), 0, name_)
 
 std::string read_configuration(const std::string& name) {
     const progress reading("Reading " + name);
-    return text_of(name, LOCK_SH);
+    return text_of(locked_configuration(name), name);
 }
 
-std::string read_without_waiting(const std::string& name) { return text_of(name, without_lock); }
+std::string read_without_waiting(const std::string& name) {
+    return text_of(opened(name, without_lock), name);
+}
 
 }  // namespace cfg32::tool

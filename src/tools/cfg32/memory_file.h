@@ -3,6 +3,7 @@
 #include <string>
 #include <string_view>
 
+#include "file_lock.h"
 #include "unique_fd.h"
 
 namespace cfg32::tool {
@@ -21,6 +22,13 @@ class memory_file {
     unique_fd file_;
     std::string name_;
 };
+
+/// Opens the configuration file while no program is writing it, and keeps it so. Ends the command
+/// when that can't be done.
+locked_file locked_configuration(const std::string& name);
+
+/// The text of a file of that name. Ends the command when it can't be read.
+std::string text_of(const locked_file& file, const std::string& name);
 
 /// The text of the configuration file, read while no program is writing it. Ends the command when
 /// it can't be read.

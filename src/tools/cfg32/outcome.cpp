@@ -25,6 +25,7 @@ struct facts {
     std::string message;
     int system_error = 0;
     int code = 0;
+    int extended = 0;
     std::string entry;
     std::string attribute;
     std::string value;
@@ -38,6 +39,9 @@ void append_line(std::string& text, std::string_view label, std::string_view wha
     }
 }
 
+/// Extended code of an attribute that would not read back as it is written.
+constexpr int unreadable = 1005;
+
 /// For the results that are about the value.
 std::string accepted_instead(const facts& known) {
     switch (known.code) {
@@ -45,6 +49,9 @@ std::string accepted_instead(const facts& known) {
             return "one value";
         case CFG_INVALID_SYNTAX:
         case CFG_INVALID_DN_SYNTAX:
+            if (known.extended == unreadable) {
+                return "what can stand in a line: no blanks at the ends, no line feed";
+            }
             return known.violated && known.violated->name ? accepted_values(*known.violated) : "";
         default:
             return {};
@@ -73,6 +80,8 @@ std::string told(const facts& known) {
     return text;
 }
 
+constexpr int unusable_character = 162;
+
 /// Where the library's message quotes a text that may be a password, or names its own parts.
 struct own_message {
     int code;
@@ -82,7 +91,7 @@ constexpr own_message own_messages[] = {
     {CFG_NO_SUCH_ATTRIBUTE, "there is no such attribute to delete"},
     {CFG_INVALID_CREDENTIALS, "not the administrator's DN and password"},
     {CFG_DECODING_ERROR, "a stored password can't be decoded with this key, or without one"},
-    {162, "text that is not of the locale's character set"},
+    {unusable_character, "text that is not of the locale's character set"},
 };
 
 const char* own_message_for(int code) {
@@ -124,6 +133,7 @@ std::string report(const LDIF_Exception& e, std::string_view file_name) {
     known.message = message_of(e);
     known.system_error = e.sysErrno;
     known.code = e.ldapErr;
+    known.extended = e.extErr;
     known.entry = e.entryDn;
     known.attribute = e.attribute;
     known.value = e.value;

@@ -5,7 +5,6 @@
 #include <bsd/readpassphrase.h>
 #include <unistd.h>
 
-#include <algorithm>
 #include <array>
 #include <cctype>
 #include <chrono>
@@ -14,6 +13,8 @@
 #include <iostream>
 
 #include "cfg32_platform.h"
+#include "held_back_signals.h"
+#include "hidden_passwords.h"
 #include "outcome.h"
 
 namespace cfg32::tool {
@@ -38,14 +39,6 @@ bool is_coloured(std::FILE* stream) {
 /// From when on, and how often, it is said what is being done.
 constexpr auto patience = 1s;
 
-/// Names and values that a message quotes shall not steer the terminal.
-std::string without_controls(std::string_view message) {
-    std::string text(message);
-    const auto is_control = [](unsigned char c) { return c != '\n' && iscntrl(c); };
-    std::replace_if(text.begin(), text.end(), is_control, '?');
-    return text;
-}
-
 }  // namespace
 
 void choose_color(color_choice choice) { chosen = choice; }
@@ -55,7 +48,21 @@ std::string styled(std::FILE* stream, const fmt::text_style& style, std::string_
 }
 
 void complain(std::string_view message) {
-    tell(fmt::format("{} {}\n", styled(stderr, style::error, "cfg32:"), without_controls(message)));
+    tell(fmt::format("{} {}\n", styled(stderr, style::error, "cfg32:"),
+                     printable(shown_text(message))));
+}
+
+std::string printable(std::string_view text) {
+    std::string shown;
+    for (size_t i = 0; i < text.size(); ++i) {
+        const auto byte = static_cast<unsigned char>(text[i]);
+        const auto next = static_cast<unsigned char>(i + 1 < text.size() ? text[i + 1] : 0);
+        const bool is_c1 = byte == 0xC2 && next >= 0x80 && next < 0xA0;  // in UTF-8
+        i += is_c1 ? 1 : 0;
+        const bool is_control = is_c1 || (byte != '\n' && byte != '\t' && iscntrl(byte));
+        shown += is_control ? '?' : text[i];
+    }
+    return shown;
 }
 
 void tell(std::string_view text) {
@@ -94,6 +101,7 @@ char ask(const std::string& question, std::string_view letters) {
 
 progress::progress(std::string what) : what_(std::move(what)) {
     if (isatty(STDERR_FILENO)) {
+        const held_back_signals from_the_thread;
         thread_ = std::thread([this] { show(); });
     }
 }

@@ -32,6 +32,10 @@ void choose_color(color_choice choice);
 /// The text in that style, if the stream (stdout or stderr) is coloured.
 std::string styled(std::FILE* stream, const fmt::text_style& style, std::string_view text);
 
+/// The text with a "?" for each control character, but line feeds and tabs: what a file holds shall
+/// not steer a terminal.
+std::string printable(std::string_view text);
+
 /// Prints "cfg32: " and the message on standard error.
 void complain(std::string_view message);
 

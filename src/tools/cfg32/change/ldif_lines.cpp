@@ -7,6 +7,7 @@
 #include <strings.h>
 
 #include <algorithm>
+#include <cctype>
 
 #include "hidden_passwords.h"
 
@@ -92,7 +93,9 @@ std::vector<ldif_lines> split_records(std::string_view text) {
 }
 
 bool is_attribute_name(std::string_view text) {
-    return !text.empty() && text.find_first_not_of(name_characters) == std::string_view::npos;
+    return !text.empty() && isalnum(static_cast<unsigned char>(text.front())) &&
+           text.back() != ';' && text.back() != '.' &&
+           text.find_first_not_of(name_characters) == std::string_view::npos;
 }
 
 void require_name(std::string_view name, int line) {
@@ -100,7 +103,10 @@ void require_name(std::string_view name, int line) {
         throw ldif_error{line, "an attribute's name is missing"};
     }
     if (!is_attribute_name(name)) {
-        throw ldif_error{line, fmt::format("\"{}\" is not an attribute's name", shown_line(name))};
+        // What follows a blank may be anything.
+        const std::string_view front = name.substr(0, name.find_first_of(" :"));
+        throw ldif_error{line, fmt::format("\"{}{}\" is not an attribute's name", shown_line(front),
+                                           front == name ? "" : " ...")};
     }
 }
 

@@ -48,9 +48,9 @@ const auto* row_of(const Rows& rows, std::string_view name) {
 change_record::operation kind_of(const named_value& change_type) {
     const auto* type = row_of(change_types, change_type.value);
     if (!type) {
-        throw ldif_error{
-            change_type.line,
-            fmt::format("\"{}\" is no changetype: add, modify and delete are", change_type.value)};
+        throw ldif_error{change_type.line,
+                         fmt::format("\"{}\" is no changetype: add, modify and delete are",
+                                     change_type.value.substr(0, change_type.value.find_first_of(" :")))};
     }
     if (!type->kind) {
         throw ldif_error{change_type.line,
@@ -64,10 +64,17 @@ void add_value(modification& to, const named_value& line) {
     to.value_lines.push_back(line.line);
 }
 
+void require_no_dn(const named_value& line) {
+    if (is_same_name(line.name, "dn")) {
+        throw ldif_error{line.line, "a second \"dn:\": a blank line is missing above it"};
+    }
+}
+
 /// The content of an added entry, one modification for each attribute.
 void read_content(line_span lines, change_record& record) {
     for (const ldif_text_line& each : lines) {
         const named_value line = parse_line(each);
+        require_no_dn(line);
         if (is_same_name(line.name, "changetype")) {
             throw ldif_error{line.line, "\"changetype:\" stands only right below \"dn:\""};
         }
@@ -103,6 +110,7 @@ modification take_block(line_span& lines, modification::operation kind) {
             throw ldif_error{lines.front().number, "text after the \"-\" that ends a block"};
         }
         const named_value line = parse_line(lines.front());
+        require_no_dn(line);
         if (!is_same_name(line.name, block.attribute)) {
             throw ldif_error{line.line,
                              fmt::format("\"{}\" in the block of {}, which a line \"-\" ends",
@@ -127,6 +135,7 @@ void read_blocks(line_span lines, bool is_said, change_record& record) {
     }
     while (!lines.empty()) {
         const named_value head = parse_line(lines.front());
+        require_no_dn(head);
         const auto* type = row_of(block_types, head.name);
         if (!type && is_said) {
             throw ldif_error{head.line,
@@ -213,7 +222,7 @@ bool is_version(const ldif_text_line& line) {
 /// A line that the end of the text ends may have been cut off in the middle.
 std::optional<ldif_error> cut_off_line(std::string_view text) {
     const std::string_view last = text.substr(text.find_last_of('\n') + 1);
-    if (last.find_first_not_of(" \t\r") == std::string_view::npos || last.front() == '#') {
+    if (last.empty() || last.front() == '#') {
         return {};
     }
     const auto line = std::count(text.begin(), text.end(), '\n') + 1;

@@ -12,6 +12,7 @@
 #include "memory_file.h"
 #include "outcome.h"
 #include "terminal.h"
+#include "whole_file.h"
 
 namespace cfg32::tool {
 
@@ -214,7 +215,7 @@ std::string updater::flushed_text() {
 /// copied.
 bool updater::is_written() {
     try {
-        LDIF_File::replace(name(), options_.backup_name(), result_.after, result_.before);
+        replace_file(name(), options_.backup_name(), result_.after, result_.before);
         return true;
     } catch (const LDIF_Exception& e) {
         if (e.ldapErr != CFG_BUSY || read_without_waiting(name()) == result_.before) {

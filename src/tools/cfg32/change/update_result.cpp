@@ -6,6 +6,7 @@
 
 #include "change/update.h"
 #include "diff/unified_diff.h"
+#include "hidden_passwords.h"
 #include "json_text.h"
 #include "outcome.h"
 #include "terminal.h"
@@ -21,8 +22,8 @@ json as_json(const settings& options, const update_result& result) {
         if (each.line > 0) {
             object["line"] = each.line;
         }
-        object["dn"] = utf8(each.dn);
-        object["reason"] = utf8(each.reason);
+        object["dn"] = utf8(shown_text(each.dn));
+        object["reason"] = utf8(shown_text(each.reason));
         skipped.push_back(std::move(object));
     }
     json document = {

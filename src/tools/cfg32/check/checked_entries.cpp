@@ -49,6 +49,7 @@ void checked_entries::add(entry_section& section, LDIF_Attribute&& attribute, in
                                         "; the next rewrite drops this one");
         found.entry = section.written;
         found.attribute = attribute.name().text();
+        found.other_line = line_of(first);
     }
 }
 
@@ -62,6 +63,7 @@ void checked_entries::report_second_value(const LDIF_Attribute& attribute, int l
         found_.add(kind::second_value, file_.value_place(line),
                    fmt::format("another value of {}, which takes only one; the first one stands{}",
                                name, on_line(line_of(*attribute.values().begin()))));
+    found.other_line = line_of(*attribute.values().begin());
     found.entry = entry;
     found.attribute = name;
     found.accepted = "one value";
@@ -126,6 +128,7 @@ void checked_entries::merge(checked_entry& known, entry_section& section) {
                                    is_password_attribute(e.attribute) ? " without the key" : ""));
         found.entry = section.written;
         found.attribute = e.attribute;
+        found.other_line = known.sections.front().first;
         take_codes(found, e);
         section.stopping.push_back(&found);
         section.is_left_out = true;
@@ -133,12 +136,13 @@ void checked_entries::merge(checked_entry& known, entry_section& section) {
     }
     known.sections.push_back({section.where, section.first, section.last});
     if (is_entry) {
-        found_
-            .add(kind::duplicate_entry, section.where,
-                 fmt::format("entry stands twice, the first one on line {}; the next rewrite "
-                             "merges them",
-                             known.sections.front().first))
-            .entry = section.written;
+        const int first = known.sections.front().first;
+        problem& found = found_.add(kind::duplicate_entry, section.where,
+                                    fmt::format("entry stands twice, the first one on line {}; "
+                                                "the next rewrite merges them",
+                                                first));
+        found.entry = section.written;
+        found.other_line = first;
     }
 }
 

@@ -106,7 +106,13 @@ problem cut_off_text::missing_newline(const LDIF_Line& line) const {
 
 std::vector<problem> problems_of_lines(std::string_view text, aes_key_data* key) {
     const bool is_cut_off = !text.empty() && text.back() != '\n';
-    return is_cut_off ? cut_off_text(text, key).problems() : problem_finder(text, key).run();
+    std::vector<problem> problems =
+        is_cut_off ? cut_off_text(text, key).problems() : problem_finder(text, key).run();
+    for (problem& each : problems) {
+        each.text = shown_text(each.text);
+        each.entry = shown_text(each.entry);
+    }
+    return problems;
 }
 
 }  // namespace

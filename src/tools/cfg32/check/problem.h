@@ -43,6 +43,7 @@ struct problem {
     std::string accepted;   ///< what would be accepted instead, in words, or empty
     int result = 0;         ///< LDAP result code that a load or a change would give, 0 for none
     int extended = 0;       ///< extended code, 0 for none
+    int other_line = 0;     ///< the line that the text tells of, 0 if none
     std::optional<consequence> own_outcome = {};  ///< where it is not that of the rule
     // The lines that have to be left out for a load, and then a write, to succeed (both included),
     // 0 if none.

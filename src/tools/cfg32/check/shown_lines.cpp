@@ -37,7 +37,8 @@ bool shown_lines::is_hidden(int number) {
 std::string shown_lines::at(int number) {
     const std::string_view line = file_.line(number);
     if (file_.beginning_of(number) == number) {
-        return shown_line(line);
+        const bool is_below = number > 1 && is_password_below(file_.line(number - 1), line);
+        return is_below ? std::string(hidden_text) : shown_line(line);
     }
     return is_hidden(number) ? " " + std::string(hidden_text) : std::string(line);
 }

@@ -1,6 +1,5 @@
 // cfg32 backup: copies the configuration file now.
 
-#include <fcntl.h>
 #include <fmt/format.h>
 #include <memory>
 
@@ -10,8 +9,8 @@
 #include "check/problem.h"
 #include "command.h"
 #include "configuration.h"
-#include "copied_file.h"
-#include "file_lock.h"
+#include "memory_file.h"
+#include "whole_file.h"
 
 namespace cfg32::tool {
 
@@ -37,10 +36,10 @@ int backup(const settings& options, const std::string& given_target) {
     if (target.empty()) {
         throw ended(usage_error, "--no-backup leaves nothing to do");
     }
-    require_bind(options);
-    require_good(name, read_configuration(name), target);
+    require_bind(options, name);
     // Nobody writes it meanwhile; one who doesn't ask is noticed by the copying.
-    const locked_file lock(name.c_str(), O_RDONLY, LOCK_SH);
+    const locked_file file = locked_configuration(name);
+    require_good(name, text_of(file, name), target);
     copy_file(name, target);
     return done;
 }

@@ -74,16 +74,17 @@ const kind_of_change& kind_of(entry_difference::kind change) {
 
 void print_values(char mark, const fmt::text_style& look, const std::string& name,
                   const std::vector<std::string>& values) {
-    for (const std::string& value : values) {
-        const std::string line = fmt::format("{}   {}: {}", mark, name, shown_value(name, value));
-        fmt::print("{}\n", styled(stdout, look, line));
+    for (const std::string& value : shown_values(name, values)) {
+        const std::string line = fmt::format("{}   {}: {}", mark, name, value);
+        fmt::print("{}\n", styled(stdout, look, printable(line)));
     }
 }
 
 void print_text(const std::vector<entry_difference>& found) {
     for (const entry_difference& each : found) {
         const kind_of_change& kind = kind_of(each.change);
-        const std::string dn = each.dn.empty() ? "above all entries" : each.dn.str();
+        const std::string dn =
+            each.dn.empty() ? "above all entries" : printable(shown_text(each.dn.str()));
         fmt::print("{}\n", styled(stdout, *kind.style, fmt::format("{} {}", kind.mark, dn)));
         for (const attribute_difference& attribute : each.attributes) {
             print_values('-', style::removed, attribute.name, attribute.removed);
@@ -92,10 +93,10 @@ void print_text(const std::vector<entry_difference>& found) {
     }
 }
 
-json shown_values(const std::string& name, const std::vector<std::string>& values) {
+json json_of(const std::string& name, const std::vector<std::string>& values) {
     json list = json::array();
-    for (const std::string& value : values) {
-        list.push_back(utf8(shown_value(name, value)));
+    for (const std::string& value : shown_values(name, values)) {
+        list.push_back(utf8(value));
     }
     return list;
 }
@@ -106,10 +107,10 @@ void print_as_json(const arguments& given, const std::vector<entry_difference>& 
         json attributes = json::array();
         for (const attribute_difference& attribute : each.attributes) {
             attributes.push_back({{"name", utf8(attribute.name)},
-                                  {"removed", shown_values(attribute.name, attribute.removed)},
-                                  {"added", shown_values(attribute.name, attribute.added)}});
+                                  {"removed", json_of(attribute.name, attribute.removed)},
+                                  {"added", json_of(attribute.name, attribute.added)}});
         }
-        entries.push_back({{"dn", utf8(each.dn.str())},
+        entries.push_back({{"dn", utf8(shown_text(each.dn.str()))},
                            {"change", kind_of(each.change).word},
                            {"attributes", std::move(attributes)}});
     }

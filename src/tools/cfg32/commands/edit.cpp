@@ -2,7 +2,6 @@
 
 #include <fmt/format.h>
 #include <unistd.h>
-#include <memory>
 
 #include <climits>
 #include <csignal>
@@ -10,6 +9,7 @@
 #include <cstdlib>
 #include <cstring>
 #include <filesystem>
+#include <memory>
 
 #include "LDIF_Exception.h"
 #include "LDIF_File.h"
@@ -21,6 +21,7 @@
 #include "edited_text.h"
 #include "private_folder.h"
 #include "terminal.h"
+#include "whole_file.h"
 
 namespace cfg32::tool {
 
@@ -46,7 +47,11 @@ class draft_keeper {
         action.sa_handler = tell_and_end;
         action.sa_flags = SA_RESETHAND;
         for (const int signal : {SIGHUP, SIGINT, SIGTERM}) {
-            sigaction(signal, &action, nullptr);
+            struct sigaction before {};
+            sigaction(signal, &action, &before);
+            if (before.sa_handler == SIG_IGN) {
+                sigaction(signal, &before, nullptr);
+            }
         }
     }
 
@@ -77,6 +82,7 @@ class session {
     choice review(const std::string& draft);
     int finish(const std::string& draft);
     void keep_draft();
+    bool is_unedited() const;
 
     const settings& options_;
     std::string file_name_;
@@ -95,7 +101,7 @@ session::choice session::review(const std::string& draft) {
         tell(text_report({{path_, draft, found.in_draft}}));
     }
     if (!found.elsewhere.empty()) {
-        tell(text_report({{file_name_, text_.with(draft), found.elsewhere}}));
+        tell(text_report({{file_name_, text_.before(), found.elsewhere}}));
     }
     if (!found.is_loadable) {
         complain("this can't be loaded, so it can't be written");
@@ -115,7 +121,7 @@ int session::finish(const std::string& draft) {
     } else if (options_.is_dry_run) {
         fmt::print("{}", unified_diff(text_.before(), after, file_name_));
     } else {
-        LDIF_File::replace(file_name_, options_.backup_name(), after, text_.before());
+        replace_file(file_name_, options_.backup_name(), after, text_.before());
     }
     return done;
 }
@@ -125,7 +131,7 @@ int session::run() {
     try {
         for (;;) {
             run_editor(path_);
-            const std::string draft = read_configuration(path_);
+            const std::string draft = read_without_waiting(path_);
             const choice chosen = draft == text_.part() ? write : review(draft);
             if (chosen == write) {
                 return finish(draft);
@@ -143,9 +149,18 @@ int session::run() {
 
 /// Whatever went wrong, what was edited is not lost.
 void session::keep_draft() {
-    if (read_configuration(path_) != text_.part()) {
+    if (!is_unedited()) {
         folder_.keep();
-        tell(fmt::format("what you edited is kept in {}\n", path_));
+        tell(fmt::format("what you edited is kept in {}\n",
+                         is_there(path_) ? path_ : path_.substr(0, path_.rfind('/'))));
+    }
+}
+
+bool session::is_unedited() const {
+    try {
+        return read_without_waiting(path_) == text_.part();
+    } catch (const ended&) {  // an editor may have moved or locked it
+        return false;
     }
 }
 
@@ -156,7 +171,7 @@ action define_edit(CLI::App& parser, settings& options) {
     add_argument(parser, "dn", "DN", "the entry to edit; else the whole file", *dn);
     add_footer(parser, "The editor is the one that VISUAL or EDITOR names, else vi.");
     return [dn, &options] {
-        require_bind(options);
+        require_bind(options, options.file_name());
         return session(options, *dn).run();
     };
 }

@@ -1,6 +1,7 @@
 // cfg32 get: prints the values of an attribute.
 
 #include <fmt/format.h>
+#include <unistd.h>
 #include <memory>
 
 #include "arguments.h"
@@ -11,6 +12,7 @@
 #include "json_text.h"
 #include "outcome.h"
 #include "schema/attribute_words.h"
+#include "terminal.h"
 
 namespace cfg32::tool {
 
@@ -45,7 +47,8 @@ int get(const settings& options, const attribute_of_entry& given) {
     }
     if (!options.is_json) {
         for (const std::string& value : read.attributes.front().values) {
-            fmt::print("{}\n", shown_value(given.attribute, value));
+            const std::string shown = shown_value(given.attribute, value);
+            fmt::print("{}\n", isatty(STDOUT_FILENO) ? printable(shown) : shown);
         }
     }
     return done;

@@ -7,10 +7,12 @@
 
 #include <array>
 #include <cerrno>
+#include <filesystem>
 
 #include "arguments.h"
 #include "command.h"
 #include "disk.h"
+#include "held_back_signals.h"
 #include "private_folder.h"
 #include "unique_fd.h"
 
@@ -30,8 +32,17 @@ bool is_written(int file, std::string_view key) {
     return fchmod(file, of_owner_only) == 0 && replace_content(file, key) && sync_content(file);
 }
 
+/// What the key encodes must not outlive its name.
+bool is_name_synced(const std::string& name) {
+    const auto folder = std::filesystem::path(name).parent_path();
+    const unique_fd opened(
+        open(folder.empty() ? "." : folder.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC));
+    return opened && fsync(opened.get()) == 0;
+}
+
 /// A key that is there already is never overwritten: what it encoded would be lost.
 int keygen(const arguments& given) {
+    const held_back_signals until_done;
     const char* name = given.file.c_str();
     unique_fd file(open(name, O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, of_owner_only));
     if (!file) {
@@ -39,7 +50,8 @@ int keygen(const arguments& given) {
     }
     std::array<char, largest_key> key{};
     randombytes_buf(key.data(), given.bytes);
-    const bool is_done = is_written(file.get(), {key.data(), given.bytes}) && file.close();
+    const bool is_done = is_written(file.get(), {key.data(), given.bytes}) && file.close() &&
+                         is_name_synced(given.file);
     const int error = errno;
     sodium_memzero(key.data(), key.size());
     if (!is_done) {

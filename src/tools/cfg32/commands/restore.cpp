@@ -6,13 +6,14 @@
 
 #include "LDIF_File.h"
 #include "arguments.h"
+#include "cfg32.h"
 #include "check/check_report.h"
 #include "check/problem.h"
 #include "command.h"
 #include "configuration.h"
-#include "copied_file.h"
 #include "diff/unified_diff.h"
 #include "terminal.h"
+#include "whole_file.h"
 
 namespace cfg32::tool {
 
@@ -73,6 +74,14 @@ void require_confirmation(const arguments& given) {
     }
 }
 
+/// Makes the missing file again; where a link means it, there.
+void put_back(const std::string& source, const std::string& name, const std::string& wanted) {
+    if (read_configuration(source) != wanted) {
+        fail(CFG_BUSY, source + " was changed meanwhile; nothing was restored: try again");
+    }
+    copy_file(source, target_of(name));
+}
+
 int restore(const settings& options, const arguments& given) {
     const std::string name = options.file_name();
     const std::string source = given.backup.empty() ? newest_backup(options) : given.backup;
@@ -82,20 +91,20 @@ int restore(const settings& options, const arguments& given) {
     require_loadable(source, wanted, passwords.get());
     const bool is_missing = !is_there(name);
     const std::string present = is_missing ? std::string() : read_configuration(name);
-    if (!is_missing) {
-        require_bind(options);
-    }
+    require_bind(options, is_missing ? source : name);
     if (present == wanted && !is_missing) {
         fmt::print("unchanged\n");
         return done;
     }
     fmt::print("{}", unified_diff(present, wanted, name));
-    fflush(stdout);
+    if (fflush(stdout) != 0) {
+        throw ended(failed, "what would change can't be shown; nothing was restored");
+    }
     if (options.is_dry_run) {
         return done;
     }
     require_confirmation(given);
-    is_missing ? copy_file(source, name) : LDIF_File::replace(name, keep, wanted, present);
+    is_missing ? put_back(source, name, wanted) : replace_file(name, keep, wanted, present);
     return done;
 }
 

@@ -42,9 +42,8 @@ int set(const settings& options, const arguments& given) {
 action define_set(CLI::App& parser, settings& options) {
     auto given = std::make_shared<arguments>();
     add_attribute_of_entry(parser, *given);
-    add_argument(parser, "value", "VALUE",
-                 "all the values it is to have; \"--\" goes before one like \"-x\"", given->values,
-                 presence::required);
+    add_values(parser, "all the values it is to have; \"--\" goes before one like \"-x\"",
+               given->values, presence::required);
     add_flag(parser, "--unknown-attribute", "take a name that the server does not know",
              given->takes_any_name);
     return [&options, given] { return set(options, *given); };

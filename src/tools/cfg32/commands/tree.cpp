@@ -13,7 +13,9 @@
 #include "arguments.h"
 #include "command.h"
 #include "configuration.h"
+#include "hidden_passwords.h"
 #include "json_text.h"
+#include "terminal.h"
 
 namespace cfg32::tool {
 
@@ -139,9 +141,9 @@ void print_as_json(const configuration& file, const LDIF_Entry& base) {
         }
         json missing = json::array();
         for (const LDIF_DN& dn : missing_ancestors(node)) {
-            missing.push_back(utf8(dn.str()));
+            missing.push_back(utf8(shown_text(dn.str())));
         }
-        list.push_back({{"dn", utf8(node.dn().str())},
+        list.push_back({{"dn", utf8(shown_text(node.dn().str()))},
                         {"depth", depth_below(base, node, file.root())},
                         {"missingAncestors", std::move(missing)}});
     });
@@ -154,7 +156,7 @@ int tree(const settings& options, const arguments& given) {
     if (options.is_json) {
         print_as_json(file, base);
     } else {
-        fmt::print("{}", drawing_of(base, given.style));
+        fmt::print("{}", printable(shown_text(drawing_of(base, given.style))));
     }
     return done;
 }

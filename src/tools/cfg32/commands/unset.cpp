@@ -19,8 +19,7 @@ struct arguments : attribute_of_entry {
 action define_unset(CLI::App& parser, settings& options) {
     auto given = std::make_shared<arguments>();
     add_attribute_of_entry(parser, *given);
-    add_argument(parser, "value", "VALUE", "the values to remove; without any, all of them",
-                 given->values);
+    add_values(parser, "the values to remove; without any, all of them", given->values);
     return [&options, given] {
         require_no_secrets(given->attribute, given->values);
         return change_attribute(options, given->dn,

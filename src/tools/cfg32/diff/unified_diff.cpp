@@ -65,12 +65,15 @@ std::string shown(const std::vector<std::string_view>& lines, size_t number) {
     std::string_view line = lines[number];
     const bool is_whole = line.ends_with('\n');
     line.remove_suffix(is_whole ? 1 : 0);
+    if (number > 0 && is_password_below(lines[number - 1], line)) {
+        line = hidden_text;
+    }
     const size_t first = first_of(lines, number);
     const size_t indent = std::min(line.find_first_not_of(" \t"), line.size());
     const std::string text =
         first < number ? shown_continuation(lines[first], line)
                        : std::string(line.substr(0, indent)) + shown_line(line.substr(indent));
-    return text + (is_whole ? "\n" : "\n\\ No newline at end of file\n");
+    return printable(text) + (is_whole ? "\n" : "\n\\ No newline at end of file\n");
 }
 
 class printer {
