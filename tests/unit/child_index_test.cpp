@@ -233,7 +233,7 @@ struct indexed_entries {
 
     std::vector<std::string> below(const std::string& dn) const {
         std::vector<std::string> names;
-        for (const auto position : index.descendants(dn_of(dn))) {
+        for (const auto position : index.descendants(LDIF_Entry(dn_of(dn)))) {
             names.push_back(position->dn().str());
         }
         return names;

@@ -5,6 +5,7 @@
 #include <strings.h>
 
 #include <algorithm>
+#include <array>
 #include <cstring>
 #include <iterator>
 #include <limits>
@@ -112,9 +113,54 @@ const _AttrType* searchAttrMap(const char* name, int lo, int hi) {
     return nullptr;
 }
 
+namespace {
+
+/// The rows by their names: a load looks one up for every line. It finds what searchAttrMap() does.
+class row_index {
+  public:
+    row_index() {
+        initAttrMap();
+        for (int i = 0; i < numAttrs; ++i) {
+            const _AttrType* row = searchAttrMap(attrMap[i].name, 0, numAttrs);
+            *slot_of(row->name) = row;
+        }
+    }
+
+    const _AttrType* find(const char* name) const {
+        return *const_cast<row_index*>(this)->slot_of(name);
+    }
+
+  private:
+    static constexpr size_t slots = 1024;  // a power of two, several times the number of rows
+    static_assert(std::size(rows) * 4 < slots);
+
+    /// Where the row of that name is, or would be.
+    const _AttrType** slot_of(const char* name) {
+        size_t at = hash(name);
+        while (rows_[at % slots] && rows_[at % slots]->compare(name) != 0) {
+            ++at;
+        }
+        return &rows_[at % slots];
+    }
+
+    static size_t hash(const char* name) {
+        constexpr size_t prime = 0x100000001b3;  // FNV-1a
+        constexpr char lower_case = 0x20;
+        size_t hash = 0;
+        for (; *name != '\0'; ++name) {
+            hash = (hash ^ static_cast<unsigned char>(*name | lower_case)) * prime;
+        }
+        return hash ^ (hash >> 32);
+    }
+
+    std::array<const _AttrType*, slots> rows_{};
+};
+
+}  // namespace
+
 const _AttrType* getAttrType(const char* name) {
     // Initialised once, also when many threads make the first look-up together.
-    [[maybe_unused]] static const bool initialised = (initAttrMap(), true);
-    const _AttrType* row = name ? searchAttrMap(name, 0, numAttrs) : nullptr;
+    static const row_index index;
+    const _AttrType* row = name ? index.find(name) : nullptr;
     return row ? row : defaultAttrType;
 }

@@ -25,11 +25,15 @@ LDIF_Attribute::LDIF_Attribute(aes_key_data* key, const std::string& name, const
 
 LDIF_Attribute::LDIF_Attribute(aes_key_data* key, const LDIF_Line& line,
                                const LDIF_Comment& comment)
-    : comment_(comment), values_(line.attribute, key) {
+    : LDIF_Attribute(key, line, LDIF_Comment(comment)) {}
+
+LDIF_Attribute::LDIF_Attribute(aes_key_data* key, const LDIF_Line& line, LDIF_Comment&& comment)
+    : values_(line.attribute, key) {
     if (line.type != LDIF_Line::attr) {
         raise(illegal_line, std::string(line_type_name(line.type)) + " );");
     }
     values_ += line.value;
+    comment_ = std::move(comment);
 }
 
 LDIF_Attribute& LDIF_Attribute::operator=(const LDIF_Attribute& other) {

@@ -15,6 +15,8 @@ class LDIF_Attribute {
     LDIF_Attribute(aes_key_data* key, const std::string& name, const std::string& value);
     /// From a line of the file, of type attr (80/1000 for another).
     LDIF_Attribute(aes_key_data* key, const LDIF_Line& line, const LDIF_Comment& comment);
+    /// The same; takes the comment over, if nothing is thrown.
+    LDIF_Attribute(aes_key_data* key, const LDIF_Line& line, LDIF_Comment&& comment);
     LDIF_Attribute(const LDIF_Attribute&) = default;
     LDIF_Attribute(LDIF_Attribute&&) noexcept = default;
     LDIF_Attribute& operator=(const LDIF_Attribute& other);

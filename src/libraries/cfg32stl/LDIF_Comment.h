@@ -2,7 +2,6 @@
 
 #include <iosfwd>
 #include <string>
-#include <vector>
 
 #include "LDIF_Line.h"
 
@@ -25,16 +24,16 @@ class LDIF_Comment {
     /// Drops the blank lines at the end.
     void drop_trailing_blank_lines();
 
-    bool empty() const { return lines_.empty(); }
-    size_t line_count() const { return lines_.size(); }
-    bool begins_with_blank_line() const;
+    bool empty() const { return text_.empty(); }
+    size_t line_count() const;
+    bool begins_with_blank_line() const { return text_.starts_with('\n'); }
 
     /// The lines, each with its newline.
-    virtual std::string str() const;
-    void append_to(std::string& out) const;
+    virtual std::string str() const { return text_; }
+    void append_to(std::string& out) const { out += text_; }
 
   private:
-    std::vector<LDIF_Line> lines_;
+    std::string text_;  // in file form
 };
 
 std::ostream& operator<<(std::ostream& out, const LDIF_Comment& comment);

@@ -1,5 +1,6 @@
 #include "LDIF_Entry.h"
 
+#include <algorithm>
 #include <ostream>
 
 #include "child_index.h"
@@ -27,15 +28,15 @@ LDIF_DN dn_of(const LDIF_Line& line) {
 LDIF_Entry::LDIF_Entry() = default;
 LDIF_Entry::LDIF_Entry(LDIF_Entry&&) noexcept = default;
 
-LDIF_Entry::LDIF_Entry(LDIF_DN dn) : name_("dn"), dn_(dn), relative_dn_(std::move(dn)) {}
+LDIF_Entry::LDIF_Entry(LDIF_DN dn) : name_("dn"), dn_(std::move(dn)) {}
 
 LDIF_Entry::LDIF_Entry(const LDIF_Line& line, const LDIF_Comment& comment)
-    : name_(line.attribute), dn_(dn_of(line)), relative_dn_(dn_), comment_(comment) {}
+    : name_(line.attribute), dn_(dn_of(line)), comment_(comment) {}
 
 LDIF_Entry::LDIF_Entry(const LDIF_Entry& other)
     : name_(other.name_),
       dn_(other.dn_),
-      relative_dn_(other.relative_dn_),
+      depth_(other.depth_),
       comment_(other.comment_),
       attributes_(other.attributes_),
       children_(other.children_) {
@@ -76,7 +77,7 @@ LDIF_Entry& LDIF_Entry::operator+=(LDIF_Attribute&& attribute) {
 LDIF_Entry& LDIF_Entry::operator+=(LDIF_Entry& child) {
     list node(1, child);
     LDIF_Entry& received = place(node);
-    child.relative_dn_ = (node.empty() ? received.children_.back() : node.front()).relative_dn_;
+    child.depth_ = (node.empty() ? received.children_.back() : node.front()).depth_;
     return received;
 }
 
@@ -94,33 +95,41 @@ LDIF_Entry& LDIF_Entry::operator+=(LDIF_Entry&& child) {
 /// Places the one entry of node, whose relative DN is relative to this entry's parent.
 LDIF_Entry& LDIF_Entry::place(list& node) {
     LDIF_Entry& child = node.front();
-    if (child.relative_dn_ == relative_dn_) {
-        return absorb(child);
-    }
-    if (relative_dn_.intersection(child.relative_dn_) != relative_dn_) {
+    if (!leads_to(child.dn_, child.depth_)) {
         raise(not_a_child,
-              child.relative_dn_.str() + "] is not child of [" + relative_dn_.str() + "]");
+              child.relative_dn().str() + "] is not child of [" + relative_dn().str() + "]");
     }
-    return hang(node, relative_dn_.rdns().size());
+    return child.relative_size() == relative_size() ? absorb(child)
+                                                    : hang(node, child.depth_ + relative_size());
 }
 
-/// Hangs the entry of node below this one. The first depth RDNs of its relative DN lead here.
+/// True when the relative DN stands in the other DN from that RDN on.
+bool LDIF_Entry::leads_to(const LDIF_DN& dn, size_t from) const {
+    const auto& own = dn_.rdns();
+    const auto& other = dn.rdns();
+    const auto first = own.begin() + static_cast<ptrdiff_t>(depth_);
+    const auto equal = [](const LDIF_RDN& l, const LDIF_RDN& r) { return l == r; };
+    return other.size() - from >= relative_size() &&
+           std::equal(first, own.end(), other.begin() + static_cast<ptrdiff_t>(from), equal);
+}
+
+/// Hangs the entry of node below this one, to which the first depth RDNs of its DN lead.
 LDIF_Entry& LDIF_Entry::hang(list& node, size_t depth) {
     LDIF_Entry& child = node.front();
     LDIF_Entry* parent = this;
     while (parent->index_) {
-        LDIF_Entry* next = parent->index_->equal_or_ancestor(child.relative_dn_, depth);
+        LDIF_Entry* next = parent->index_->equal_or_ancestor(child.dn_, depth);
         if (!next) {
             break;
         }
-        if (depth + next->relative_dn_.rdns().size() == child.relative_dn_.rdns().size()) {
-            child.relative_dn_.remove_root_side(depth);
+        if (depth + next->relative_size() == child.dn_.rdns().size()) {
+            child.depth_ = depth;
             return next->absorb(child);
         }
-        depth += next->relative_dn_.rdns().size();
+        depth += next->relative_size();
         parent = next;
     }
-    child.relative_dn_.remove_root_side(depth);
+    child.depth_ = depth;
     child.take_descendants_from(*parent);
     parent->append(node, node.begin());
     return *parent;
@@ -134,7 +143,7 @@ LDIF_Entry& LDIF_Entry::absorb(LDIF_Entry& again) {
     while (!again.children_.empty()) {
         list node;
         node.splice(node.end(), again.children_, again.children_.begin());
-        hang(node, 0);
+        hang(node, node.front().depth_);
     }
     return *this;
 }
@@ -144,11 +153,11 @@ void LDIF_Entry::take_descendants_from(LDIF_Entry& parent) {
     if (!parent.index_) {
         return;
     }
-    for (const list::iterator descendant : parent.index_->descendants(relative_dn_)) {
+    for (const list::iterator descendant : parent.index_->descendants(*this)) {
         list node;
         parent.index_->erase(descendant);
         node.splice(node.end(), parent.children_, descendant);
-        hang(node, relative_dn_.rdns().size());
+        hang(node, descendant->depth_ + relative_size());
     }
 }
 
@@ -207,21 +216,21 @@ LDIF_Entry* LDIF_Entry::find(const LDIF_DN& dn) {
 }
 
 const LDIF_Entry* LDIF_Entry::find(const LDIF_DN& dn) const {
-    if (relative_dn_.intersection(dn) != relative_dn_) {
+    if (!leads_to(dn, 0)) {
         return nullptr;
     }
     const LDIF_Entry* entry = this;
-    size_t depth = relative_dn_.rdns().size();
+    size_t depth = relative_size();
     while (entry && depth < dn.rdns().size()) {
         entry = entry->index_ ? entry->index_->equal_or_ancestor(dn, depth) : nullptr;
-        depth += entry ? entry->relative_dn_.rdns().size() : 0;
+        depth += entry ? entry->relative_size() : 0;
     }
     return entry;
 }
 
 LDIF_Entry* LDIF_Entry::child(const LDIF_DN& relative_dn) {
     LDIF_Entry* found = index_ ? index_->equal_or_ancestor(relative_dn, 0) : nullptr;
-    return found && found->relative_dn_ == relative_dn ? found : nullptr;
+    return found && found->relative_size() == relative_dn.rdns().size() ? found : nullptr;
 }
 
 void LDIF_Entry::erase(LDIF_Entry& child) {
@@ -233,11 +242,17 @@ void LDIF_Entry::erase(LDIF_Entry& child) {
     }
 }
 
+LDIF_DN LDIF_Entry::relative_dn() const {
+    LDIF_DN relative = dn_;
+    relative.remove_root_side(depth_);
+    return relative;
+}
+
 LDIF_Entry LDIF_Entry::header() const {
     LDIF_Entry copy;
     copy.name_ = name_;
     copy.dn_ = dn_;
-    copy.relative_dn_ = relative_dn_;
+    copy.depth_ = depth_;
     return copy;
 }
 

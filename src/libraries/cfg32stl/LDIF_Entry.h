@@ -72,7 +72,12 @@ class LDIF_Entry {
     bool is_root() const { return name_.empty(); }
     const cisString& name() const { return name_; }  ///< of the DN line, as it was written
     const LDIF_DN& dn() const { return dn_; }
-    const LDIF_DN& relative_dn() const { return relative_dn_; }
+    LDIF_DN relative_dn() const;
+    /// How many RDNs of the DN, from the root side, lead to the parent in the tree; the others are
+    /// the relative DN.
+    size_t depth() const { return depth_; }
+    /// How many RDNs the relative DN has.
+    size_t relative_size() const { return dn_.rdns().size() - depth_; }
     const LDIF_Comment& comment() const { return comment_; }
     const LDIF_Attributes& attributes() const { return attributes_; }
     LDIF_Attributes& attributes() { return attributes_; }
@@ -83,6 +88,7 @@ class LDIF_Entry {
 
   private:
     LDIF_Entry& place(list& node);
+    bool leads_to(const LDIF_DN& dn, size_t from) const;
     LDIF_Entry& hang(list& node, size_t depth);
     LDIF_Entry& absorb(LDIF_Entry& again);
     void take_descendants_from(LDIF_Entry& parent);
@@ -92,7 +98,7 @@ class LDIF_Entry {
 
     cisString name_;
     LDIF_DN dn_;
-    LDIF_DN relative_dn_;
+    size_t depth_ = 0;
     LDIF_Comment comment_;
     LDIF_Attributes attributes_;
     list children_;

@@ -153,7 +153,7 @@ void loader::attribute_line() {
 }
 
 void loader::add_attribute() {
-    LDIF_Attribute attribute(key_, line_, pending_);
+    LDIF_Attribute attribute(key_, line_, std::move(pending_));
     pending_.clear();
     reuse_line_ = false;
     if (open_) {

@@ -74,7 +74,7 @@ void drawing::draw(const LDIF_Entry& entry, bool is_last) {
     }
     text_.append(prefix_, 0, prefix_.size() - 1);
     text_.append(is_last ? style_.corner : style_.tee).append(entry.relative_dn().str());
-    if (entry.relative_dn().rdns().size() > 1) {
+    if (entry.relative_size() > 1) {
         text_ += " *";
         note_missing(entry);
     }
@@ -99,7 +99,7 @@ void drawing::draw_next_child() {
 /// Notes the ancestors that are missing between the entry and its parent in the tree.
 void drawing::note_missing(const LDIF_Entry& entry) {
     LDIF_DN missing = entry.dn();
-    for (size_t count = entry.relative_dn().rdns().size(); count > 1; --count) {
+    for (size_t count = entry.relative_size(); count > 1; --count) {
         missing.remove_leaf();
         undefined_.insert(missing);
     }

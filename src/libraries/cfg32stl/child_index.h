@@ -32,8 +32,8 @@ class child_index {
     /// of dn are left out; null for none.
     LDIF_Entry* equal_or_ancestor(const LDIF_DN& dn, size_t from) const;
 
-    /// The children that are descendants of dn, in order.
-    std::vector<position> descendants(const LDIF_DN& dn) const;
+    /// The children that are descendants of an entry that is to be their sibling, in order.
+    std::vector<position> descendants(const LDIF_Entry& sibling) const;
 
   private:
     struct numbered_child {

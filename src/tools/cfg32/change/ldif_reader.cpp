@@ -48,9 +48,10 @@ const auto* row_of(const Rows& rows, std::string_view name) {
 change_record::operation kind_of(const named_value& change_type) {
     const auto* type = row_of(change_types, change_type.value);
     if (!type) {
-        throw ldif_error{change_type.line,
-                         fmt::format("\"{}\" is no changetype: add, modify and delete are",
-                                     change_type.value.substr(0, change_type.value.find_first_of(" :")))};
+        throw ldif_error{
+            change_type.line,
+            fmt::format("\"{}\" is no changetype: add, modify and delete are",
+                        change_type.value.substr(0, change_type.value.find_first_of(" :")))};
     }
     if (!type->kind) {
         throw ldif_error{change_type.line,

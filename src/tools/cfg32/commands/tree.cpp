@@ -82,7 +82,7 @@ LDIF_Entry tree_from(const LDIF_Entry& base) {
 std::vector<LDIF_DN> missing_ancestors(const LDIF_Entry& node) {
     std::vector<LDIF_DN> missing;
     LDIF_DN dn = node.dn();
-    const size_t count = node.relative_dn().rdns().size();
+    const size_t count = node.relative_size();
     for (size_t i = 1; i < count && count < node.dn().rdns().size(); ++i) {
         dn.remove_leaf();
         missing.push_back(dn);
@@ -107,7 +107,7 @@ std::string drawing_of(const LDIF_Entry& base, drawing_style style) {
     std::string text =
         style == ascii ? IA5_TreeView(tree, missing, {}) : OEM_TreeView(tree, true, missing, {});
     text.erase(0, text.starts_with('\n') ? 1 : 0);
-    if (!base.is_root() && base.relative_dn().rdns().size() < base.dn().rdns().size()) {
+    if (!base.is_root() && base.depth() > 0) {
         mark_base(text, base, missing);
     }
     if (style == unicode) {
