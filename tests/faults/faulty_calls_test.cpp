@@ -62,7 +62,7 @@ const std::set<std::string> harmless = {
     "strnlen",
     "strrchr",
     "strtol",
-    "tolower",
+    "__ctype_tolower_loc",
     "vsnprintf",
     "wcslen",
     "wcstombs",

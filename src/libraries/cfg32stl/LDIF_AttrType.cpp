@@ -9,7 +9,9 @@
 #include <cstring>
 #include <iterator>
 #include <limits>
+#include <vector>
 
+#include "cisString.h"
 #include "enumerations.h"
 
 using namespace cfg32;
@@ -157,6 +159,17 @@ class row_index {
 };
 
 }  // namespace
+
+const cisString& cfg32::name_of(const _AttrType& row) {
+    static const std::vector<cisString> names = [] {
+        std::vector<cisString> all;
+        for (int i = 0; i < numAttrs; ++i) {
+            all.emplace_back(attrMap[i].name);
+        }
+        return all;
+    }();
+    return names[static_cast<size_t>(&row - attrMap)];
+}
 
 const _AttrType* getAttrType(const char* name) {
     // Initialised once, also when many threads make the first look-up together.

@@ -60,7 +60,13 @@ const _AttrType* getAttrType(const char* name);
 #include "syntaxes.def"
 #undef SYNTAX
 
+class cisString;
+
 namespace cfg32 {
+
+/// The row's name, once for all attributes that are spelled so. The row is one with a name, and
+/// lives after the first look-up.
+const cisString& name_of(const _AttrType& row);
 
 /// A hash of the value that goes with its type's match: equal values have equal hashes.
 size_t hash_of(const LDIF_Value& value);

@@ -1,5 +1,6 @@
 #include "LDIF_Attribute.h"
 
+#include <algorithm>
 #include <iterator>
 #include <utility>
 
@@ -33,7 +34,18 @@ LDIF_Attribute::LDIF_Attribute(aes_key_data* key, const LDIF_Line& line, LDIF_Co
         raise(illegal_line, std::string(line_type_name(line.type)) + " );");
     }
     values_ += line.value;
-    comment_ = std::move(comment);
+    if (!comment.empty()) {
+        comment_ = std::make_unique<LDIF_Comment>(std::move(comment));
+    }
+}
+
+LDIF_Attribute::LDIF_Attribute(const LDIF_Attribute& other)
+    : comment_(other.comment_ ? std::make_unique<LDIF_Comment>(*other.comment_) : nullptr),
+      values_(other.values_) {}
+
+const LDIF_Comment& LDIF_Attribute::comment() const {
+    static const LDIF_Comment none;
+    return comment_ ? *comment_ : none;
 }
 
 LDIF_Attribute& LDIF_Attribute::operator=(const LDIF_Attribute& other) {
@@ -44,14 +56,18 @@ LDIF_Attribute& LDIF_Attribute::operator=(const LDIF_Attribute& other) {
 
 LDIF_Attribute& LDIF_Attribute::operator+=(const LDIF_Attribute& other) {
     if (*this == other) {
-        comment_ += other.comment_;
+        *this += other.comment();
         values_ += other.values_;
     }
     return *this;
 }
 
 LDIF_Attribute& LDIF_Attribute::operator+=(const LDIF_Comment& comment) {
-    comment_ += comment;
+    if (comment_) {
+        *comment_ += comment;
+    } else if (!comment.empty()) {
+        comment_ = std::make_unique<LDIF_Comment>(comment);
+    }
     return *this;
 }
 
@@ -67,7 +83,7 @@ std::string LDIF_Attribute::str() const {
 }
 
 void LDIF_Attribute::append_to(std::string& out) const {
-    comment_.append_to(out);
+    comment().append_to(out);
     values_.append_to(out);
 }
 
@@ -149,6 +165,17 @@ LDIF_Attributes::iterator LDIF_Attributes::find(const cisString& name) {
 
 LDIF_Attributes::const_iterator LDIF_Attributes::find(const cisString& name) const {
     return const_cast<LDIF_Attributes*>(this)->find(name);
+}
+
+LDIF_Attributes::const_iterator LDIF_Attributes::find(const cisString& name,
+                                                      const _AttrType& type) const {
+    if (index_ || &type == defaultAttrType) {
+        return find(name);
+    }
+    // A name that is in the table has a row of its own.
+    return std::find_if(begin(), end(), [&](const LDIF_Attribute& attribute) {
+        return attribute.values().type() == &type;
+    });
 }
 
 std::string LDIF_Attributes::str() const {

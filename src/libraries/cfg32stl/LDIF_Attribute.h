@@ -17,7 +17,7 @@ class LDIF_Attribute {
     LDIF_Attribute(aes_key_data* key, const LDIF_Line& line, const LDIF_Comment& comment);
     /// The same; takes the comment over, if nothing is thrown.
     LDIF_Attribute(aes_key_data* key, const LDIF_Line& line, LDIF_Comment&& comment);
-    LDIF_Attribute(const LDIF_Attribute&) = default;
+    LDIF_Attribute(const LDIF_Attribute& other);
     LDIF_Attribute(LDIF_Attribute&&) noexcept = default;
     LDIF_Attribute& operator=(const LDIF_Attribute& other);
     LDIF_Attribute& operator=(LDIF_Attribute&&) noexcept = default;
@@ -37,7 +37,7 @@ class LDIF_Attribute {
     LDIF_Attribute& operator+=(const std::string& value);
 
     const cisString& name() const { return values_.name(); }
-    const LDIF_Comment& comment() const { return comment_; }
+    const LDIF_Comment& comment() const;
     const LDIF_Values& values() const { return values_; }
     LDIF_Values& values() { return values_; }
 
@@ -46,7 +46,7 @@ class LDIF_Attribute {
     void append_to(std::string& out) const;
 
   private:
-    LDIF_Comment comment_;
+    std::unique_ptr<LDIF_Comment> comment_;  // null for none, as most attributes have
     LDIF_Values values_;
 };
 
@@ -73,6 +73,8 @@ class LDIF_Attributes {
 
     iterator find(const cisString& name);
     const_iterator find(const cisString& name) const;
+    /// The same, for many entries: type is the name's row in the table.
+    const_iterator find(const cisString& name, const _AttrType& type) const;
     iterator erase(iterator position);
     iterator begin() { return attributes_.begin(); }
     iterator end() { return attributes_.end(); }

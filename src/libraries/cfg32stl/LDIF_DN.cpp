@@ -62,13 +62,20 @@ size_t common_root_side(const std::vector<LDIF_RDN>& left, const std::vector<LDI
     return static_cast<size_t>(end.first - left.begin());
 }
 
-template <class Parts, class Text>
-std::string joined(Parts first, Parts last, const char* separator, Text text) {
-    std::string out;
+/// Appends the parts' texts.
+template <class Parts>
+void append_joined(Parts first, Parts last, const char* separator, std::string& out) {
     for (Parts part = first; part != last; ++part) {
-        out.append(part == first ? "" : separator).append(text(*part));
+        part->append_to(part == first ? out : out += separator);
     }
-    return out;
+}
+
+/// What append_to() appends.
+template <class Printable>
+std::string text_of(const Printable& printable) {
+    std::string text;
+    printable.append_to(text);
+    return text;
 }
 
 void append_escaped_bytes(std::string_view bytes, std::string& out) {
@@ -79,40 +86,49 @@ void append_escaped_bytes(std::string_view bytes, std::string& out) {
 
 /// Appends the characters of text; the ones in escaped are preceded by a backslash. A byte that
 /// is no character in the locale is written in hexadecimal, so that the line stays readable.
-void append_characters(std::string_view text, std::string_view escaped, std::string& out) {
+void append_characters(std::string_view text, const character_set& escaped, std::string& out) {
     while (!text.empty()) {
+        const auto is_ordinary = [&](char c) { return c >= '\0' && !escaped.has(c); };
+        const auto end = std::find_if_not(text.begin(), text.end(), is_ordinary);
+        const auto count = static_cast<size_t>(end - text.begin());
+        out.append(text.substr(0, count));
+        text.remove_prefix(count);
+        if (text.empty()) {
+            return;
+        }
         const character next = first_character(text);
         if (!next.is_valid) {
             append_escaped_bytes(next.bytes, out);
         } else {
-            const bool is_escaped = next.bytes.size() == 1 &&
-                                    escaped.find(next.bytes.front()) != std::string_view::npos;
-            out.append(is_escaped ? "\\" : "").append(next.bytes);
+            out.append(escaped.has(next.bytes.front()) ? "\\" : "").append(next.bytes);
         }
         text.remove_prefix(next.bytes.size());
     }
 }
 
-std::string hex_text(const std::string& bytes) {
-    std::string out = "#";
+void append_hex(const std::string& bytes, std::string& out) {
+    out += '#';
     for (const char byte : bytes) {
         byte2hex(static_cast<unsigned char>(byte), out);
     }
-    return out;
 }
 
-std::string quoted_text(const std::string& value) {
-    std::string out = "\"";
-    append_characters(value, "\\\"", out);
-    return out += '"';
+void append_quoted(const std::string& value, std::string& out) {
+    static const character_set escaped("\\\"");
+    out += '"';
+    append_characters(value, escaped, out);
+    out += '"';
 }
 
-/// Whitespace at either end is written in hexadecimal, whitespace in the middle as it is.
-std::string plain_text(const std::string& value) {
-    size_t begin = value.size();  // of the first character that is not whitespace
-    size_t end = begin;           // of the last one
-    for (size_t at = 0; at < value.size();) {
-        const character next = first_character(std::string_view(value).substr(at));
+/// The part of a text from its first character that is not whitespace to its last.
+std::string_view without_space_around(std::string_view text) {
+    if (is_plain(text)) {
+        return without_trailing_space(without_leading_space(text));
+    }
+    size_t begin = text.size();
+    size_t end = begin;
+    for (size_t at = 0; at < text.size();) {
+        const character next = first_character(text.substr(at));
         const bool is_whitespace = next.is_valid && is_space(next.code);
         if (!is_whitespace) {
             begin = std::min(begin, at);
@@ -120,12 +136,17 @@ std::string plain_text(const std::string& value) {
         }
         at += next.bytes.size();
     }
-    std::string out;
+    return text.substr(begin, end - begin);
+}
+
+/// Whitespace at either end is written in hexadecimal, whitespace in the middle as it is.
+void append_plain(const std::string& value, std::string& out) {
     const std::string_view text = value;
+    const std::string_view middle = without_space_around(text);
+    const auto begin = static_cast<size_t>(middle.data() - text.data());
     append_escaped_bytes(text.substr(0, begin), out);
-    append_characters(text.substr(begin, end - begin), special, out);
-    append_escaped_bytes(text.substr(end), out);
-    return out;
+    append_characters(middle, special_characters, out);
+    append_escaped_bytes(text.substr(begin + middle.size()), out);
 }
 
 size_t last_character_length(std::string_view text) {
@@ -156,17 +177,19 @@ LDIF_RDN_attribute::LDIF_RDN_attribute(cisString& text)
 LDIF_RDN_value::LDIF_RDN_value(cisString& text)
     : LDIF_RDN_value(consume(text, [](auto& parser) { return parser.value(); })) {}
 
-std::string LDIF_RDN_value::str() const {
+std::string LDIF_RDN_value::str() const { return text_of(*this); }
+
+void LDIF_RDN_value::append_to(std::string& out) const {
     if (text_.empty()) {
         raise(dn_failure::empty_value);
     }
     switch (form) {
         case hex:
-            return hex_text(text_);
+            return append_hex(text_, out);
         case quoted:
-            return quoted_text(text_);
+            return append_quoted(text_, out);
         default:
-            return plain_text(text_);
+            return append_plain(text_, out);
     }
 }
 
@@ -185,12 +208,19 @@ int LDIF_RDN_pair::compare(const LDIF_RDN_pair& other) const {
     return order != 0 ? order : value.compare(other.value);
 }
 
-std::string LDIF_RDN_pair::str() const { return attribute.str() + "=" + value.str(); }
+std::string LDIF_RDN_pair::str() const { return text_of(*this); }
+
+void LDIF_RDN_pair::append_to(std::string& out) const {
+    value.append_to(out.append(attribute.text()).append("="));
+}
 
 LDIF_RDN::LDIF_RDN(cisString& text)
     : LDIF_RDN(consume(text, [](auto& parser) { return parser.rdn(); })) {}
 
 LDIF_RDN::LDIF_RDN(std::vector<LDIF_RDN_pair>&& pairs) : pairs_(std::move(pairs)) {
+    if (pairs_.size() == 1) {
+        return;
+    }
     const auto less = [](const LDIF_RDN_pair& l, const LDIF_RDN_pair& r) { return l < r; };
     const auto equal = [](const LDIF_RDN_pair& l, const LDIF_RDN_pair& r) { return l == r; };
     std::stable_sort(pairs_.begin(), pairs_.end(), less);
@@ -206,9 +236,10 @@ LDIF_RDN& LDIF_RDN::operator+=(const LDIF_RDN_pair& pair) {
     return *this;
 }
 
-std::string LDIF_RDN::str() const {
-    return joined(pairs_.begin(), pairs_.end(), " + ",
-                  [](const LDIF_RDN_pair& pair) { return pair.str(); });
+std::string LDIF_RDN::str() const { return text_of(*this); }
+
+void LDIF_RDN::append_to(std::string& out) const {
+    append_joined(pairs_.begin(), pairs_.end(), " + ", out);
 }
 
 int LDIF_RDN::compare(const LDIF_RDN& other) const { return compare_steps(pairs_, other.pairs_); }
@@ -224,9 +255,13 @@ size_t LDIF_RDN::hash(size_t seed) const {
 LDIF_DN& LDIF_DN::operator=(const cisString& text) {
     const auto body = [&]() -> LDIF_DN& {
         std::vector<LDIF_RDN> parsed;  // leaf first
+        const auto is_separator = [](char c) { return c == ',' || c == ';'; };
+        parsed.reserve(static_cast<size_t>(
+            1 + std::count_if(text.text().begin(), text.text().end(), is_separator)));
         const auto keep = [&] {
-            rdns_.insert(rdns_.begin(), std::make_move_iterator(parsed.rbegin()),
-                         std::make_move_iterator(parsed.rend()));
+            std::reverse(parsed.begin(), parsed.end());
+            std::move(rdns_.begin(), rdns_.end(), std::back_inserter(parsed));
+            rdns_ = std::move(parsed);
         };
         try {
             parsing(text.text(), [&](auto parser) { parser.dn(parsed); });
@@ -262,9 +297,10 @@ void LDIF_DN::remove_root_side(size_t count) {
     rdns_.erase(rdns_.begin(), rdns_.begin() + static_cast<ptrdiff_t>(count));
 }
 
-std::string LDIF_DN::str() const {
-    return joined(rdns_.rbegin(), rdns_.rend(), ", ",
-                  [](const LDIF_RDN& rdn) { return rdn.str(); });
+std::string LDIF_DN::str() const { return text_of(*this); }
+
+void LDIF_DN::append_to(std::string& out) const {
+    append_joined(rdns_.rbegin(), rdns_.rend(), ", ", out);
 }
 
 size_t LDIF_DN::hash() const {

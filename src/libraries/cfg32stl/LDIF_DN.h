@@ -35,6 +35,7 @@ class LDIF_RDN_value : public cisString {
 
     /// Throws LDIF_Exception 34/1013 for an empty value.
     virtual std::string str() const;
+    void append_to(std::string& out) const;
 
     int form = quoted;
 };
@@ -56,6 +57,7 @@ class LDIF_RDN_pair {
 
     virtual int compare(const LDIF_RDN_pair& other) const;
     virtual std::string str() const;
+    void append_to(std::string& out) const;
     virtual bool operator==(const LDIF_RDN_pair& other) const { return compare(other) == 0; }
     virtual bool operator<(const LDIF_RDN_pair& other) const { return compare(other) < 0; }
     virtual bool operator>(const LDIF_RDN_pair& other) const { return compare(other) > 0; }
@@ -80,6 +82,7 @@ class LDIF_RDN {
     /// Inserts a pair in its place; one that is there already is dropped.
     virtual LDIF_RDN& operator+=(const LDIF_RDN_pair& pair);
     virtual std::string str() const;
+    void append_to(std::string& out) const;
     /// Pair by pair. An RDN that is a beginning of the other is the greater.
     virtual int compare(const LDIF_RDN& other) const;
     virtual bool operator==(const LDIF_RDN& other) const { return compare(other) == 0; }
@@ -120,6 +123,7 @@ class LDIF_DN {
     virtual LDIF_DN& operator-=(const LDIF_DN& ancestor);
     /// The canonical form: leaf first, joined by ", ".
     virtual std::string str() const;
+    void append_to(std::string& out) const;
     /// RDN by RDN from the root. An ancestor is greater than its descendants.
     virtual int compare(const LDIF_DN& other) const;
     virtual bool operator==(const LDIF_DN& other) const { return compare(other) == 0; }

@@ -48,8 +48,11 @@ class dn_parser {
     void skip(size_t count) { text_.remove_prefix(count); }
     void skip_space();
     std::string front(size_t count) const { return narrowed(text_.substr(0, count)); }
-    bool is_one_of(const std::string& characters, size_t position) const;
-    size_t count_of(const std::string& characters) const;
+    bool is_one_of(const character_set& characters, size_t position) const {
+        return position < text_.size() && characters.has(text_[position]);
+    }
+    size_t count_of(const character_set& characters) const;
+    bool has_oid_prefix() const;
 
     LDIF_RDN_value hex_value();
     LDIF_RDN_value quoted_value();
@@ -57,6 +60,7 @@ class dn_parser {
     bool take_byte(std::string& bytes);
     void take_escape(std::string& bytes);
     void take_character(std::string& bytes);
+    void take_ordinary(std::string& bytes, size_t& spaces);
 
     std::basic_string_view<Char> text_;
 };
@@ -71,15 +75,9 @@ void dn_parser<Char>::skip_space() {
     }
 }
 
-template <class Char>
-bool dn_parser<Char>::is_one_of(const std::string& characters, size_t position) const {
-    return position < text_.size() && is_ascii(text_[position]) &&
-           characters.find(static_cast<char>(text_[position])) != std::string::npos;
-}
-
 /// How many characters at the front are of that class.
 template <class Char>
-size_t dn_parser<Char>::count_of(const std::string& characters) const {
+size_t dn_parser<Char>::count_of(const character_set& characters) const {
     size_t count = 0;
     while (is_one_of(characters, count)) {
         ++count;
@@ -147,20 +145,29 @@ LDIF_RDN_pair dn_parser<Char>::pair() {
     return with_boundary(what, body, no_details);
 }
 
+/// "oid." or "OID." before a number.
+template <class Char>
+bool dn_parser<Char>::has_oid_prefix() const {
+    if (!is_one_of(digits, 4) || text_[3] != Char('.')) {
+        return false;
+    }
+    const std::string prefix = front(4);
+    return prefix == "oid." || prefix == "OID.";
+}
+
 template <class Char>
 std::string dn_parser<Char>::attribute() {
     if (at_end()) {
         raise(dn_failure::missing_attribute);
     }
-    const bool has_prefix = (front(4) == "oid." || front(4) == "OID.") && is_one_of(DIGIT, 4);
-    if (has_prefix) {
+    if (has_oid_prefix()) {
         skip(4);
     }
-    if (!is_one_of(ALPHA, 0) && !is_one_of(DIGIT, 0)) {
+    if (!is_one_of(letters, 0) && !is_one_of(digits, 0)) {
         const size_t equals = text_.find(Char('='));
         raise(dn_failure::invalid_attribute, front(equals != text_.npos ? equals : 20));
     }
-    const size_t length = count_of(is_one_of(ALPHA, 0) ? keyChar : oidChar);
+    const size_t length = count_of(is_one_of(letters, 0) ? key_characters : oid_characters);
     std::string name = front(length);
     skip(length);
     skip_space();
@@ -213,21 +220,31 @@ LDIF_RDN_value dn_parser<Char>::plain_value() {
         if (at('\\')) {
             take_escape(bytes);
             spaces = 0;
-        } else if (is_one_of(special, 0)) {
+        } else if (is_one_of(special_characters, 0)) {
             break;
         } else {
-            spaces = at(' ') ? spaces + 1 : 0;
-            take_character(bytes);
+            take_ordinary(bytes, spaces);
         }
     }
     cut_before_trailing_spaces(bytes, spaces);
     return {std::move(bytes), LDIF_RDN_value::plain};
 }
 
+/// Takes the characters before the next special one; counts the spaces at the end.
+template <class Char>
+void dn_parser<Char>::take_ordinary(std::string& bytes, size_t& spaces) {
+    size_t count = 0;
+    for (; count < text_.size() && !is_one_of(special_characters, count); ++count) {
+        spaces = text_[count] == Char(' ') ? spaces + 1 : 0;
+    }
+    bytes += front(count);
+    skip(count);
+}
+
 /// Takes two hexadecimal digits as one byte, if they stand at the front.
 template <class Char>
 bool dn_parser<Char>::take_byte(std::string& bytes) {
-    if (!is_one_of(hexChar, 0) || !is_one_of(hexChar, 1)) {
+    if (!is_one_of(hex_digits, 0) || !is_one_of(hex_digits, 1)) {
         return false;
     }
     bytes += static_cast<char>(16 * hex_digit(text_[0]) + hex_digit(text_[1]));
@@ -246,7 +263,7 @@ void dn_parser<Char>::take_escape(std::string& bytes) {
     if (take_byte(bytes)) {
         return;
     }
-    if (!is_one_of(special, 0) && !at(' ')) {
+    if (!is_one_of(special_characters, 0) && !at(' ')) {
         text_ = escape;
         raise(dn_failure::invalid_escape, front(3));
     }

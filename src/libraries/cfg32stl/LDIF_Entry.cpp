@@ -187,7 +187,8 @@ std::string LDIF_Entry::str() const {
 void LDIF_Entry::append_to(std::string& out) const {
     comment_.append_to(out);
     if (!is_root()) {
-        out.append(name_.text()).append(": ").append(dn_.str()).append("\n");
+        dn_.append_to(out.append(name_.text()).append(": "));
+        out += '\n';
     }
     attributes_.append_to(out);
     if (ends_with_blank_line()) {

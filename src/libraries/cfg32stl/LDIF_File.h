@@ -89,6 +89,12 @@ class LDIF_File {
                                const LDIF_Filter& filter, const LDIF_AttrFilter& attributes,
                                bool attributesOnly) const;
 
+    /// The entries themselves, which stay this file's until it is changed or refreshed. Throws the
+    /// same.
+    std::vector<const LDIF_Entry*> matches(const LDIF_DN& base,
+                                           const LDIF_Search_Results::Scope& scope,
+                                           const LDIF_Filter& filter) const;
+
     enum Authentication { not_authenticated, anonymous, administrator };
 
     /// Checks the credentials against the administrator's in the file; returns and keeps the
@@ -109,6 +115,7 @@ class LDIF_File {
     LDIF_File(const std::string& fileName, const std::string& backupFileName, not_loaded)
         : file_name_(fileName), backup_file_name_(backupFileName), key_(nullptr) {}
 
+    const LDIF_Entry& base_entry(const LDIF_DN& dn) const;
     bool is_current(const struct stat& status) const;
     bool load_if_changed();
     cfg32::locked_file locked(int flags, int operation) const;

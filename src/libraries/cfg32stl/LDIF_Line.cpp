@@ -37,8 +37,8 @@ class stream_source {
 /// A physical line as the rules see it: valid in the locale, without carriage returns.
 class physical_line {
   public:
-    explicit physical_line(std::string_view raw) : text_(raw) {
-        if (!is_plain(raw)) {
+    explicit physical_line(std::string_view raw) : text_(raw), is_plain_(is_plain(raw)) {
+        if (!is_plain_) {
             std::wstring wide = multibyte2wide(std::string(raw));
             w_stripCarriageReturn(wide);
             text_ = converted_ = wide2multibyte(wide);
@@ -52,20 +52,29 @@ class physical_line {
     physical_line& operator=(const physical_line&) = delete;
 
     std::string_view text() const { return text_; }
-    bool is_blank() const { return without_leading_space(text_).empty(); }
+    bool is_blank() const { return without_space_before(text_).empty(); }
     bool is_continuation() const {
-        return !text_.empty() && without_leading_space(text_).size() < text_.size();
+        return !text_.empty() && without_space_before(text_).size() < text_.size();
+    }
+    bool is_in_ascii() const { return is_plain_; }
+    /// A part of the text without the whitespace at its front, or at its end.
+    std::string_view without_space_before(std::string_view part) const {
+        return is_plain_ ? without_leading_ascii_space(part) : without_leading_space(part);
+    }
+    std::string_view without_space_behind(std::string_view part) const {
+        return is_plain_ ? without_trailing_ascii_space(part) : without_trailing_space(part);
     }
     /// The text that a continuation line adds: all but its first character, which is whitespace.
     std::string_view continuation() const;
 
   private:
     std::string_view text_;
+    const bool is_plain_;
     std::string converted_;
 };
 
 std::string_view physical_line::continuation() const {
-    if (is_plain(text_)) {
+    if (is_plain_) {
         return text_.substr(1);
     }
     const std::wstring first(1, multibyte2wide(std::string(text_)).front());
@@ -77,7 +86,8 @@ bool is_dn_name(std::string_view name) {
 }
 
 /// Splits the first physical line; returns where its value begins.
-std::string_view split(LDIF_Line& line, std::string_view text) {
+std::string_view split(LDIF_Line& line, const physical_line& first) {
+    const std::string_view text = first.text();
     const size_t colon = text.find(':');
     if (colon == 0 || colon == std::string_view::npos) {
         // A line that merely begins with "dn" counts as a DN line, so that what follows it is not
@@ -87,16 +97,17 @@ std::string_view split(LDIF_Line& line, std::string_view text) {
         line.hasSeparator = 0;
         return {};
     }
-    line.attribute = without_trailing_space(text.substr(0, colon));
+    line.attribute = first.without_space_behind(text.substr(0, colon));
     line.type = is_dn_name(line.attribute) ? LDIF_Line::dn : LDIF_Line::attr;
     const size_t value = text.find_first_not_of(':', colon);
     return value == std::string_view::npos ? std::string_view()
-                                           : without_leading_space(text.substr(value));
+                                           : first.without_space_before(text.substr(value));
 }
 
 /// Reads a logical line: see LDIF_Line::next.
 template <class Source>
 int read(LDIF_Line& line, Source& in, int last) {
+    std::string value = std::move(line.value);  // its memory serves; after a failure it has none
     line.value.clear();
     line.attribute.clear();
     line.type = LDIF_Line::endOfFile;
@@ -105,7 +116,7 @@ int read(LDIF_Line& line, Source& in, int last) {
     if (!in.good()) {
         return last;
     }
-    std::string value;
+    bool is_ascii_only = false;
     {
         const physical_line first(in.take());
         ++last;
@@ -118,21 +129,26 @@ int read(LDIF_Line& line, Source& in, int last) {
             line.value = first.text();
             return last;
         }
-        value = split(line, first.text());
+        value = split(line, first);
+        is_ascii_only = first.is_in_ascii();
     }
-    // KEPT: a line that is ended by the end of the file and not by a newline loses its value; it
-    // may have been cut off in the middle.
     while (!in.at_end()) {
         const auto before = in.position();
         const physical_line next(in.take());
         if (!next.is_continuation()) {
             in.go_back(before);
-            line.value = without_trailing_space(value);
+            value.resize((is_ascii_only ? without_trailing_ascii_space(value)
+                                        : without_trailing_space(value))
+                             .size());
+            line.value = std::move(value);
             return last;
         }
         value += next.continuation();
+        is_ascii_only = is_ascii_only && next.is_in_ascii();
         ++last;
     }
+    // KEPT: a line that is ended by the end of the file and not by a newline loses its value; it
+    // may have been cut off in the middle.
     return last;
 }
 

@@ -1,6 +1,9 @@
 #include "LDIF_Search.h"
 
+#include <cstdlib>
+#include <exception>
 #include <ostream>
+#include <utility>
 
 #include "LDIF_File.h"
 #include "LDIF_Util.h"
@@ -70,12 +73,21 @@ LDIF_Filter& LDIF_Filter::operator=(const std::string& text) {
 
 bool LDIF_Filter::match(const LDIF_Entry& entry) const {
     const LDIF_Attributes& attributes = entry.attributes();
-    const auto attribute = attributes.find(attribute_);
+    if (!type_) {
+        type_ = getAttrType(attribute_.c_str());
+    }
+    const auto attribute = attributes.find(attribute_, *type_);
     if (attribute == attributes.end()) {
         return false;
     }
     const LDIF_Values& values = attribute->values();
-    return any_value_ || values.find(value_) != values.end();
+    if (any_value_ || values.empty()) {
+        return any_value_;
+    }
+    if (!wanted_ || wanted_->key != values.key()) {
+        wanted_.emplace(values.type(), value_, values.key());
+    }
+    return values.find(*wanted_) != values.end();
 }
 
 LDIF_Search_Results::LDIF_Search_Results(const Scope& scope, const LDIF_Filter& filter,
@@ -83,20 +95,63 @@ LDIF_Search_Results::LDIF_Search_Results(const Scope& scope, const LDIF_Filter& 
     : scope_(scope), filter_(filter), attributes_(attributes), attributes_only_(attributesOnly) {}
 
 LDIF_Search_Results& LDIF_Search_Results::addEntry(const LDIF_Entry& entry, const bool& isBase) {
+    // Below the base one level is the entry alone.
+    const Scope scope = !isBase && scope_ == OneLevel ? Base : scope_;
+    for (const LDIF_Entry* found : matches(entry, scope, filter_)) {
+        add_match(*found);
+    }
+    return *this;
+}
+
+namespace {
+
+using open_entries = std::vector<std::pair<const LDIF_Entry*, LDIF_Entry::list::const_iterator>>;
+
+/// Throws the failure again, from within each of the entries that were entered.
+[[noreturn]] void fail_within(const open_entries& open, size_t depth,
+                              const std::exception_ptr& failure) {
+    const LDIF_Entry& entry = *open[depth].first;
     const auto body = [&] {
-        if (filter_.match(entry) && !(isBase && scope_ == OneLevel)) {
-            add_match(entry);
+        if (depth + 1 == open.size()) {
+            std::rethrow_exception(failure);
         }
-        if (scope_ != Base && (isBase || scope_ == Subtree)) {
-            for (const LDIF_Entry& child : entry.children()) {
-                addEntry(child, false);
-            }
-        }
+        fail_within(open, depth + 1, failure);
     };
     // KEPT: the entry is told by its whole text, not by its DN.
     with_boundary(in("LDIF_Search_Results::addEntry()"), body,
                   [&](LDIF_Exception& e) { e.entryDn = shown(entry); });
-    return *this;
+    std::abort();  // the body has thrown
+}
+
+}  // namespace
+
+std::vector<const LDIF_Entry*> cfg32::matches(const LDIF_Entry& base,
+                                              LDIF_Search_Results::Scope scope,
+                                              const LDIF_Filter& filter) {
+    using results = LDIF_Search_Results;
+    std::vector<const LDIF_Entry*> found;
+    open_entries open;  // from the base down
+    const auto enter = [&](const LDIF_Entry& entry) {
+        const bool is_base = open.empty();
+        const bool is_walked = scope == results::Subtree || (is_base && scope == results::OneLevel);
+        open.emplace_back(&entry, is_walked ? entry.children().begin() : entry.children().end());
+        if (filter.match(entry) && !(is_base && scope == results::OneLevel)) {
+            found.push_back(&entry);
+        }
+    };
+    try {
+        enter(base);
+        while (!open.empty()) {
+            auto& [entry, next] = open.back();
+            next == entry->children().end() ? open.pop_back() : enter(*next++);
+        }
+    } catch (...) {
+        if (open.empty()) {
+            throw;
+        }
+        fail_within(open, 0, std::current_exception());
+    }
+    return found;
 }
 
 void LDIF_Search_Results::add_match(const LDIF_Entry& entry) {
@@ -133,12 +188,24 @@ LDIF_Search_Results LDIF_File::search(const LDIF_DN& base, const LDIF_Search_Res
                                       bool attributesOnly) const {
     const auto body = [&] {
         LDIF_Search_Results results(scope, filter, attributes, attributesOnly);
-        const LDIF_Entry* entry = root_.find(base);
-        if (!entry) {
-            raise(no_base);
-        }
-        results += *entry;
+        results += base_entry(base);
         return results;
     };
     return with_system_error(in("LDIF_File::search()"), body, no_details);
+}
+
+std::vector<const LDIF_Entry*> LDIF_File::matches(const LDIF_DN& base,
+                                                  const LDIF_Search_Results::Scope& scope,
+                                                  const LDIF_Filter& filter) const {
+    return with_system_error(
+        in("LDIF_File::search()"), [&] { return cfg32::matches(base_entry(base), scope, filter); },
+        no_details);
+}
+
+const LDIF_Entry& LDIF_File::base_entry(const LDIF_DN& dn) const {
+    const LDIF_Entry* entry = root_.find(dn);
+    if (!entry) {
+        raise(no_base);
+    }
+    return *entry;
 }

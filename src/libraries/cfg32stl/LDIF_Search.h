@@ -1,6 +1,7 @@
 #pragma once
 
 #include <iosfwd>
+#include <optional>
 #include <set>
 #include <string>
 #include <vector>
@@ -32,7 +33,9 @@ class LDIF_Filter {
   private:
     cisString attribute_ = "objectclass";
     std::string value_;
-    bool any_value_ = true;  // the attribute's presence is all that counts
+    bool any_value_ = true;                     // the attribute's presence is all that counts
+    mutable const _AttrType* type_ = nullptr;   // the attribute's, once it was looked up
+    mutable std::optional<LDIF_Value> wanted_;  // the value, once an attribute has told its type
 };
 
 /// The names of the wanted attributes; empty means all.
@@ -64,3 +67,12 @@ class LDIF_Search_Results {
 };
 
 std::ostream& operator<<(std::ostream& out, const LDIF_Search_Results& results);
+
+namespace cfg32 {
+
+/// The entries that the scope reaches from the base on and the filter matches, each before those
+/// below it. They stay the tree's.
+std::vector<const LDIF_Entry*> matches(const LDIF_Entry& base, LDIF_Search_Results::Scope scope,
+                                       const LDIF_Filter& filter);
+
+}  // namespace cfg32

@@ -14,6 +14,15 @@ const std::string keyChar = ALPHA + DIGIT + "-";
 const std::string oidChar = DIGIT + ".";
 const std::string special = ",=+<>#;\\\"";
 
+namespace cfg32 {
+const character_set letters(ALPHA);
+const character_set digits(DIGIT);
+const character_set hex_digits(hexChar);
+const character_set key_characters(keyChar);
+const character_set oid_characters(oidChar);
+const character_set special_characters(special);
+}  // namespace cfg32
+
 const char* const empty_str = "";
 
 using namespace cfg32;
@@ -171,9 +180,10 @@ character first_character(std::string_view text) {
 }
 
 size_t hash_without_case(const char* text, size_t seed) {
-    // FNV-1a. The case is folded by the locale, as strcasecmp does.
+    // FNV-1a. The case is folded by the locale, as strcasecmp does; this is the table of tolower().
+    const int32_t* const lower_case = *__ctype_tolower_loc();
     for (; *text != '\0'; ++text) {
-        const int folded = tolower(static_cast<unsigned char>(*text));
+        const int folded = lower_case[static_cast<unsigned char>(*text)];
         seed = (seed ^ static_cast<size_t>(folded)) * 0x100000001b3;
     }
     return seed;

@@ -4,6 +4,7 @@
 // locale is classified right; stored text is narrow. Text that is plain ASCII reads the same in
 // every character set a locale can have here (POSIX, XBD 6.1), so it is never converted.
 
+#include <array>
 #include <string>
 #include <string_view>
 
@@ -61,12 +62,52 @@ constexpr bool is_ascii(Char c) {
     return static_cast<unsigned long>(c) - 1 < 0x7f;
 }
 
+/// A set of ASCII characters, in which one is found at once.
+class character_set {
+  public:
+    explicit character_set(std::string_view characters) {
+        for (const char c : characters) {
+            has_[static_cast<size_t>(c)] = true;
+        }
+    }
+
+    template <class Char>
+    bool has(Char c) const {
+        return is_ascii(c) && has_[static_cast<size_t>(c)];
+    }
+
+  private:
+    std::array<bool, 128> has_{};
+};
+
+// The character classes as sets.
+extern const character_set letters;
+extern const character_set digits;
+extern const character_set hex_digits;
+extern const character_set key_characters;
+extern const character_set oid_characters;
+extern const character_set special_characters;
+
 /// Whitespace test for ASCII characters.
 constexpr bool is_ascii_space(char c) { return c == ' ' || (c >= '\t' && c <= '\r'); }
 
 /// The text without the whitespace at its front, or at its end, as a part of it.
 std::string_view without_leading_space(std::string_view text);
 std::string_view without_trailing_space(std::string_view text);
+
+/// The same of text of which it is known that it is plain.
+inline std::string_view without_leading_ascii_space(std::string_view text) {
+    while (!text.empty() && is_ascii_space(text.front())) {
+        text.remove_prefix(1);
+    }
+    return text;
+}
+inline std::string_view without_trailing_ascii_space(std::string_view text) {
+    while (!text.empty() && is_ascii_space(text.back())) {
+        text.remove_suffix(1);
+    }
+    return text;
+}
 
 /// The first character of a text in the locale's character set.
 struct character {

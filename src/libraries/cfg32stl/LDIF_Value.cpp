@@ -133,11 +133,26 @@ int LDIF_Value::compare(const std::string& other) const {
 
 std::ostream& operator<<(std::ostream& out, const LDIF_Value& value) { return out << value.str(); }
 
+attribute_name::attribute_name(const std::string& name, const _AttrType& type) {
+    if (type.name && name == type.name) {
+        table_ = &name_of(type);
+    } else {
+        own_ = std::make_unique<cisString>(name);
+    }
+}
+
+attribute_name::attribute_name(const attribute_name& other)
+    : table_(other.table_), own_(other.own_ ? std::make_unique<cisString>(*other.own_) : nullptr) {}
+
+attribute_name& attribute_name::operator=(const attribute_name& other) {
+    return *this = attribute_name(other);
+}
+
 LDIF_Values::LDIF_Values(const std::string& name, aes_key_data* key)
-    : name_(name), type_(getAttrType(name.empty() ? nullptr : name.c_str())), key_(key) {}
+    : type_(getAttrType(name.empty() ? nullptr : name.c_str())), name_(name, *type_), key_(key) {}
 
 LDIF_Values::LDIF_Values(const LDIF_Values& other)
-    : values_(other.values_), name_(other.name_), type_(other.type_), key_(other.key_) {}
+    : values_(other.values_), type_(other.type_), name_(other.name_), key_(other.key_) {}
 
 LDIF_Values& LDIF_Values::operator=(const LDIF_Values& other) {
     if (this == &other) {
@@ -211,7 +226,7 @@ LDIF_Values& LDIF_Values::operator-=(const std::string& text) {
 void LDIF_Values::complete(LDIF_Exception& e) const {
     e.attrType = type_;
     if (e.attribute.empty()) {
-        e.attribute = name_.text();
+        e.attribute = name().text();
     }
 }
 
@@ -299,6 +314,6 @@ std::string LDIF_Values::str() const {
 
 void LDIF_Values::append_to(std::string& out) const {
     for (const LDIF_Value& value : values_) {
-        out.append(name_.text()).append(": ").append(value.str()).append("\n");
+        out.append(name().text()).append(": ").append(value.str()).append("\n");
     }
 }

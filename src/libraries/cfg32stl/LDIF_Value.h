@@ -22,6 +22,27 @@ struct free_deleter {
 
 }  // namespace cfg32
 
+namespace cfg32 {
+
+/// An attribute's name as the caller wrote it. Where that is the table's spelling it is kept there.
+class attribute_name {
+  public:
+    attribute_name(const std::string& name, const _AttrType& type);
+    attribute_name(const attribute_name& other);
+    attribute_name(attribute_name&&) noexcept = default;
+    attribute_name& operator=(const attribute_name& other);
+    attribute_name& operator=(attribute_name&&) noexcept = default;
+    ~attribute_name() = default;
+
+    const cisString& get() const { return own_ ? *own_ : *table_; }
+
+  private:
+    const cisString* table_ = nullptr;
+    std::unique_ptr<cisString> own_;
+};
+
+}  // namespace cfg32
+
 /// A value of a type, checked by the type's syntax when it is made. The syntaxes read and fill the
 /// members.
 class LDIF_Value {
@@ -93,8 +114,9 @@ class LDIF_Values {
     bool empty() const { return values_.empty(); }
     size_t size() const { return values_.size(); }
 
-    const cisString& name() const { return name_; }  ///< as the caller wrote it
+    const cisString& name() const { return name_.get(); }  ///< as the caller wrote it
     const _AttrType* type() const { return type_; }
+    aes_key_data* key() const { return key_; }
 
     /// A line "name: value" for each value.
     std::string str() const;
@@ -111,8 +133,8 @@ class LDIF_Values {
     void forget(list::const_iterator value);
 
     list values_;
-    cisString name_;
     const _AttrType* type_;
+    cfg32::attribute_name name_;
     aes_key_data* key_;
     std::unique_ptr<hash_index> index_;  // of long lists only
 };

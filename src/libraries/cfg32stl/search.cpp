@@ -98,12 +98,15 @@ class result_builder {
     result_builder(const LDIF_File& file, const LDIF_AttrFilter& wanted, aes_key_data* key)
         : file_(file), wanted_(wanted), key_(key) {}
 
-    void add(const LDIF_Search_Results& results, CfgMessage** first) const {
+    void add(const std::vector<const LDIF_Entry*>& found, CfgMessage** first) const {
         message_chain entries(first);
-        for (const LDIF_Entry& entry : results.entries()) {
+        std::string dn;
+        for (const LDIF_Entry* entry : found) {
             CfgMessage& node = entries.append(entry_message);
-            node.text = copy_of(entry.dn().str());
-            add_attributes(entry, node);
+            dn.clear();
+            entry->dn().append_to(dn);
+            node.text = copy_of(dn);
+            add_attributes(*entry, node);
         }
     }
 
@@ -111,6 +114,9 @@ class result_builder {
     void add_attributes(const LDIF_Entry& entry, CfgMessage& parent) const {
         message_chain attributes(&parent.child);
         for (const LDIF_Attribute& attribute : entry.attributes()) {
+            if (!wanted_.empty() && !wanted_.contains(attribute.name())) {
+                continue;
+            }
             CfgMessage& node = attributes.append(attribute_message);
             node.text = copy_of(attribute.name().text());
             add_values(attribute, parent.text, node);
@@ -152,7 +158,8 @@ LDIF_AttrFilter wanted_attributes(char** names) {
 }
 
 /// Builds the result, or releases what was built of it.
-int build(const result_builder& builder, const LDIF_Search_Results& found, CfgMessage** result) {
+int build(const result_builder& builder, const std::vector<const LDIF_Entry*>& found,
+          CfgMessage** result) {
     const auto release = [&] {
         cfg_msgfree(*result);
         *result = nullptr;
@@ -172,7 +179,7 @@ int build(const result_builder& builder, const LDIF_Search_Results& found, CfgMe
 }  // namespace
 
 int cfg_search_s(CfgHandle* handle, const char* base, int scope, const char* filter, char** attrs,
-                 int attrsonly, CfgMessage** result) noexcept {
+                 int, CfgMessage** result) noexcept {
     // cppcheck-suppress throwInNoexceptFunction  ; bound_call lets nothing through
     return bound_call(handle, "cfg_search_s()", [&](LDIF_File& file) -> int {
         if (!result || !base) {
@@ -183,8 +190,8 @@ int cfg_search_s(CfgHandle* handle, const char* base, int scope, const char* fil
         const LDIF_DN dn{cisString(base)};
         const LDIF_Filter wanted_entries{std::string(filter ? filter : "")};
         const LDIF_AttrFilter wanted = wanted_attributes(attrs);
-        const LDIF_Search_Results found =
-            file.search(dn, scope_of(scope), wanted_entries, wanted, attrsonly != 0);
+        const std::vector<const LDIF_Entry*> found =
+            file.matches(dn, scope_of(scope), wanted_entries);
         return build(result_builder(file, wanted, handle->keyData), found, result);
     });
 }
