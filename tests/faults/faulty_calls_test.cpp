@@ -48,6 +48,7 @@ const std::set<std::string> harmless = {
     "wmemmove",
     "wmemset",
     // text
+    "__ctype_tolower_loc",
     "iswspace",
     "mbrtowc",
     "mbstowcs",
@@ -62,7 +63,6 @@ const std::set<std::string> harmless = {
     "strnlen",
     "strrchr",
     "strtol",
-    "__ctype_tolower_loc",
     "vsnprintf",
     "wcslen",
     "wcstombs",

@@ -163,6 +163,7 @@ class row_index {
 const cisString& cfg32::name_of(const _AttrType& row) {
     static const std::vector<cisString> names = [] {
         std::vector<cisString> all;
+        all.reserve(static_cast<size_t>(numAttrs));
         for (int i = 0; i < numAttrs; ++i) {
             all.emplace_back(attrMap[i].name);
         }

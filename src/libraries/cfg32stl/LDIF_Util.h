@@ -67,13 +67,13 @@ class character_set {
   public:
     explicit character_set(std::string_view characters) {
         for (const char c : characters) {
-            has_[static_cast<size_t>(c)] = true;
+            has_[static_cast<unsigned char>(c)] = true;
         }
     }
 
     template <class Char>
     bool has(Char c) const {
-        return is_ascii(c) && has_[static_cast<size_t>(c)];
+        return is_ascii(c) && has_[static_cast<unsigned char>(c)];
     }
 
   private:

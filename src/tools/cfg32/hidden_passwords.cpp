@@ -26,10 +26,6 @@ const cisString kept_line_attribute = "oru-slapdInvalidLine";
 /// What people put between a name and a value.
 constexpr std::string_view separators = ":;,=< \t\v\f";
 
-/// What names of passwords have in them; of those that begin alike the longest first.
-constexpr std::string_view marks[] = {"password", "passwort", "passphrase", "passwd",
-                                      "pass",     "pwd",      "pw",         "secret"};
-
 /// What hides a password says how it is stored: an encrypted or hashed text hides itself.
 std::string shown_password(const std::string& stored) {
     const cisString tag = stored.substr(0, sizeof iMASK_BRACED);
@@ -38,63 +34,6 @@ std::string shown_password(const std::string& stored) {
         stored.starts_with('{') && !is_masked &&
         check_format(stored.c_str(), static_cast<int>(stored.size())) != clear_text;
     return stored.empty() || hides_itself ? stored : std::string(hidden_text);
-}
-
-std::string lower(std::string_view text) {
-    std::string small(text);
-    std::transform(small.begin(), small.end(), small.begin(),
-                   [](char c) { return c >= 'A' && c <= 'Z' ? static_cast<char>(c | 0x20) : c; });
-    return small;
-}
-
-/// The part of a text behind the first mark of a password; none without one.
-std::optional<size_t> end_of_mark(std::string_view small) {
-    size_t begin = std::string_view::npos;
-    size_t end = 0;
-    for (const std::string_view mark : marks) {
-        const size_t found = small.find(mark);
-        if (found < begin) {
-            begin = found;
-            end = found + mark.size();
-        }
-    }
-    return begin == std::string_view::npos ? std::nullopt : std::optional(end);
-}
-
-/// What tells the names of the table's passwords apart, in lower case.
-const std::vector<std::string>& known_passwords() {
-    static const std::vector<std::string> all = [] {
-        constexpr std::string_view beginning = "oru-slapd";
-        std::vector<std::string> names;
-        for (const _AttrType* row : all_attributes()) {
-            if (is_password_attribute(row->name)) {
-                names.push_back(lower(row->name).substr(beginning.size()));
-            }
-        }
-        return names;
-    }();
-    return all;
-}
-
-/// Rather true than false: what is no attribute's name may be meant for a password's.
-bool is_password_name(std::string_view name) {
-    if (name.empty() || find_attribute(name)) {
-        return is_password_attribute(name);
-    }
-    const std::vector<std::string_view> near = near_attributes(name);
-    return end_of_mark(lower(name)) || std::any_of(near.begin(), near.end(), is_password_attribute);
-}
-
-/// How much of a password's name is one: the password may follow it without a separator.
-size_t length_of_name(std::string_view name) {
-    const std::string small = lower(name);
-    for (const std::string& known : known_passwords()) {
-        const size_t found = small.find(known);
-        if (found != std::string::npos) {
-            return found + known.size();
-        }
-    }
-    return nearest_attribute(name) ? name.size() : end_of_mark(small).value_or(name.size());
 }
 
 /// A line as it is meant.
@@ -275,10 +214,6 @@ class judged_line {
 };
 
 }  // namespace
-
-bool is_password_attribute(std::string_view name) {
-    return getAttrType(std::string(name).c_str())->fromStr == pwFromStr;
-}
 
 std::string shown_value(std::string_view attribute, std::string_view value) {
     if (is_password_attribute(attribute)) {

@@ -7,13 +7,12 @@
 #include <string_view>
 #include <vector>
 
+#include "password_names.h"
+
 namespace cfg32::tool {
 
 /// What takes the place of text that is not to be seen.
 inline constexpr std::string_view hidden_text = "********";
-
-/// True for the attributes whose values are passwords.
-bool is_password_attribute(std::string_view name);
 
 /// A value as people and programs may see it. Like a line's, it is hidden as well where the name
 /// looks like a password's and the table does not know it as another attribute.
