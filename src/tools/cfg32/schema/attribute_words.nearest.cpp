@@ -94,8 +94,8 @@ size_t edit_distance(const letters& left_letters, const letters& right_letters, 
         return too_far;
     }
     using row = std::array<size_t, 2 * longest_given>;
-    row rows[3];  // the last one, the one before it, and the next
-    row *before = &rows[0], *last = &rows[1], *next = &rows[2];
+    row first, second, third;
+    row *before = &first, *last = &second, *next = &third;  // in turn
     last->fill(too_far);
     for (size_t j = 0; j <= std::min(bound, right.size()); ++j) {
         (*last)[j] = j;
