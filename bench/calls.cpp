@@ -161,9 +161,8 @@ double median(std::vector<double> times) {
 void load(const std::string& file, const probe&) {
     handle* loaded = nullptr;
     const double loading = time_of([&] { loaded = new handle(file); });
-    const query all = {"count", "cn=Configuration", CFG_SCOPE_SUBTREE, "objectclass=*", {"cn"},
-                       false};
-    const size_t entries = count_found(*loaded, all);
+    // Counting them here would be part of the memory that the load is measured by.
+    const size_t entries = std::stoul(environment("CFG_BENCH_ENTRIES", "0"));
     print_result("load", 1, loading, entries);
     print_result("unload", 1, time_of([&] { delete loaded; }), entries);
 }
