@@ -290,3 +290,22 @@ Of an entry's draft the lines are the draft's, and of the rest the file's:
     (e)dit again, (w)rite or (d)rop? d
     cfg32: dropped; nothing was written
     [1]
+
+A draft without text deletes the entry; what follows it is the file's:
+
+    $ printf 'dn: cn=Configuration\ncn: x\n\ndn: cn=a, cn=Configuration\ncn: a\n\ndn: cn=b, cn=a, cn=Configuration\ncn: b\n\n' > tree.conf
+    $ edit_by ': > "$1"'
+    $ in_terminal '(d)rop?' w -- cfg32 -f tree.conf edit "cn=a, cn=Configuration"
+    tree.conf:7:5: warning: no entry "cn=a, cn=Configuration" above this one [missing-ancestor]
+        7 | dn: cn=b, cn=a, cn=Configuration
+          |     ^~~~~~~~~~~~~~~~~~~~~~~~~~~~
+    1 warning
+    (e)dit again, (w)rite or (d)rop? w
+    $ cat tree.conf
+    dn: cn=Configuration
+    cn: x
+    
+    
+    dn: cn=b, cn=a, cn=Configuration
+    cn: b
+    

@@ -85,7 +85,7 @@ edited_text::findings edited_text::check(const std::string& draft, aes_key_data*
     const std::vector<problem> all = find_problems(with(draft), key);
     found.is_loadable = can_be_loaded(all);
     const bool is_whole_file = end_ - begin_ == before_.size();
-    const bool runs_on = draft.empty() || draft.back() != '\n';
+    const bool runs_on = !draft.empty() && draft.back() != '\n';
     const line_map lines{first_line_, lines_of(part()),
                          lines_of(draft) + (is_whole_file || runs_on ? 1 : 0)};
     for (problem each : all) {

@@ -10,7 +10,6 @@
 #include <utility>
 
 #include "LDIF_File.h"
-#include "cfg32.h"
 #include "cfg32_platform.h"
 #include "file_lock.h"
 #include "held_back_signals.h"
@@ -66,7 +65,7 @@ void replace_file(const std::string& name, const std::string& backup_name,
     try {
         LDIF_File::replace(name, backup_name, content, expected);
     } catch (const LDIF_Exception& e) {
-        if (e.ldapErr == CFG_INSUFFICIENT_ACCESS) {  // the library does not tell where to
+        if (message_of(e).starts_with("Unable to backup")) {  // the library does not tell where to
             throw ended(failed, report(e, name) + "\n  backup: " + backup_name);
         }
         throw;

@@ -11,8 +11,6 @@
 #include <filesystem>
 #include <memory>
 
-#include "LDIF_Exception.h"
-#include "LDIF_File.h"
 #include "arguments.h"
 #include "check/check_report.h"
 #include "command.h"
