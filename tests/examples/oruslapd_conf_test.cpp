@@ -103,7 +103,7 @@ TEST_F(oruslapd_conf, EveryPasswordIsStoredEncodedAndAllButTheHashedOneDecode) {
         ++passwords;
         // A text that is not encoded would have been encoded anew.
         EXPECT_NE(text.find(value.text), std::string::npos) << value.text;
-        if (value.text.starts_with("{SSHA}")) {
+        if (value.str().starts_with("{SSHA}")) {
             ++hashed;
         } else {
             EXPECT_EQ(value.compare(value), 0) << value.text;

@@ -21,7 +21,7 @@ inline void describe(const LDIF_Entry& entry, size_t depth, bool is_first, std::
     for (const LDIF_Attribute& attribute : entry.attributes()) {
         out += attribute.comment().str() + margin + attribute.name().text() + "\n";
         for (const LDIF_Value& value : attribute.values()) {
-            out += margin + "  <" + value.text + ">\n";
+            out += margin + "  <" + value.str() + ">\n";
         }
     }
     for (const LDIF_Entry& child : entry.children()) {

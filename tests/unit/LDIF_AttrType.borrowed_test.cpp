@@ -61,7 +61,8 @@ const std::map<std::string, syntax> syntaxes = {
 #undef OPERATIONS
 
 std::string stored(const LDIF_Value& value) {
-    std::string text = "text " + value.text + ", length " + std::to_string(value.binaryLength);
+    std::string text =
+        "text " + value.text.str() + ", length " + std::to_string(value.binaryLength);
     for (int i = 0; value.binary && i < value.binaryLength; ++i) {
         text += " " + std::to_string(value.binary.get()[i]);
     }

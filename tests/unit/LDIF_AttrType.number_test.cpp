@@ -48,7 +48,7 @@ std::string stored(const LDIF_Value& value) {
     if (value.binary && value.binaryLength == 8) {
         memcpy(&number, value.binary.get(), sizeof number);
     }
-    return value.text + " " + std::to_string(number);
+    return value.text.str() + " " + std::to_string(number);
 }
 
 /// What a type makes of a text: "text number" or the failure.

@@ -98,8 +98,8 @@ TEST(LDIF_AttrType_password, AClearTextIsStoredEncodedByTheKey) {
     for (const auto& row : rows) {
         const key_pointer key = row.key_size != 0 ? key_of(row.key_size) : nullptr;
         const LDIF_Value value = password("secret", key.get());
-        EXPECT_TRUE(value.text.starts_with(row.tag)) << value.text;
-        EXPECT_EQ(value.text.find("secret"), std::string::npos);
+        EXPECT_TRUE(value.text.view().starts_with(row.tag)) << value.text;
+        EXPECT_EQ(value.text.view().find("secret"), std::string::npos);
         EXPECT_EQ(value.str(), value.text);
         EXPECT_EQ(value.binaryLength, 0);
         EXPECT_FALSE(value.binary);
@@ -114,7 +114,7 @@ TEST(LDIF_AttrType_password, EveryPasswordAttributeIsEncoded) {
           "oru-slapdPeerPW", "oru-slapdSslKeyDatabasePW", "oru-slapdSslPKCS11TokenPW",
           "oru-slapdProxyPw", "oru-slapdPtaBindPW"}) {
         const LDIF_Value value(getAttrType(name), "secret", nullptr);
-        EXPECT_TRUE(value.text.starts_with("{iMASK}>")) << name;
+        EXPECT_TRUE(value.text.view().starts_with("{iMASK}>")) << name;
         EXPECT_EQ(summary(failure_of(
                       [&] { LDIF_Value(getAttrType(name), std::string(1025, 'a'), nullptr); })),
                   length_message);
@@ -125,7 +125,7 @@ TEST(LDIF_AttrType_password, AClearTextHas1To1024Bytes) {
     const std::string longest(1024, 'a');
     const LDIF_Value value = password(longest);
     EXPECT_NE(value.text, longest);
-    EXPECT_TRUE(value.text.starts_with("{iMASK}>"));
+    EXPECT_TRUE(value.text.view().starts_with("{iMASK}>"));
     EXPECT_EQ(value.compare(longest), 0);
     EXPECT_EQ(password("a").compare("a"s), 0);
     for (const std::string& text : {std::string(1025, 'a'), std::string(70000, 'a'), ""s}) {
@@ -167,11 +167,11 @@ TEST(LDIF_AttrType_password, BoundsThatTheTypeLacksAre1And1024) {
     expect_failure(failure_of([&] { pwFromStr(without_type, std::string(1025, 'a')); }),
                    length_message, std::string(1025, 'a'), nullptr);
     pwFromStr(without_type, "secret");
-    EXPECT_TRUE(without_type.text.starts_with("{iMASK}>"));
+    EXPECT_TRUE(without_type.text.view().starts_with("{iMASK}>"));
 }
 
 TEST(LDIF_AttrType_password, AnEncodedTextIsStoredAsGivenWhateverItsLength) {
-    const std::string masked = password("secret").text;
+    const std::string masked = password("secret").text.str();
     for (const std::string& text : {"{SHA}x"s, "{ssha}" + std::string(5000, 'x'), "{crypt}x"s,
                                     "{AES256}no base64"s, "{VLDL}x"s, masked, masked.substr(7)}) {
         EXPECT_EQ(password(text).text, text);
@@ -180,7 +180,7 @@ TEST(LDIF_AttrType_password, AnEncodedTextIsStoredAsGivenWhateverItsLength) {
 
 TEST(LDIF_AttrType_password, TheLengthOfAClearTextEndsAtANul) {
     const LDIF_Value value = password("abc\0def"s);
-    EXPECT_TRUE(value.text.starts_with("{iMASK}>"));
+    EXPECT_TRUE(value.text.view().starts_with("{iMASK}>"));
     EXPECT_EQ(pwCompare(value, password("abc")), 0);
     EXPECT_EQ(summary(failure_of([] { password("\0abc"s); })), length_message);
 }
@@ -240,8 +240,8 @@ TEST(LDIF_AttrType_password, AnEmptyValueIsLessThanEveryPassword) {
 
 TEST(LDIF_AttrType_password, AMaskedTextWithoutItsTagIsDecoded) {
     const LDIF_Value whole = password("secret");
-    const LDIF_Value without_tag = value_of(pw_type(), whole.text.substr(7));
-    ASSERT_EQ(without_tag.text.front(), '>');
+    const LDIF_Value without_tag = value_of(pw_type(), whole.str().substr(7));
+    ASSERT_EQ(without_tag.text.view().front(), '>');
     EXPECT_EQ(pwCompare(without_tag, password("secret")), 0);
     EXPECT_EQ(pwCompare(password("secret"), without_tag), 0);
     EXPECT_EQ(cfg32::decoder_input(">abc"), "{iMASK}>abc");
@@ -261,13 +261,13 @@ TEST(LDIF_AttrType_password, AValueThatCannotBeDecodedIsReportedWithItsSide) {
         SCOPED_TRACE(wrong.text);
         const LDIF_Value some = password("secret");
         expect_failure(failure_of([&] { pwCompare(wrong, some); }),
-                       "84/1000 unformat_password(left);", wrong.text, pw_type());
+                       "84/1000 unformat_password(left);", wrong.str(), pw_type());
         expect_failure(failure_of([&] { pwCompare(some, wrong); }),
-                       "84/1000 unformat_password(right);", wrong.text, pw_type());
+                       "84/1000 unformat_password(right);", wrong.str(), pw_type());
         expect_failure(failure_of([&] { pwCompare(wrong, wrong); }),
-                       "84/1000 unformat_password(left);", wrong.text, pw_type());
+                       "84/1000 unformat_password(left);", wrong.str(), pw_type());
         expect_failure(failure_of([&] { pwCompare(value_of(pw_type()), wrong); }),
-                       "84/1000 unformat_password(right);", wrong.text, pw_type());
+                       "84/1000 unformat_password(right);", wrong.str(), pw_type());
     }
 }
 

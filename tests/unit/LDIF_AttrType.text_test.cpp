@@ -36,7 +36,7 @@ LDIF_Value value_of(const _AttrType* type, const std::string& text = "") {
 }
 
 std::string accepted(const char* attribute, const std::string& text, aes_key_data* key = nullptr) {
-    return LDIF_Value(getAttrType(attribute), text, key).text;
+    return LDIF_Value(getAttrType(attribute), text, key).str();
 }
 
 std::string refused(const char* attribute, const std::string& text, aes_key_data* key = nullptr) {

@@ -7,6 +7,7 @@
 #include "LDIF_Exception.h"
 #include "LDIF_File.h"
 #include "cfg32_platform.h"
+#include "changed_row.h"
 #include "failures.h"
 #include "temporary_folder.h"
 
@@ -235,12 +236,10 @@ TEST_F(LDIF_File_authentication, CredentialsThatTheSyntaxRefusesAreReportedAndKe
 TEST_F(LDIF_File_authentication, UnexpectedFailureIsASystemErrorAndKeepsTheState) {
     const auto file = usual_store();
     ASSERT_EQ(file->setAuthentication(admin, password, simple), administrator);
-    _AttrType failing = *getAttrType("oru-slapdAdminDN");
-    failing.match = [](const LDIF_Value&, const LDIF_Value&) -> int {
+    changed_row failing("oru-slapdAdminDN");
+    failing->match = [](const LDIF_Value&, const LDIF_Value&) -> int {
         throw std::runtime_error("unexpected");
     };
-    const LDIF_Value& name = *configuration(*file).find("oru-slapdAdminDN")->values().begin();
-    const_cast<LDIF_Value&>(name).attrType = &failing;
     const LDIF_Exception e = failure_of([&] { file->setAuthentication(admin, password, simple); });
     EXPECT_EQ(summary(e), "80/1000 System error in LDIF_File::setAuthentication()");
     EXPECT_EQ(e.configFile, file->getFileName());

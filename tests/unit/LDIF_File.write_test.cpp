@@ -9,6 +9,7 @@
 #include <tuple>
 
 #include "LDIF_Exception.h"
+#include "failing_new.h"
 #include "failures.h"
 #include "stores.h"
 
@@ -312,13 +313,10 @@ TEST_F(LDIF_File_flush, NamesWithLeadingBlanksAreWrittenWhereTheyReadBack) {
 
 TEST_F(LDIF_File_flush, UnexpectedFailureIsASystemErrorBeforeAFileIsTouched) {
     const auto file = store(content, backup);
-    _AttrType failing = *getAttrType("sn");
-    failing.toStr = [](const LDIF_Value&) -> std::string {
-        throw std::runtime_error("unexpected");
-    };
-    const LDIF_Attribute& sn = *file->root().children().front().attributes().begin();
-    const_cast<LDIF_Value&>(*sn.values().begin()).attrType = &failing;
-    const LDIF_Exception e = failure_of([&] { file->flush(); });
+    const LDIF_Exception e = failure_of([&] {
+        failing_allocation failing(0);
+        file->flush();
+    });
     EXPECT_EQ(summary(e), "80/1000 System error writing file");
     EXPECT_EQ(e.configFile, path);
     EXPECT_EQ(folder.read("conf"), content);

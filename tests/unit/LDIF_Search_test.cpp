@@ -8,6 +8,7 @@
 #include <vector>
 
 #include "LDIF_File.h"
+#include "changed_row.h"
 #include "dn_of.h"
 #include "failures.h"
 #include "temporary_folder.h"
@@ -332,12 +333,10 @@ TEST_F(LDIF_Search, UnexpectedFailureIsASystemErrorWithTheEntry) {
     const auto fail = [](const LDIF_Value&, const LDIF_Value&) -> int {
         throw std::runtime_error("unexpected");
     };
-    _AttrType failing = *getAttrType("o");
-    failing.match = fail;
+    changed_row failing("o");
+    failing->match = fail;
     LDIF_Entry entry(dn_of("o=x"));
     entry += LDIF_Attribute(nullptr, "o", "x");
-    const LDIF_Value& value = *entry.attributes().begin()->values().begin();
-    const_cast<LDIF_Value&>(value).attrType = &failing;
     Results results(Results::Base, LDIF_Filter("o=x"), {}, false);
     const LDIF_Exception e = failure_of([&] { results += entry; });
     EXPECT_EQ(summary(e), "80/1000 System error in LDIF_Search_Results::addEntry()");

@@ -35,7 +35,7 @@ LDIF_Value value_of(const char* attribute, const std::string& text) {
 }
 
 [[noreturn]] void unexpected() { throw std::runtime_error("unexpected"); }
-void unexpected_from_str(LDIF_Value&, const std::string&) { unexpected(); }
+void unexpected_from_str(LDIF_Value&, const cfg32::given_text&) { unexpected(); }
 void unexpected_from_bin(LDIF_Value&, const char*, int) { unexpected(); }
 
 void expect_position(const LDIF_Exception& e) {
@@ -150,15 +150,15 @@ TEST(LDIF_Value, AssignmentReplacesEverything) {
     EXPECT_EQ(target.text, "389");
     EXPECT_EQ(target.binaryLength, 8);
     EXPECT_FALSE(target.dn);
-    const LDIF_Value name = value_of("oru-slapdSuffix", "o=b");
+    const LDIF_Value name = value_of("oru-slapdSuffix", "o=\"b\"");
     target = name;
-    EXPECT_EQ(target.text, "o=b");
+    EXPECT_EQ(target.text, "o=\"b\"");
     EXPECT_EQ(target.binaryLength, 0);
     EXPECT_FALSE(target.binary);
     ASSERT_TRUE(target.dn);
     const LDIF_Value& self = target;
     target = self;
-    EXPECT_EQ(target.text, "o=b");
+    EXPECT_EQ(target.text, "o=\"b\"");
     EXPECT_TRUE(target.dn);
 }
 

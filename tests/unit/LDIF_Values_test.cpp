@@ -15,6 +15,7 @@
 #include "LDIF_Exception.h"
 #include "LDIF_Value.h"
 #include "cfg32_platform.h"
+#include "changed_row.h"
 #include "failing_new.h"
 #include "failures.h"
 
@@ -38,7 +39,7 @@ ptrdiff_t position_of(const LDIF_Values& values, const std::string& text) {
 std::vector<std::string> texts(const LDIF_Values& values) {
     std::vector<std::string> result;
     for (const LDIF_Value& value : values) {
-        result.push_back(value.text);
+        result.push_back(value.str());
     }
     return result;
 }
@@ -58,28 +59,12 @@ std::string unexpected_to_str(const LDIF_Value&) { unexpected(); }
 int unexpected_match(const LDIF_Value&, const LDIF_Value&) { unexpected(); }
 
 /// Fails in a way that the library does not know for the text "unexpected".
-void picky_from_str(LDIF_Value& value, const std::string& text) {
-    if (text == "unexpected") {
+void picky_from_str(LDIF_Value& value, const cfg32::given_text& text) {
+    if (text.view() == "unexpected") {
         unexpected();
     }
     cesFromStr(value, text);
 }
-
-/// A row of the table, changed while this lives.
-class changed_row {
-  public:
-    explicit changed_row(const char* attribute)
-        : row_(const_cast<_AttrType*>(getAttrType(attribute))), before_(*row_) {}
-    changed_row(const changed_row&) = delete;
-    changed_row& operator=(const changed_row&) = delete;
-    ~changed_row() { *row_ = before_; }
-
-    _AttrType* operator->() { return row_; }
-
-  private:
-    _AttrType* row_;
-    _AttrType before_;
-};
 
 void expect_position(const LDIF_Exception& e) {
     EXPECT_EQ(e.srcFile, source_file);
@@ -137,7 +122,7 @@ TEST(LDIF_Values, EqualPasswordsAreDropped) {
     {
         LDIF_Values values("oru-slapdAdminPW", key);
         values += "secret"s;
-        const std::string stored = values.begin()->text;
+        const std::string stored = values.begin()->str();
         EXPECT_TRUE(stored.starts_with("{AES256}"));
         values += "secret"s;
         values += stored;
@@ -237,25 +222,27 @@ TEST(LDIF_Values, AssignmentReplacesNameTypeAndValues) {
 }
 
 TEST(LDIF_Values, AssignmentChecksEveryValueAgain) {
-    LDIF_Values source = list_of("oru-slapdPort", {"1", "2", "3"});
-    source.find("2")->text = "x";
-    source.find("3")->text = " 03 ";
+    const LDIF_Values source = list_of("oru-slapdPort", {"1", "2", "3"});
+    changed_row row("oru-slapdPort");
+    row->maximum = 1;
     LDIF_Values values = list_of("cn", {"a"});
     const LDIF_Exception e = failure_of([&] { values = source; });
-    EXPECT_EQ(summary(e), "21/1016 Value is not valid integer syntax");
+    EXPECT_EQ(summary(e), "21/1015 Integer value out of range");
+    EXPECT_EQ(e.value, "2");
     EXPECT_EQ(e.attrType, source.type());
     expect_position(e);
     EXPECT_EQ(values.str(), "oru-slapdPort: 1\n");  // emptied and partly refilled
-    source.find("2")->text = "7";
+    row->maximum = 3;
     values = source;
-    EXPECT_EQ(texts(values), (strings{"1", "7", "3"}));
+    EXPECT_EQ(texts(values), (strings{"1", "2", "3"}));
 }
 
-TEST(LDIF_Values, APlainCopyChangesNothing) {
-    LDIF_Values source = list_of("oru-slapdPort", {"1", "2"});
-    source.find("2")->text = "x";
+TEST(LDIF_Values, APlainCopyChecksAndChangesNothing) {
+    const LDIF_Values source = list_of("oru-slapdPort", {"1", "2"});
+    changed_row row("oru-slapdPort");
+    row->maximum = 1;
     LDIF_Values copy(source);
-    EXPECT_EQ(copy.str(), "oru-slapdPort: 1\noru-slapdPort: x\n");
+    EXPECT_EQ(copy.str(), "oru-slapdPort: 1\noru-slapdPort: 2\n");
     copy -= "1"s;
     EXPECT_EQ(source.size(), 2U);
 }
@@ -361,7 +348,7 @@ class scanned_list {
     strings texts() const {
         strings result;
         for (const LDIF_Value& value : values_) {
-            result.push_back(value.text);
+            result.push_back(value.str());
         }
         return result;
     }
@@ -532,7 +519,7 @@ TEST(LDIF_Values, ExhaustedMemoryLeavesTheListAsItWasAndWithoutDuplicatesLater) 
                 values += "a value that is longer than a short string " + std::to_string(i);
             }
             const std::string text = "another value that is longer than a short string";
-            const std::string first = values.begin()->text;
+            const std::string first = values.begin()->str();
             const strings before = texts(values);
             std::unique_ptr<LDIF_Exception> failure;
             failing_allocation failing(which);

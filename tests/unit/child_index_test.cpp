@@ -222,18 +222,20 @@ struct indexed_entries {
     child_index::position add(const std::string& dn) {
         entries.emplace_back(dn_of(dn));
         const auto position = std::prev(entries.end());
-        index.insert(position);
+        index.insert(position, cfg32::dn_path(position->named_dn()));
         return position;
     }
 
     std::string nearest(const std::string& dn, size_t from = 0) const {
-        const LDIF_Entry* entry = index.equal_or_ancestor(dn_of(dn), from);
+        const LDIF_Entry* entry = index.equal_or_ancestor(cfg32::dn_path(dn_of(dn)), from);
         return entry ? entry->dn().str() : "none";
     }
 
     std::vector<std::string> below(const std::string& dn) const {
         std::vector<std::string> names;
-        for (const auto position : index.descendants(LDIF_Entry(dn_of(dn)))) {
+        const LDIF_Entry sibling(dn_of(dn));
+        const cfg32::dn_path path(sibling.named_dn());
+        for (const auto position : index.descendants(sibling, path)) {
             names.push_back(position->dn().str());
         }
         return names;

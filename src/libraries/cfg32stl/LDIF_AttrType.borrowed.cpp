@@ -14,11 +14,10 @@ using namespace cfg32;
 #define LEND_MATCH(family, lender)                                         \
     int family##Compare(const LDIF_Value& left, const LDIF_Value& right) { \
         return lender##Compare(left, right);                               \
-    }                                                                      \
-    size_t cfg32::family##Hash(const LDIF_Value& value) { return lender##Hash(value); }
-#define LEND_FROM_STR(family, lender)                                  \
-    void family##FromStr(LDIF_Value& value, const std::string& text) { \
-        lender##FromStr(value, text);                                  \
+    }
+#define LEND_FROM_STR(family, lender)                                 \
+    void family##FromStr(LDIF_Value& value, const given_text& text) { \
+        lender##FromStr(value, text);                                 \
     }
 #define LEND_FROM_BIN(family, lender)                                        \
     void family##FromBin(LDIF_Value& value, const char* bytes, int length) { \
@@ -49,23 +48,44 @@ using namespace cfg32;
 
 namespace {
 
-struct hashed_match {
+#define SUPPORT_own(family) family##_match
+#define SUPPORT_ces(family) ces_match
+#define SUPPORT_cis(family) cis_match
+#define SUPPORT_int(family) int_match
+
+struct supported_match {
     match_operation* match;
-    size_t (*hash)(const LDIF_Value&);
+    const match_support* support;
 };
 
-#define SYNTAX(family, ...) {family##Compare, family##Hash},
-constexpr hashed_match hashes[] = {
+#define SYNTAX(family, match, ...) {family##Compare, &SUPPORT_##match(family)},
+constexpr supported_match supported[] = {
 #include "syntaxes.def"
 };
 #undef SYNTAX
 
+/// Null for a match that is not of the table.
+const match_support* support_of(const _AttrType& type) {
+    const auto belongs = [&](const supported_match& row) { return row.match == type.match; };
+    const supported_match* row = std::find_if(std::begin(supported), std::end(supported), belongs);
+    return row == std::end(supported) ? nullptr : row->support;
+}
+
 }  // namespace
 
+equal_texts* cfg32::equal_texts_of(const _AttrType& type) {
+    const match_support* support = support_of(type);
+    return support ? support->equal : nullptr;
+}
+
 size_t cfg32::hash_of(const LDIF_Value& value) {
-    const auto belongs = [&](const hashed_match& row) {
-        return row.match == value.attrType->match;
-    };
-    const hashed_match* row = std::find_if(std::begin(hashes), std::end(hashes), belongs);
-    return row == std::end(hashes) ? 0 : row->hash(value);
+    const match_support* support = support_of(*value.attrType);
+    return support ? support->hash(value) : 0;
+}
+
+void cfg32::complete(LDIF_Value& value) {
+    const match_support* support = support_of(*value.attrType);
+    if (support && support->complete) {
+        support->complete(value);
+    }
 }

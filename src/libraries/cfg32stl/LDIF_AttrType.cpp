@@ -9,9 +9,10 @@
 #include <cstring>
 #include <iterator>
 #include <limits>
+#include <utility>
 #include <vector>
 
-#include "cisString.h"
+#include "LDIF_Util.h"
 #include "enumerations.h"
 
 using namespace cfg32;
@@ -115,21 +116,35 @@ const _AttrType* searchAttrMap(const char* name, int lo, int hi) {
     return nullptr;
 }
 
-namespace {
+namespace cfg32 {
 
 /// The rows by their names: a load looks one up for every line. It finds what searchAttrMap() does.
-class row_index {
+class name_table {
   public:
-    row_index() {
+    using named_type = attribute_name::named_type;
+
+    name_table() {
         initAttrMap();
-        for (int i = 0; i < numAttrs; ++i) {
-            const _AttrType* row = searchAttrMap(attrMap[i].name, 0, numAttrs);
-            *slot_of(row->name) = row;
+        const auto count = static_cast<size_t>(numAttrs);
+        rows_.reserve(count + 2);
+        for (size_t i = 0; i < count; ++i) {
+            rows_.push_back({attrMap[i].name, &attrMap[i]});
         }
+        for (const named_type& row : rows_) {
+            const _AttrType* found = searchAttrMap(row.name.c_str(), 0, numAttrs);
+            *slot_of(row.name.text()) = &rows_[static_cast<size_t>(found - attrMap)];
+        }
+        // What no attribute is called, but every entry has.
+        rows_.push_back({"dn", defaultAttrType});
+        *slot_of("dn") = &rows_.back();
+        rows_.push_back({"", defaultAttrType});
+        attribute_name::first_ = rows_.data();
+        attribute_name::last_ = &rows_.back();
     }
 
-    const _AttrType* find(const char* name) const {
-        return *const_cast<row_index*>(this)->slot_of(name);
+    /// Null for a name without a row.
+    const named_type* find(std::string_view name) const {
+        return *const_cast<name_table*>(this)->slot_of(name);
     }
 
   private:
@@ -137,44 +152,92 @@ class row_index {
     static_assert(std::size(rows) * 4 < slots);
 
     /// Where the row of that name is, or would be.
-    const _AttrType** slot_of(const char* name) {
+    const named_type** slot_of(std::string_view name) {
         size_t at = hash(name);
-        while (rows_[at % slots] && rows_[at % slots]->compare(name) != 0) {
+        while (slots_[at % slots] && !is_named(*slots_[at % slots], name)) {
             ++at;
         }
-        return &rows_[at % slots];
+        return &slots_[at % slots];
     }
 
-    static size_t hash(const char* name) {
-        constexpr size_t prime = 0x100000001b3;  // FNV-1a
-        constexpr char lower_case = 0x20;
-        size_t hash = 0;
-        for (; *name != '\0'; ++name) {
-            hash = (hash ^ static_cast<unsigned char>(*name | lower_case)) * prime;
+    static bool is_named(const named_type& row, std::string_view name) {
+        const std::string& own = row.name.text();
+        return own.size() == name.size() && (own == name || compare_without_case(own, name) == 0);
+    }
+
+    /// Of eight characters in the middle, eight at the end, and the length: the names begin mostly
+    /// alike.
+    static size_t hash(std::string_view name) {
+        constexpr uint64_t prime = 0x9e3779b97f4a7c15;
+        const uint64_t middle = eight_characters(name.substr(name.size() / 2));
+        const uint64_t end =
+            eight_characters(name.substr(name.size() - std::min(name.size(), 8UL)));
+        return ((middle * prime ^ end) + name.size()) * prime >> 32;
+    }
+
+    /// The first eight characters, or all there are. Letters of either case differ in one bit.
+    static uint64_t eight_characters(std::string_view text) {
+        constexpr uint64_t without_case = 0x2020202020202020;
+        uint64_t characters = 0;
+        if (text.size() >= sizeof characters) {
+            memcpy(&characters, text.data(), sizeof characters);
+        } else {
+            for (const char c : text) {
+                characters = characters << 8 | static_cast<unsigned char>(c);
+            }
         }
-        return hash ^ (hash >> 32);
+        return characters | without_case;
     }
 
-    std::array<const _AttrType*, slots> rows_{};
+    std::vector<named_type> rows_;
+    std::array<const named_type*, slots> slots_{};
 };
+
+const attribute_name::named_type* attribute_name::first_ = nullptr;
+const attribute_name::named_type* attribute_name::last_ = nullptr;
+
+}  // namespace cfg32
+
+namespace {
+
+const name_table& table() {
+    // Initialised once, also when many threads make the first look-up together.
+    static const name_table names;
+    return names;
+}
 
 }  // namespace
 
-const cisString& cfg32::name_of(const _AttrType& row) {
-    static const std::vector<cisString> names = [] {
-        std::vector<cisString> all;
-        all.reserve(static_cast<size_t>(numAttrs));
-        for (int i = 0; i < numAttrs; ++i) {
-            all.emplace_back(attrMap[i].name);
-        }
-        return all;
-    }();
-    return names[static_cast<size_t>(&row - attrMap)];
+attribute_name::attribute_name(std::string_view name) {
+    const named_type* row = table().find(name);
+    if (const size_t nul = row ? name.npos : name.find('\0'); nul != name.npos) {
+        row = table().find(name.substr(0, nul));
+    }
+    if (name.empty()) {
+        named_ = last_;
+    } else if (row && row->name.text() == name) {
+        named_ = row;
+    } else {
+        named_ = new named_type{std::string(name), row ? row->type : defaultAttrType};
+    }
+}
+
+attribute_name::attribute_name(const attribute_name& other)
+    : named_(other.is_own() ? new named_type(*other.named_) : other.named_) {}
+
+int attribute_name::compare(const attribute_name& other) const {
+    if (named_ == other.named_) {
+        return 0;
+    }
+    // The rows are in the order of their names.
+    if (type()->name && other.type()->name) {
+        return static_cast<int>(type() > other.type()) - static_cast<int>(type() < other.type());
+    }
+    return get().compare(other.get());
 }
 
 const _AttrType* getAttrType(const char* name) {
-    // Initialised once, also when many threads make the first look-up together.
-    static const row_index index;
-    const _AttrType* row = name ? index.find(name) : nullptr;
-    return row ? row : defaultAttrType;
+    const name_table& names = table();
+    const name_table::named_type* row = name ? names.find(name) : nullptr;
+    return row ? row->type : defaultAttrType;
 }

@@ -4,48 +4,59 @@
 #include "LDIF_AttrType.syntax.h"
 #include "LDIF_DN.h"
 #include "LDIF_Value.h"
+#include "dn_path.h"
 
 using namespace cfg32;
 
 namespace {
 
-/// The value's DN: the one it keeps, or else one parsed from its text into parsed.
-const LDIF_DN& dn_of(const LDIF_Value& value, LDIF_DN& parsed) {
+/// The value's DN, as it keeps it or as its text tells it.
+dn_path path_of(const LDIF_Value& value) {
     if (value.dn) {
-        return *value.dn;
+        return dn_path(*value.dn);
     }
-    const auto body = [&]() -> const LDIF_DN& { return parsed = cisString(value.str()); };
-    return with_context(body, [&](LDIF_Exception& e) {
-        e.value = value.text;
-        e.attrType = value.attrType;
-    });
+    return with_context([&] { return dn_path(value.shown()); },
+                        [&](LDIF_Exception& e) {
+                            e.value = value.text.str();
+                            e.attrType = value.attrType;
+                        });
+}
+
+size_t hash_of_dn(const LDIF_Value& value) {
+    const dn_path path = path_of(value);
+    size_t hash = 0;
+    for (size_t i = 0; i < path.size(); ++i) {
+        hash = path.hash(i, hash);
+    }
+    return hash;
 }
 
 }  // namespace
 
-size_t cfg32::dnHash(const LDIF_Value& value) {
-    LDIF_DN parsed;
-    return dn_of(value, parsed).hash();
-}
+const match_support cfg32::dn_match{nullptr, hash_of_dn, nullptr};
 
 int dnCompare(const LDIF_Value& left, const LDIF_Value& right) {
-    LDIF_DN parsed_left;
-    LDIF_DN parsed_right;
-    return dn_of(left, parsed_left).compare(dn_of(right, parsed_right));
+    const dn_path left_path = path_of(left);
+    return left_path.compare(path_of(right));
 }
 
-void dnFromStr(LDIF_Value& value, const std::string& text) {
+void dnFromStr(LDIF_Value& value, const given_text& text) {
+    if (!text.empty() && kept_dn::is_simple(text)) {
+        value.text = text;
+        return;
+    }
     const auto body = [&] {
-        value.dn = std::make_unique<LDIF_DN>(cisString(text));
-        value.text = value.dn->str();
+        value.dn = std::make_unique<LDIF_DN>(cisString(text.str()));
+        const std::string normalised = value.dn->str();
+        value.text = normalised == text.view() ? text : given_text(normalised);
     };
     with_context(body, [&](LDIF_Exception& e) {
-        e.value = text;
+        e.value = text.str();
         e.attrType = value.attrType;
     });
 }
 
 void dnFromBin(LDIF_Value& value, const char* bytes, int length) {
     cisFromBin(value, bytes, length);
-    dnFromStr(value, std::string(value.text));
+    dnFromStr(value, value.text.str());
 }

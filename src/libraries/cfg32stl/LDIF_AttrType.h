@@ -5,13 +5,19 @@
 // in syntaxes.def with their code in LDIF_AttrType.<family>.cpp.
 
 #include <cstdint>
+#include <memory>
 #include <string>
+#include <string_view>
+#include <utility>
+
+#include "cisString.h"
+#include "kept_text.h"
 
 class LDIF_Value;
 
 // The operations of a syntax.
 using match_operation = int(const LDIF_Value& left, const LDIF_Value& right);
-using from_str_operation = void(LDIF_Value& value, const std::string& text);
+using from_str_operation = void(LDIF_Value& value, const cfg32::given_text& text);
 using from_bin_operation = void(LDIF_Value& value, const char* bytes, int length);
 using to_str_operation = std::string(const LDIF_Value& value);
 using to_bin_operation = const char*(const LDIF_Value& value, int& length);
@@ -60,15 +66,59 @@ const _AttrType* getAttrType(const char* name);
 #include "syntaxes.def"
 #undef SYNTAX
 
-class cisString;
-
 namespace cfg32 {
 
-/// The row's name, once for all attributes that are spelled so. The row is one with a name, and
-/// lives after the first look-up.
-const cisString& name_of(const _AttrType& row);
+/// An attribute's name as it is written, and the row that goes with it. Where that is the table's
+/// spelling, the name is kept there, once for all attributes.
+class attribute_name {
+  public:
+    explicit attribute_name(std::string_view name);
+    attribute_name(const attribute_name& other);
+    attribute_name(attribute_name&& other) noexcept : named_(std::exchange(other.named_, last_)) {}
+    attribute_name& operator=(const attribute_name& other) { return *this = attribute_name(other); }
+    attribute_name& operator=(attribute_name&& other) noexcept {
+        std::swap(named_, other.named_);
+        return *this;
+    }
+    ~attribute_name() {
+        if (is_own()) {
+            delete named_;
+        }
+    }
+
+    const cisString& get() const { return named_->name; }
+    const _AttrType* type() const { return named_->type; }
+
+    /// As the names' compare() orders them.
+    int compare(const attribute_name& other) const;
+
+    struct named_type {
+        cisString name;
+        const _AttrType* type;
+    };
+
+  private:
+    friend class name_table;
+
+    bool is_own() const { return named_ < first_ || named_ > last_; }
+
+    // The table's, once there is a name; the last one is for those without.
+    static const named_type* first_;
+    static const named_type* last_;
+
+    const named_type* named_;
+};
+
+/// Tells whether two texts that the syntax of one type has stored are those of equal values.
+using equal_texts = bool(std::string_view left, std::string_view right);
+
+/// The one that goes with the type's match; null where a value is more than its text.
+equal_texts* equal_texts_of(const _AttrType& type);
 
 /// A hash of the value that goes with its type's match: equal values have equal hashes.
 size_t hash_of(const LDIF_Value& value);
+
+/// Gives a value that has only its text what else its type's match needs.
+void complete(LDIF_Value& value);
 
 }  // namespace cfg32

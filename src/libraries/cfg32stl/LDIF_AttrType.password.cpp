@@ -94,12 +94,15 @@ std::string decoder_input(const std::string& stored) {
     return stored.front() == '>' ? std::string(iMASK_BRACED, sizeof iMASK_BRACED) + stored : stored;
 }
 
-size_t pwHash(const LDIF_Value& value) {
-    // A list of several passwords holds only ones that can be decoded: what fails here is a new
-    // one, which a comparison would have on its right.
-    const decoded_password password(value, right_not_decoded);
-    return password.clear() ? std::hash<std::string_view>()(password.clear()) : 0;
-}
+const match_support pw_match{
+    nullptr,
+    [](const LDIF_Value& value) {
+        // A list of several passwords holds only ones that can be decoded: what fails here is a new
+        // one, which a comparison would have on its right.
+        const decoded_password password(value, right_not_decoded);
+        return password.clear() ? std::hash<std::string_view>()(password.clear()) : 0;
+    },
+    nullptr};
 
 }  // namespace cfg32
 
@@ -112,11 +115,12 @@ int pwCompare(const LDIF_Value& left, const LDIF_Value& right) {
     return with_system_error(in("pwCompare()"), body, no_details);
 }
 
-void pwFromStr(LDIF_Value& value, const std::string& text) {
+void pwFromStr(LDIF_Value& value, const given_text& given) {
     const auto body = [&] {
+        const std::string text = given.str();
         const int length = static_cast<int>(strlen(text.c_str()));
         if (check_format(text.c_str(), length) != clear_text) {
-            value.text = text;
+            value.text = given;
             return;
         }
         const length_bounds bounds = bounds_of(value.attrType);
@@ -126,7 +130,7 @@ void pwFromStr(LDIF_Value& value, const std::string& text) {
                          bounds.lower, bounds.upper);
             refuse_with_message(bad_length, message, value, text);
         }
-        value.text = encoded(value, text, length);
+        value.text = given_text(encoded(value, text, length));
     };
     with_system_error(in("pwFromStr()"), body, no_details);
 }

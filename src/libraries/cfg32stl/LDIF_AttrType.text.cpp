@@ -1,7 +1,5 @@
 // The syntaxes of texts: ces, cis, enum, time.
 
-#include <strings.h>
-
 #include <algorithm>
 #include <cstdlib>
 #include <cstring>
@@ -30,12 +28,21 @@ length_bounds bounds_of(const _AttrType& type) {
     return {lower, type.maximum >= lower ? type.maximum : 0};
 }
 
-bool equal_words(const char* left, const char* right) { return strcasecmp(left, right) == 0; }
+bool equal_words(std::string_view left, std::string_view right) {
+    return compare_without_case(left, right) == 0;
+}
+
+int compare_texts_without_case(std::string_view left, std::string_view right) {
+    if (left.empty() || right.empty()) {
+        return static_cast<int>(right.empty()) - static_cast<int>(left.empty());
+    }
+    return compare_without_case(left, right);
+}
 
 /// A two-digit field of a time: -1 when it is no number. KEPT: read as atoi does, so that "1x" is
 /// 1 while "0x" is refused.
-int time_field(const std::string& text, size_t position) {
-    const std::string field = text.substr(position, 2);
+int time_field(std::string_view text, size_t position) {
+    const std::string field(text.substr(position, 2));
     if (field == "00") {
         return 0;
     }
@@ -43,7 +50,7 @@ int time_field(const std::string& text, size_t position) {
     return number == 0 ? -1 : static_cast<int>(number);
 }
 
-bool is_time_of_day(const std::string& text) {
+bool is_time_of_day(std::string_view text) {
     if (text.size() != 7 || (text[0] != 'T' && text[0] != 't')) {
         return false;
     }
@@ -54,7 +61,7 @@ bool is_time_of_day(const std::string& text) {
 }
 
 [[noreturn]] void not_implemented(const failure& kind, const throw_site& site, const char* family,
-                                  const _AttrType* type, const std::string& value) {
+                                  const _AttrType* type, std::string_view value) {
     const auto details = [&](LDIF_Exception& e) {
         e.attrType = type;
         e.value = value;
@@ -66,19 +73,25 @@ bool is_time_of_day(const std::string& text) {
 
 namespace cfg32 {
 
-void refuse(const failure& kind, const LDIF_Value& value, const std::string& text,
+void refuse(const failure& kind, const LDIF_Value& value, std::string_view text,
             const throw_site& site) {
     refuse_with_message(kind, kind.text, value, text, site);
 }
 
 void refuse_with_message(const failure& kind, const char* message, const LDIF_Value& value,
-                         const std::string& text, const throw_site& site) {
+                         std::string_view text, const throw_site& site) {
     not_implemented({kind.ldap, kind.ext, message}, site, "", value.attrType, text);
 }
 
-size_t cesHash(const LDIF_Value& value) { return std::hash<std::string>()(value.str()); }
+const match_support ces_match{
+    [](std::string_view left, std::string_view right) { return left == right; },
+    [](const LDIF_Value& value) { return std::hash<std::string_view>()(value.shown()); }, nullptr};
 
-size_t cisHash(const LDIF_Value& value) { return hash_without_case(value.str().c_str()); }
+const match_support cis_match{
+    [](std::string_view left, std::string_view right) {
+        return compare_texts_without_case(left, right) == 0;
+    },
+    [](const LDIF_Value& value) { return hash_without_case(value.shown()); }, nullptr};
 
 }  // namespace cfg32
 
@@ -93,10 +106,10 @@ void StringSyntaxNotImplemented(const throw_site& site, const char* family, cons
 }
 
 int cesCompare(const LDIF_Value& left, const LDIF_Value& right) {
-    return left.str().compare(right.str());
+    return left.shown().compare(right.shown());
 }
 
-void cesFromStr(LDIF_Value& value, const std::string& text) {
+void cesFromStr(LDIF_Value& value, const given_text& text) {
     if (const _AttrType* type = value.attrType) {
         const length_bounds bounds = bounds_of(*type);
         if (!bounds.allow(text.size())) {
@@ -116,32 +129,27 @@ void cesFromBin(LDIF_Value& value, const char* bytes, int length) {
     }
 }
 
-std::string cesToStr(const LDIF_Value& value) { return value.text; }
+std::string cesToStr(const LDIF_Value& value) { return value.text.str(); }
 
 const char* cesToBin(const LDIF_Value& value, int& length) {
     length = value.binaryLength;
     if (!value.binary) {
-        BinarySyntaxNotImplemented({}, "ces", value.attrType, value.text);
+        BinarySyntaxNotImplemented({}, "ces", value.attrType, value.text.str());
     }
     return value.binary.get();
 }
 
 int cisCompare(const LDIF_Value& left, const LDIF_Value& right) {
-    const std::string l = left.str();
-    const std::string r = right.str();
-    if (l.empty() || r.empty()) {
-        return static_cast<int>(r.empty()) - static_cast<int>(l.empty());
-    }
-    return strcasecmp(l.c_str(), r.c_str());
+    return compare_texts_without_case(left.shown(), right.shown());
 }
 
-void enumFromStr(LDIF_Value& value, const std::string& text) {
+void enumFromStr(LDIF_Value& value, const given_text& text) {
     const _AttrType* type = value.attrType;
     if (!type || !type->enumValues) {
         refuse(words_undefined, value, text);
     }
     cisFromStr(value, text);
-    const char* word = value.text.c_str();
+    const std::string_view word = value.text;
     // A configuration that names the masking scheme can be read when no key is at hand.
     if (!value.key && type->name && equal_words(type->name, "oru-slapdPwEncryption") &&
         equal_words(word, "imask")) {
@@ -155,7 +163,7 @@ void enumFromStr(LDIF_Value& value, const std::string& text) {
     refuse(not_a_word, value, text);
 }
 
-void timeFromStr(LDIF_Value& value, const std::string& text) {
+void timeFromStr(LDIF_Value& value, const given_text& text) {
     if (!value.attrType) {
         refuse(words_undefined, value, text);
     }

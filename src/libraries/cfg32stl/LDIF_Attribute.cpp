@@ -12,8 +12,8 @@ namespace {
 
 constexpr failure illegal_line{80, 1000, "Illegal constructor LDIF_Attribute( LDIF_Line::"};
 
-/// More attributes than this are found through an index.
-constexpr size_t longest_scan = 64;
+/// Among more attributes than this a name is searched for by halves.
+constexpr size_t longest_scan = 32;
 
 }  // namespace
 
@@ -26,14 +26,18 @@ LDIF_Attribute::LDIF_Attribute(aes_key_data* key, const std::string& name, const
 
 LDIF_Attribute::LDIF_Attribute(aes_key_data* key, const LDIF_Line& line,
                                const LDIF_Comment& comment)
-    : LDIF_Attribute(key, line, LDIF_Comment(comment)) {}
-
-LDIF_Attribute::LDIF_Attribute(aes_key_data* key, const LDIF_Line& line, LDIF_Comment&& comment)
     : values_(line.attribute, key) {
     if (line.type != LDIF_Line::attr) {
         raise(illegal_line, std::string(line_type_name(line.type)) + " );");
     }
     values_ += line.value;
+    *this += comment;
+}
+
+LDIF_Attribute::LDIF_Attribute(aes_key_data* key, attribute_name name, const given_text& value,
+                               LDIF_Comment&& comment)
+    : values_(std::move(name), key) {
+    values_ += value;
     if (!comment.empty()) {
         comment_ = std::make_unique<LDIF_Comment>(std::move(comment));
     }
@@ -62,6 +66,18 @@ LDIF_Attribute& LDIF_Attribute::operator+=(const LDIF_Attribute& other) {
     return *this;
 }
 
+LDIF_Attribute& LDIF_Attribute::operator+=(LDIF_Attribute&& other) {
+    if (*this == other) {
+        if (comment_) {
+            *this += other.comment();
+        } else {
+            comment_ = std::move(other.comment_);
+        }
+        values_ += std::move(other.values_);
+    }
+    return *this;
+}
+
 LDIF_Attribute& LDIF_Attribute::operator+=(const LDIF_Comment& comment) {
     if (comment_) {
         *comment_ += comment;
@@ -71,7 +87,7 @@ LDIF_Attribute& LDIF_Attribute::operator+=(const LDIF_Comment& comment) {
     return *this;
 }
 
-LDIF_Attribute& LDIF_Attribute::operator+=(const std::string& value) {
+LDIF_Attribute& LDIF_Attribute::operator+=(const given_text& value) {
     values_ += value;
     return *this;
 }
@@ -87,41 +103,35 @@ void LDIF_Attribute::append_to(std::string& out) const {
     values_.append_to(out);
 }
 
-LDIF_Attributes& LDIF_Attributes::operator=(const LDIF_Attributes& other) {
-    LDIF_Attributes copy(other);
-    return *this = std::move(copy);
-}
+namespace {
 
 /// The first attribute whose name is not before the given one.
-LDIF_Attributes::iterator LDIF_Attributes::place_of(const cisString& name) {
-    if (index_) {
-        const auto entry = index_->lower_bound(&name);
-        return entry == index_->end() ? attributes_.end() : entry->second;
+template <class Attributes>
+auto place_of(Attributes& attributes, const attribute_name& name) {
+    const auto is_before = [&](const LDIF_Attribute& own) {
+        return own.values().typed_name().compare(name) < 0;
+    };
+    if (attributes.size() > longest_scan) {
+        return std::partition_point(attributes.begin(), attributes.end(), is_before);
     }
     // Attributes arrive mostly in order, or repeat the last name: from the end that is the first
     // comparison.
-    iterator place = attributes_.end();
-    while (place != attributes_.begin() && std::prev(place)->name() >= name) {
+    auto place = attributes.end();
+    while (place != attributes.begin() && !is_before(*std::prev(place))) {
         --place;
     }
     return place;
 }
 
+}  // namespace
+
 template <class Attribute>
 void LDIF_Attributes::add(Attribute&& attribute) {
-    const iterator place = place_of(attribute.name());
-    if (place != attributes_.end() && *place == attribute) {
-        *place += attribute;
-        return;
-    }
-    const iterator added = attributes_.insert(place, std::forward<Attribute>(attribute));
-    if (index_) {
-        index_->emplace(&added->name(), added);
-    } else if (attributes_.size() > longest_scan) {
-        index_ = std::make_unique<name_index>();
-        for (iterator i = attributes_.begin(); i != attributes_.end(); ++i) {
-            index_->emplace(&i->name(), i);
-        }
+    const iterator place = place_of(attributes_, attribute.values().typed_name());
+    if (place != end() && *place == attribute) {
+        *place += std::forward<Attribute>(attribute);
+    } else {
+        attributes_.insert(place, std::forward<Attribute>(attribute));
     }
 }
 
@@ -152,30 +162,26 @@ LDIF_Attributes& LDIF_Attributes::operator-=(const LDIF_Attribute& attribute) {
 }
 
 LDIF_Attributes::iterator LDIF_Attributes::erase(iterator position) {
-    if (index_) {
-        index_->erase(&position->name());
-    }
     return attributes_.erase(position);
 }
 
 LDIF_Attributes::iterator LDIF_Attributes::find(const cisString& name) {
-    const iterator place = place_of(name);
-    return place != end() && place->name() == name ? place : end();
+    const const_iterator found = std::as_const(*this).find(name);
+    return begin() + (found - std::as_const(*this).begin());
 }
 
 LDIF_Attributes::const_iterator LDIF_Attributes::find(const cisString& name) const {
-    return const_cast<LDIF_Attributes*>(this)->find(name);
+    return find(attribute_name(name.text()));
 }
 
-LDIF_Attributes::const_iterator LDIF_Attributes::find(const cisString& name,
-                                                      const _AttrType& type) const {
-    if (index_ || &type == defaultAttrType) {
-        return find(name);
-    }
-    // A name that is in the table has a row of its own.
-    return std::find_if(begin(), end(), [&](const LDIF_Attribute& attribute) {
-        return attribute.values().type() == &type;
-    });
+LDIF_Attributes::const_iterator LDIF_Attributes::find(const attribute_name& name) const {
+    const auto order = [&](const LDIF_Attribute& own) {
+        return own.values().typed_name().compare(name);
+    };
+    const auto is_reached = [&](const LDIF_Attribute& own) { return order(own) >= 0; };
+    const const_iterator place = size() > longest_scan ? place_of(attributes_, name)
+                                                       : std::find_if(begin(), end(), is_reached);
+    return place != end() && order(*place) == 0 ? place : end();
 }
 
 std::string LDIF_Attributes::str() const {

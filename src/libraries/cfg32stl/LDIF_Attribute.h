@@ -1,9 +1,8 @@
 #pragma once
 
-#include <list>
-#include <map>
 #include <memory>
 #include <string>
+#include <vector>
 
 #include "LDIF_Comment.h"
 #include "LDIF_Value.h"
@@ -15,8 +14,10 @@ class LDIF_Attribute {
     LDIF_Attribute(aes_key_data* key, const std::string& name, const std::string& value);
     /// From a line of the file, of type attr (80/1000 for another).
     LDIF_Attribute(aes_key_data* key, const LDIF_Line& line, const LDIF_Comment& comment);
-    /// The same; takes the comment over, if nothing is thrown.
-    LDIF_Attribute(aes_key_data* key, const LDIF_Line& line, LDIF_Comment&& comment);
+    /// The same of a name and a value, which may be empty; takes the comment over, if nothing is
+    /// thrown.
+    LDIF_Attribute(aes_key_data* key, cfg32::attribute_name name, const cfg32::given_text& value,
+                   LDIF_Comment&& comment);
     LDIF_Attribute(const LDIF_Attribute& other);
     LDIF_Attribute(LDIF_Attribute&&) noexcept = default;
     LDIF_Attribute& operator=(const LDIF_Attribute& other);
@@ -26,15 +27,18 @@ class LDIF_Attribute {
     // Orders by name, without regard to case.
     int compare(const char* name) const { return this->name().compare(name); }
     int compare(const std::string& name) const { return this->name().compare(name); }
-    int compare(const LDIF_Attribute& other) const { return name().compare(other.name()); }
+    int compare(const LDIF_Attribute& other) const {
+        return values_.typed_name().compare(other.values_.typed_name());
+    }
     bool operator==(const LDIF_Attribute& other) const { return compare(other) == 0; }
     bool operator==(const char* name) const { return compare(name) == 0; }
     bool operator<(const LDIF_Attribute& other) const { return compare(other) < 0; }
 
     /// Takes over the comment and the values of an attribute of the same name; ignores any other.
     LDIF_Attribute& operator+=(const LDIF_Attribute& other);
+    LDIF_Attribute& operator+=(LDIF_Attribute&& other);
     LDIF_Attribute& operator+=(const LDIF_Comment& comment);
-    LDIF_Attribute& operator+=(const std::string& value);
+    LDIF_Attribute& operator+=(const cfg32::given_text& value);
 
     const cisString& name() const { return values_.name(); }
     const LDIF_Comment& comment() const;
@@ -53,16 +57,9 @@ class LDIF_Attribute {
 /// The attributes of an entry, sorted by name, one of each name.
 class LDIF_Attributes {
   public:
-    using list = std::list<LDIF_Attribute>;
+    using list = std::vector<LDIF_Attribute>;
     using iterator = list::iterator;
     using const_iterator = list::const_iterator;
-
-    LDIF_Attributes() = default;
-    LDIF_Attributes(const LDIF_Attributes& other) : attributes_(other.attributes_) {}
-    LDIF_Attributes(LDIF_Attributes&&) noexcept = default;
-    LDIF_Attributes& operator=(const LDIF_Attributes& other);
-    LDIF_Attributes& operator=(LDIF_Attributes&&) noexcept = default;
-    ~LDIF_Attributes() = default;
 
     /// Inserts the attribute in its place, or merges it into the one of its name.
     LDIF_Attributes& operator+=(const LDIF_Attribute& attribute);
@@ -73,8 +70,8 @@ class LDIF_Attributes {
 
     iterator find(const cisString& name);
     const_iterator find(const cisString& name) const;
-    /// The same, for many entries: type is the name's row in the table.
-    const_iterator find(const cisString& name, const _AttrType& type) const;
+    /// The same, for many entries.
+    const_iterator find(const cfg32::attribute_name& name) const;
     iterator erase(iterator position);
     iterator begin() { return attributes_.begin(); }
     iterator end() { return attributes_.end(); }
@@ -82,20 +79,16 @@ class LDIF_Attributes {
     const_iterator end() const { return attributes_.end(); }
     bool empty() const { return attributes_.empty(); }
     size_t size() const { return attributes_.size(); }
+    /// Room for the attributes that an entry has, and no more.
+    void reserve(size_t count) { attributes_.reserve(count); }
+    void shrink_to_fit() { attributes_.shrink_to_fit(); }
 
     std::string str() const;
     void append_to(std::string& out) const;
 
   private:
-    struct by_name {
-        bool operator()(const cisString* l, const cisString* r) const { return *l < *r; }
-    };
-    using name_index = std::map<const cisString*, iterator, by_name>;
-
     template <class Attribute>
     void add(Attribute&& attribute);
-    iterator place_of(const cisString& name);
 
     list attributes_;
-    std::unique_ptr<name_index> index_;  // of many attributes only
 };

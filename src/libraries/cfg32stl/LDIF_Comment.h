@@ -4,6 +4,7 @@
 #include <string>
 
 #include "LDIF_Line.h"
+#include "kept_text.h"
 
 /// The comment and blank lines that precede an entry or an attribute, kept so that they can be
 /// written back where they stood.
@@ -19,6 +20,8 @@ class LDIF_Comment {
     /// Appends a comment or blank line; a line of another type is ignored.
     LDIF_Comment& operator+=(const LDIF_Line& line);
     LDIF_Comment& operator+=(const LDIF_Comment& other);
+    /// Appends lines in file form.
+    void append(const cfg32::given_text& lines) { text_.append(lines); }
     LDIF_Comment& clear();
 
     /// Drops the blank lines at the end.
@@ -26,14 +29,14 @@ class LDIF_Comment {
 
     bool empty() const { return text_.empty(); }
     size_t line_count() const;
-    bool begins_with_blank_line() const { return text_.starts_with('\n'); }
+    bool begins_with_blank_line() const { return text_.view().starts_with('\n'); }
 
     /// The lines, each with its newline.
-    virtual std::string str() const { return text_; }
-    void append_to(std::string& out) const { out += text_; }
+    virtual std::string str() const { return text_.str(); }
+    void append_to(std::string& out) const { out += text_.view(); }
 
   private:
-    std::string text_;  // in file form
+    cfg32::kept_text text_;  // in file form
 };
 
 std::ostream& operator<<(std::ostream& out, const LDIF_Comment& comment);

@@ -245,9 +245,11 @@ void LDIF_RDN::append_to(std::string& out) const {
 int LDIF_RDN::compare(const LDIF_RDN& other) const { return compare_steps(pairs_, other.pairs_); }
 
 size_t LDIF_RDN::hash(size_t seed) const {
+    // As of the text, where that is no more than attribute and value.
     for (const LDIF_RDN_pair& pair : pairs_) {
-        seed = hash_without_case("+", hash_without_case(pair.attribute.c_str(), seed));
-        seed = hash_without_case("=", hash_without_case(pair.value.c_str(), seed));
+        seed = hash_without_case(&pair == pairs_.data() ? "" : "+", seed);
+        seed = hash_without_case("=", hash_without_case(pair.attribute.text(), seed));
+        seed = hash_without_case(pair.value.text(), seed);
     }
     return hash_without_case(",", seed);
 }

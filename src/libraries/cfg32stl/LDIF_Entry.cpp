@@ -14,13 +14,13 @@ constexpr failure illegal_line{80, 1000, "Illegal constructor LDIF_Entry( LDIF_L
 constexpr failure not_a_child{80, 1000, "["};
 
 /// The line's DN, if the line is one.
-LDIF_DN dn_of(const LDIF_Line& line) {
+kept_dn dn_of(const LDIF_Line& line) {
     if (line.type != LDIF_Line::dn) {
         const bool is_attribute = line.type == LDIF_Line::attr;
         raise(illegal_line,
               std::string(is_attribute ? "attribute" : line_type_name(line.type)) + " );");
     }
-    return LDIF_DN(cisString(line.value));
+    return kept_dn(given_text(line.value));
 }
 
 }  // namespace
@@ -30,16 +30,19 @@ LDIF_Entry::LDIF_Entry(LDIF_Entry&&) noexcept = default;
 
 LDIF_Entry::LDIF_Entry(LDIF_DN dn) : name_("dn"), dn_(std::move(dn)) {}
 
+LDIF_Entry::LDIF_Entry(attribute_name name, kept_dn dn, LDIF_Comment&& comment)
+    : name_(std::move(name)), dn_(std::move(dn)), comment_(std::move(comment)) {}
+
 LDIF_Entry::LDIF_Entry(const LDIF_Line& line, const LDIF_Comment& comment)
     : name_(line.attribute), dn_(dn_of(line)), comment_(comment) {}
 
 LDIF_Entry::LDIF_Entry(const LDIF_Entry& other)
     : name_(other.name_),
-      dn_(other.dn_),
-      depth_(other.depth_),
-      comment_(other.comment_),
       attributes_(other.attributes_),
-      children_(other.children_) {
+      children_(other.children_),
+      depth_(other.depth_),
+      dn_(other.dn_),
+      comment_(other.comment_) {
     index_children();
 }
 
@@ -95,34 +98,31 @@ LDIF_Entry& LDIF_Entry::operator+=(LDIF_Entry&& child) {
 /// Places the one entry of node, whose relative DN is relative to this entry's parent.
 LDIF_Entry& LDIF_Entry::place(list& node) {
     LDIF_Entry& child = node.front();
-    if (!leads_to(child.dn_, child.depth_)) {
+    const dn_path dn(child.dn_);
+    if (!leads_to(dn, child.depth_)) {
         raise(not_a_child,
               child.relative_dn().str() + "] is not child of [" + relative_dn().str() + "]");
     }
-    return child.relative_size() == relative_size() ? absorb(child)
-                                                    : hang(node, child.depth_ + relative_size());
+    return child.relative_size() == relative_size()
+               ? absorb(child)
+               : hang(node, dn, child.depth_ + relative_size());
 }
 
 /// True when the relative DN stands in the other DN from that RDN on.
-bool LDIF_Entry::leads_to(const LDIF_DN& dn, size_t from) const {
-    const auto& own = dn_.rdns();
-    const auto& other = dn.rdns();
-    const auto first = own.begin() + static_cast<ptrdiff_t>(depth_);
-    const auto equal = [](const LDIF_RDN& l, const LDIF_RDN& r) { return l == r; };
-    return other.size() - from >= relative_size() &&
-           std::equal(first, own.end(), other.begin() + static_cast<ptrdiff_t>(from), equal);
+bool LDIF_Entry::leads_to(const dn_path& dn, size_t from) const {
+    return relative_size() == 0 || dn_path(dn_).has_equal_part(depth_, dn, from, relative_size());
 }
 
-/// Hangs the entry of node below this one, to which the first depth RDNs of its DN lead.
-LDIF_Entry& LDIF_Entry::hang(list& node, size_t depth) {
+/// Hangs the entry of node, whose DN is dn, below this one, to which the first depth RDNs lead.
+LDIF_Entry& LDIF_Entry::hang(list& node, const dn_path& dn, size_t depth) {
     LDIF_Entry& child = node.front();
     LDIF_Entry* parent = this;
     while (parent->index_) {
-        LDIF_Entry* next = parent->index_->equal_or_ancestor(child.dn_, depth);
+        LDIF_Entry* next = parent->index_->equal_or_ancestor(dn, depth);
         if (!next) {
             break;
         }
-        if (depth + next->relative_size() == child.dn_.rdns().size()) {
+        if (depth + next->relative_size() == dn.size()) {
             child.depth_ = depth;
             return next->absorb(child);
         }
@@ -130,8 +130,8 @@ LDIF_Entry& LDIF_Entry::hang(list& node, size_t depth) {
         parent = next;
     }
     child.depth_ = depth;
-    child.take_descendants_from(*parent);
-    parent->append(node, node.begin());
+    child.take_descendants_from(*parent, dn);
+    parent->append(node, dn);
     return *parent;
 }
 
@@ -143,30 +143,31 @@ LDIF_Entry& LDIF_Entry::absorb(LDIF_Entry& again) {
     while (!again.children_.empty()) {
         list node;
         node.splice(node.end(), again.children_, again.children_.begin());
-        hang(node, node.front().depth_);
+        hang(node, dn_path(node.front().dn_), node.front().depth_);
     }
     return *this;
 }
 
 /// Takes over the parent's children that belong below this entry, which is to be their sibling.
-void LDIF_Entry::take_descendants_from(LDIF_Entry& parent) {
+void LDIF_Entry::take_descendants_from(LDIF_Entry& parent, const dn_path& dn) {
     if (!parent.index_) {
         return;
     }
-    for (const list::iterator descendant : parent.index_->descendants(*this)) {
+    for (const list::iterator descendant : parent.index_->descendants(*this, dn)) {
         list node;
         parent.index_->erase(descendant);
         node.splice(node.end(), parent.children_, descendant);
-        hang(node, descendant->depth_ + relative_size());
+        hang(node, dn_path(descendant->dn_), descendant->depth_ + relative_size());
     }
 }
 
-void LDIF_Entry::append(list& from, list::iterator child) {
+/// Appends the entry of node to the children.
+void LDIF_Entry::append(list& node, const dn_path& dn) {
     if (!index_) {
         index_ = std::make_unique<child_index>();
     }
-    index_->insert(child);
-    children_.splice(children_.end(), from, child);
+    index_->insert(node.begin(), dn);
+    children_.splice(children_.end(), node);
 }
 
 void LDIF_Entry::index_children() {
@@ -174,7 +175,7 @@ void LDIF_Entry::index_children() {
         index_ = std::make_unique<child_index>();
     }
     for (auto child = children_.begin(); child != children_.end(); ++child) {
-        index_->insert(child);
+        index_->insert(child, dn_path(child->dn_));
     }
 }
 
@@ -187,7 +188,7 @@ std::string LDIF_Entry::str() const {
 void LDIF_Entry::append_to(std::string& out) const {
     comment_.append_to(out);
     if (!is_root()) {
-        dn_.append_to(out.append(name_.text()).append(": "));
+        dn_.append_to(out.append(name().text()).append(": "));
         out += '\n';
     }
     attributes_.append_to(out);
@@ -217,20 +218,21 @@ LDIF_Entry* LDIF_Entry::find(const LDIF_DN& dn) {
 }
 
 const LDIF_Entry* LDIF_Entry::find(const LDIF_DN& dn) const {
-    if (!leads_to(dn, 0)) {
+    const dn_path path(dn);
+    if (!leads_to(path, 0)) {
         return nullptr;
     }
     const LDIF_Entry* entry = this;
     size_t depth = relative_size();
-    while (entry && depth < dn.rdns().size()) {
-        entry = entry->index_ ? entry->index_->equal_or_ancestor(dn, depth) : nullptr;
+    while (entry && depth < path.size()) {
+        entry = entry->index_ ? entry->index_->equal_or_ancestor(path, depth) : nullptr;
         depth += entry ? entry->relative_size() : 0;
     }
     return entry;
 }
 
 LDIF_Entry* LDIF_Entry::child(const LDIF_DN& relative_dn) {
-    LDIF_Entry* found = index_ ? index_->equal_or_ancestor(relative_dn, 0) : nullptr;
+    LDIF_Entry* found = index_ ? index_->equal_or_ancestor(dn_path(relative_dn), 0) : nullptr;
     return found && found->relative_size() == relative_dn.rdns().size() ? found : nullptr;
 }
 
@@ -244,7 +246,7 @@ void LDIF_Entry::erase(LDIF_Entry& child) {
 }
 
 LDIF_DN LDIF_Entry::relative_dn() const {
-    LDIF_DN relative = dn_;
+    LDIF_DN relative = dn();
     relative.remove_root_side(depth_);
     return relative;
 }

@@ -12,6 +12,7 @@
 #include "LDIF_DN.h"
 #include "LDIF_Line.h"
 #include "cisString.h"
+#include "dn_path.h"
 
 namespace cfg32 {
 class child_index;
@@ -32,6 +33,8 @@ class LDIF_Entry {
     explicit LDIF_Entry(LDIF_DN dn);
     /// From a line of the file, of type dn (80/1000 for another). Throws what parsing a DN throws.
     LDIF_Entry(const LDIF_Line& line, const LDIF_Comment& comment);
+    /// The same of the line's name and DN.
+    LDIF_Entry(cfg32::attribute_name name, cfg32::kept_dn dn, LDIF_Comment&& comment);
     LDIF_Entry(const LDIF_Entry& other);
     LDIF_Entry(LDIF_Entry&& other) noexcept;
     LDIF_Entry& operator=(const LDIF_Entry& other);
@@ -48,6 +51,9 @@ class LDIF_Entry {
     LDIF_Entry& operator+=(LDIF_Attribute&& attribute);
     /// The same without a copy. After a failure the child is what it was.
     LDIF_Entry& operator+=(LDIF_Entry&& child);
+
+    /// The same of the one entry of node, which is taken out of it unless it was merged.
+    LDIF_Entry& place(list& node);
 
     /// The entry in file form, without its children.
     virtual std::string str() const;
@@ -69,15 +75,16 @@ class LDIF_Entry {
     /// Removes a child with everything below it.
     void erase(LDIF_Entry& child);
 
-    bool is_root() const { return name_.empty(); }
-    const cisString& name() const { return name_; }  ///< of the DN line, as it was written
-    const LDIF_DN& dn() const { return dn_; }
+    bool is_root() const { return name().empty(); }
+    const cisString& name() const { return name_.get(); }  ///< of the DN line, as it was written
+    LDIF_DN dn() const { return dn_.dn(); }
+    const cfg32::kept_dn& named_dn() const { return dn_; }
     LDIF_DN relative_dn() const;
     /// How many RDNs of the DN, from the root side, lead to the parent in the tree; the others are
     /// the relative DN.
     size_t depth() const { return depth_; }
     /// How many RDNs the relative DN has.
-    size_t relative_size() const { return dn_.rdns().size() - depth_; }
+    size_t relative_size() const { return dn_.size() - depth_; }
     const LDIF_Comment& comment() const { return comment_; }
     const LDIF_Attributes& attributes() const { return attributes_; }
     LDIF_Attributes& attributes() { return attributes_; }
@@ -87,21 +94,21 @@ class LDIF_Entry {
     LDIF_Entry header() const;
 
   private:
-    LDIF_Entry& place(list& node);
-    bool leads_to(const LDIF_DN& dn, size_t from) const;
-    LDIF_Entry& hang(list& node, size_t depth);
+    bool leads_to(const cfg32::dn_path& dn, size_t from) const;
+    LDIF_Entry& hang(list& node, const cfg32::dn_path& dn, size_t depth);
     LDIF_Entry& absorb(LDIF_Entry& again);
-    void take_descendants_from(LDIF_Entry& parent);
-    void append(list& from, list::iterator child);
+    void take_descendants_from(LDIF_Entry& parent, const cfg32::dn_path& dn);
+    void append(list& node, const cfg32::dn_path& dn);
     void index_children();
     bool ends_with_blank_line() const;
 
-    cisString name_;
-    LDIF_DN dn_;
-    size_t depth_ = 0;
-    LDIF_Comment comment_;
+    // What a search looks at stands together.
+    cfg32::attribute_name name_{""};
     LDIF_Attributes attributes_;
     list children_;
+    size_t depth_ = 0;
+    cfg32::kept_dn dn_;
+    LDIF_Comment comment_;
     std::unique_ptr<cfg32::child_index> index_;  // of children_, null when there are none
 };
 

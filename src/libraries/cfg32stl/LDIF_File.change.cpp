@@ -256,16 +256,14 @@ void LDIF_File::add(const LDIF_DN& dn, ldapmod** mods) {
 
 void LDIF_File::erase(const LDIF_DN& dn, bool deleteNonLeaves) {
     const auto body = [&] {
-        LDIF_Entry& parent = nearest_ancestor(root_, dn);
-        LDIF_DN name = dn;
-        LDIF_Entry* entry = parent.child(name -= parent.dn());
-        if (!entry) {
+        LDIF_Entry* entry = root_.find(dn);
+        if (!entry || entry->is_root()) {
             raise(no_entry);
         }
         if (!entry->children().empty() && !deleteNonLeaves) {
             raise(not_a_leaf);
         }
-        parent.erase(*entry);
+        nearest_ancestor(root_, dn).erase(*entry);
     };
     with_boundary(in("LDIF_File::erase()"), body, [&](LDIF_Exception& e) { note_failure(e, dn); });
 }

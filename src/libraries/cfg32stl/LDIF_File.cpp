@@ -3,13 +3,13 @@
 #include "LDIF_File.h"
 
 #include <cerrno>
-#include <optional>
 
 #include "LDIF_Attribute.h"
 #include "LDIF_Line.h"
 #include "disk.h"
 #include "failure.h"
 #include "line_source.h"
+#include "logical_line.h"
 
 using namespace cfg32;
 
@@ -26,7 +26,10 @@ constexpr failure unknown_line{80, 1000, "Unknown LDIF_Line::Type!"};
 
 constexpr int object_class_violation = 65;
 
-/// One pass over the text of a file, which fills a tree.
+/// Room that most entries do with while they are read.
+constexpr size_t usual_attributes = 16;
+
+/// One pass over the text of a file, which fills a tree. The tree stands in the text.
 class loader {
   public:
     loader(LDIF_Entry& root, LDIF_Comment& pending, aes_key_data* key)
@@ -36,7 +39,7 @@ class loader {
 
     int line_number() const { return line_number_; }
     bool found_invalid_lines() const { return found_invalid_lines_; }
-    std::string place() const { return open_ ? shown(open_->dn()) : "<root>"; }
+    std::string place() const { return open_.empty() ? "<root>" : shown(open_.front().dn()); }
 
   private:
     void read_line(line_source& source);
@@ -53,9 +56,9 @@ class loader {
     LDIF_Entry& root_;
     LDIF_Comment& pending_;  // comment lines that belong to nothing yet
     aes_key_data* key_;
-    LDIF_Line line_;
+    logical_line line_;
     int line_number_ = 0;
-    std::optional<LDIF_Entry> open_;  // the entry that attribute lines belong to
+    LDIF_Entry::list open_;  // the entry that attribute lines belong to, if there is one
     bool version_seen_ = false;
     bool charset_seen_ = false;
     bool done_ = false;
@@ -64,13 +67,13 @@ class loader {
 };
 
 void loader::run(std::string_view text) {
-    line_source source(text);
+    line_source source(given_text::lasting(text));
     while (!done_) {
         if (!reuse_line_) {
             read_line(source);
         }
-        if (!line_.hasSeparator) {
-            line_.changeToInvalidAttr();
+        if (!line_.has_separator) {
+            line_.change_to_invalid_attribute();
             found_invalid_lines_ = true;
         }
         dispatch();
@@ -90,7 +93,7 @@ void loader::dispatch() {
         case LDIF_Line::blankLine:
             return blank_line();
         case LDIF_Line::comment:
-            pending_ += line_;
+            pending_.append(line_.with_newline());
             return;
         case LDIF_Line::dn:
             return dn_line();
@@ -108,10 +111,10 @@ void loader::end_of_file() {
 }
 
 void loader::blank_line() {
-    if (open_) {
+    if (!open_.empty()) {
         close_entry();
     } else {
-        pending_ += line_;
+        pending_.append(line_.with_newline());
     }
 }
 
@@ -120,8 +123,9 @@ void loader::dn_line() {
     require_root_attribute("charset", "ISO-8859-1", charset_seen_);
     require_root_attribute("version", "1", version_seen_);
     reuse_line_ = false;
-    open_.emplace(line_, pending_);
+    open_.emplace_back(attribute_name(line_.attribute), kept_dn(line_.value), std::move(pending_));
     pending_.clear();
+    open_.front().attributes().reserve(usual_attributes);
 }
 
 /// Adds the attribute to the root of a file without it; the comment before the first entry moves
@@ -146,18 +150,19 @@ void loader::attribute_line() {
         if (e.ldapErr == object_class_violation || e.sysErrno == ENOMEM) {
             throw;
         }
-        line_.changeToInvalidAttr();
+        line_.change_to_invalid_attribute();
         found_invalid_lines_ = true;
         reuse_line_ = true;
     }
 }
 
 void loader::add_attribute() {
-    LDIF_Attribute attribute(key_, line_, std::move(pending_));
+    LDIF_Attribute attribute(key_, attribute_name(line_.attribute), line_.value,
+                             std::move(pending_));
     pending_.clear();
     reuse_line_ = false;
-    if (open_) {
-        *open_ += std::move(attribute);
+    if (!open_.empty()) {
+        open_.front() += std::move(attribute);
     } else {
         add_root_attribute(std::move(attribute));
     }
@@ -183,9 +188,10 @@ void loader::add_root_attribute(LDIF_Attribute&& attribute) {
 }
 
 void loader::close_entry() {
-    if (open_) {
-        root_ += std::move(*open_);
-        open_.reset();
+    if (!open_.empty()) {
+        open_.front().attributes().shrink_to_fit();
+        root_.place(open_);
+        open_.clear();
     }
 }
 
@@ -251,14 +257,14 @@ bool LDIF_File::load_if_changed() {
     is_loaded_ = is_whole_ = false;
     trailing_comment_.clear();
     root_.clear();
-    std::string text;
+    text_.clear();  // in which they stood
     loader load(root_, trailing_comment_, key_);
     const auto body = [&] {
-        if (!read_all(file.get(), static_cast<size_t>(file.status().st_size), text)) {
+        if (!read_all(file.get(), static_cast<size_t>(file.status().st_size), text_)) {
             raise_with(not_read, {}, name_file_and_errno(errno));
         }
-        require_finished(text);
-        load.run(text);
+        require_finished(text_);
+        load.run(text_);
     };
     with_boundary([] { return "reading file"; }, body,
                   [&](LDIF_Exception& e) {

@@ -147,6 +147,7 @@ class LDIF_File {
     std::string file_name_;
     std::string backup_file_name_;
     struct stat status_ {};  // of the last load or write
+    std::string text_;       // of the last load, in which the store stands
     LDIF_Comment trailing_comment_;
     LDIF_Entry root_;
     int authentication_ = not_authenticated;

@@ -30,6 +30,9 @@ constexpr failure not_put_back{80, 1000, "The old content could not be put back"
 
 constexpr size_t name_buffer_size = 2048;
 
+/// By so much a file usually grows, at most, when it is written.
+constexpr size_t usual_growth = 65536;
+
 std::string formatted(const char* format, const std::string& file_name) {
     char message[1024];
     nuv_snprintf(message, sizeof message, format, file_name.c_str());
@@ -107,6 +110,7 @@ std::string LDIF_File::text() const {
         raise(not_whole);
     }
     std::string out;
+    out.reserve(static_cast<size_t>(status_.st_size) + usual_growth);
     const auto append = [&](const LDIF_Entry& entry) {
         const size_t begin = out.size();
         entry.append_to(out);

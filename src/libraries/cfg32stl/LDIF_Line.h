@@ -42,6 +42,9 @@ class LDIF_Line {
 
 namespace cfg32 {
 
+/// The attribute that keeps the text of a line that can't be used.
+inline constexpr const char* invalid_line_name = "oru-slapdInvalidLine";
+
 /// The name that messages print for a line type.
 const char* line_type_name(int type);
 

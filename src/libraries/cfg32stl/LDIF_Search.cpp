@@ -57,7 +57,7 @@ LDIF_Filter& LDIF_Filter::operator=(const std::string& text) {
     }
     std::string name = term.substr(0, equals);
     if (!stripTrailing(name).empty() || equals != std::string::npos) {
-        attribute_ = name;
+        attribute_ = attribute_name(name);
     }
     if (equals == std::string::npos) {
         return *this;
@@ -73,10 +73,7 @@ LDIF_Filter& LDIF_Filter::operator=(const std::string& text) {
 
 bool LDIF_Filter::match(const LDIF_Entry& entry) const {
     const LDIF_Attributes& attributes = entry.attributes();
-    if (!type_) {
-        type_ = getAttrType(attribute_.c_str());
-    }
-    const auto attribute = attributes.find(attribute_, *type_);
+    const auto attribute = attributes.find(attribute_);
     if (attribute == attributes.end()) {
         return false;
     }

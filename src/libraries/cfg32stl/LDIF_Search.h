@@ -26,15 +26,14 @@ class LDIF_Filter {
     /// Throws what the attribute's syntax throws for the value.
     virtual bool match(const LDIF_Entry& entry) const;
 
-    const cisString& attribute() const { return attribute_; }
+    const cisString& attribute() const { return attribute_.get(); }
     const std::string& value() const { return value_; }
     bool any_value() const { return any_value_; }
 
   private:
-    cisString attribute_ = "objectclass";
+    cfg32::attribute_name attribute_{"objectclass"};
     std::string value_;
     bool any_value_ = true;                     // the attribute's presence is all that counts
-    mutable const _AttrType* type_ = nullptr;   // the attribute's, once it was looked up
     mutable std::optional<LDIF_Value> wanted_;  // the value, once an attribute has told its type
 };
 

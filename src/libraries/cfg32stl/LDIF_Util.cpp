@@ -1,5 +1,8 @@
 #include "LDIF_Util.h"
 
+#include <strings.h>
+
+#include <algorithm>
 #include <cctype>
 #include <cstdlib>
 #include <cwchar>
@@ -141,11 +144,11 @@ namespace cfg32 {
 
 bool is_plain(std::string_view text) {
     // No early exit: a loop without one is done many bytes at a time.
-    bool plain = true;
+    unsigned char all = 0;
     for (const char c : text) {
-        plain &= c > '\0';
+        all |= static_cast<unsigned char>(c);
     }
-    return plain;
+    return all < 0x80 && text.find('\0') == std::string_view::npos;
 }
 
 std::string_view without_leading_space(std::string_view text) {
@@ -179,11 +182,28 @@ character first_character(std::string_view text) {
     return {text.substr(0, is_valid ? length : 1), code, is_valid};
 }
 
-size_t hash_without_case(const char* text, size_t seed) {
+int compare_without_case(std::string_view left, std::string_view right) {
+    const size_t common = std::min(left.size(), right.size());
+    const int order = strncasecmp(left.data(), right.data(), common);
+    if (order != 0 || left.size() == right.size()) {
+        return order;
+    }
+    const std::string_view longer = left.size() > common ? left : right;
+    const size_t end = longer.find('\0');
+    if (end <= common) {
+        return 0;
+    }
+    return left.size() > common ? 1 : -1;
+}
+
+size_t hash_without_case(std::string_view text, size_t seed) {
     // FNV-1a. The case is folded by the locale, as strcasecmp does; this is the table of tolower().
     const int32_t* const lower_case = *__ctype_tolower_loc();
-    for (; *text != '\0'; ++text) {
-        const int folded = lower_case[static_cast<unsigned char>(*text)];
+    for (const char c : text) {
+        if (c == '\0') {
+            break;
+        }
+        const int folded = lower_case[static_cast<unsigned char>(c)];
         seed = (seed ^ static_cast<size_t>(folded)) * 0x100000001b3;
     }
     return seed;

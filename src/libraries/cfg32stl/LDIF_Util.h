@@ -119,8 +119,12 @@ struct character {
 /// text must not be empty.
 character first_character(std::string_view text);
 
-/// A hash that is the same for texts that strcasecmp finds equal; seed continues another hash.
-size_t hash_without_case(const char* text, size_t seed = 0xcbf29ce484222325);
+/// strcasecmp of two texts: each ends at its first NUL, if it has one.
+int compare_without_case(std::string_view left, std::string_view right);
+
+/// A hash that is the same for texts that are equal without regard to case; seed continues another
+/// hash.
+size_t hash_without_case(std::string_view text, size_t seed = 0xcbf29ce484222325);
 
 /// The value of a hexadecimal digit, or -1.
 int hex_digit(wchar_t c);

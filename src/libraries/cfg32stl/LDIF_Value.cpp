@@ -32,14 +32,14 @@ LDIF_Value::LDIF_Value(const _AttrType* type, const char* text, aes_key_data* ke
     text ? check(text) : raise_with(no_text, {}, [&](LDIF_Exception& e) { e.attrType = type; });
 }
 
-LDIF_Value::LDIF_Value(const _AttrType* type, const std::string& text, aes_key_data* key)
+LDIF_Value::LDIF_Value(const _AttrType* type, const given_text& text, aes_key_data* key)
     : attrType(type), key(key) {
     check(text);
 }
 
-void LDIF_Value::check(const std::string& given) {
+void LDIF_Value::check(const given_text& given) {
     const auto details = [&](LDIF_Exception& e) {
-        e.value = given;
+        e.value = given.str();
         if (attrType && attrType->name) {
             e.attribute = attrType->name;
         }
@@ -66,6 +66,13 @@ LDIF_Value::LDIF_Value(const _AttrType* type, const void* bytes, int length, aes
         [&] { type->fromBin(*this, static_cast<const char*>(bytes), length); }, details);
 }
 
+LDIF_Value LDIF_Value::stored(const _AttrType* type, std::string_view text, aes_key_data* key) {
+    LDIF_Value value(type, key);
+    value.text = given_text::lasting(text);
+    complete(value);
+    return value;
+}
+
 LDIF_Value::LDIF_Value(const LDIF_Value& other) : attrType(other.attrType), key(other.key) {
     *this = other;
 }
@@ -77,7 +84,7 @@ LDIF_Value& LDIF_Value::operator=(const LDIF_Value& other) {
     attrType = other.attrType;
     text = other.text;
     const auto details = [&](LDIF_Exception& e) {
-        e.value = text;
+        e.value = text.str();
         e.attrType = attrType;
     };
     if (other.binary && other.binaryLength == 0) {
@@ -92,21 +99,32 @@ LDIF_Value& LDIF_Value::operator=(const LDIF_Value& other) {
     return *this;
 }
 
+bool binary_form::assign(const void* bytes, size_t length) {
+    reset();
+    if (length <= sizeof *number_) {
+        memcpy(number_.emplace().data(), bytes, length);
+        return true;
+    }
+    bytes_.reset(static_cast<char*>(malloc(length)));
+    if (bytes_) {
+        memcpy(bytes_.get(), bytes, length);
+    }
+    return static_cast<bool>(bytes_);
+}
+
 void LDIF_Value::set_binary(const void* bytes, int length) {
     binary.reset();
     binaryLength = 0;
     if (length == 0) {
         return;
     }
-    binary.reset(static_cast<char*>(malloc(static_cast<size_t>(length))));
-    if (!binary) {
+    if (!binary.assign(bytes, static_cast<size_t>(length))) {
         raise_with(no_buffer, {}, [&](LDIF_Exception& e) {
             e.sysErrno = ENOMEM;
-            e.value = text;
+            e.value = text.str();
             e.attrType = attrType;
         });
     }
-    memcpy(binary.get(), bytes, static_cast<size_t>(length));
     binaryLength = length;
 }
 
@@ -115,6 +133,14 @@ std::string LDIF_Value::str() const {
         raise(no_to_str);
     }
     return attrType->toStr(*this);
+}
+
+// Every syntax shows what it stores.
+std::string_view LDIF_Value::shown() const {
+    if (!attrType || !attrType->toStr) {
+        raise(no_to_str);
+    }
+    return text;
 }
 
 int LDIF_Value::compare(const LDIF_Value& other) const {
@@ -133,26 +159,24 @@ int LDIF_Value::compare(const std::string& other) const {
 
 std::ostream& operator<<(std::ostream& out, const LDIF_Value& value) { return out << value.str(); }
 
-attribute_name::attribute_name(const std::string& name, const _AttrType& type) {
-    if (type.name && name == type.name) {
-        table_ = &name_of(type);
-    } else {
-        own_ = std::make_unique<cisString>(name);
+LDIF_Values::LDIF_Values(const LDIF_Values& other)
+    : name_(other.name_), key_(other.key_), first_(other.first_) {
+    if (!other.several_) {
+        return;
+    }
+    several_ = std::make_unique<several>();
+    several_->texts = other.several_->texts;
+    if (!other.several_->dns) {
+        return;
+    }
+    several_->dns = std::make_unique<dn_map>();
+    for (size_t i = 0; i < size(); ++i) {
+        const auto dn = other.several_->dns->find(other.texts()[i].view().data());
+        if (dn != other.several_->dns->end()) {
+            several_->dns->emplace(texts()[i].view().data(), dn->second);
+        }
     }
 }
-
-attribute_name::attribute_name(const attribute_name& other)
-    : table_(other.table_), own_(other.own_ ? std::make_unique<cisString>(*other.own_) : nullptr) {}
-
-attribute_name& attribute_name::operator=(const attribute_name& other) {
-    return *this = attribute_name(other);
-}
-
-LDIF_Values::LDIF_Values(const std::string& name, aes_key_data* key)
-    : type_(getAttrType(name.empty() ? nullptr : name.c_str())), name_(name, *type_), key_(key) {}
-
-LDIF_Values::LDIF_Values(const LDIF_Values& other)
-    : values_(other.values_), type_(other.type_), name_(other.name_), key_(other.key_) {}
 
 LDIF_Values& LDIF_Values::operator=(const LDIF_Values& other) {
     if (this == &other) {
@@ -161,9 +185,8 @@ LDIF_Values& LDIF_Values::operator=(const LDIF_Values& other) {
     const auto body = [&]() -> LDIF_Values& {
         clear();
         name_ = other.name_;
-        type_ = other.type_;
         key_ = other.key_;
-        for (const LDIF_Value& value : other.values_) {
+        for (const LDIF_Value& value : other) {
             add(value.str());
         }
         return *this;
@@ -172,7 +195,7 @@ LDIF_Values& LDIF_Values::operator=(const LDIF_Values& other) {
                          [&](LDIF_Exception& e) { complete(e); });
 }
 
-LDIF_Values& LDIF_Values::operator+=(const std::string& text) {
+LDIF_Values& LDIF_Values::operator+=(const given_text& text) {
     const auto body = [&]() -> LDIF_Values& {
         add(text);
         return *this;
@@ -190,15 +213,17 @@ LDIF_Values& LDIF_Values::operator+=(const LDIF_Value& value) {
                          [&](LDIF_Exception& e) { complete(e, value.text); });
 }
 
-LDIF_Values& LDIF_Values::operator+=(const LDIF_Values& other) {
-    std::string text;
+LDIF_Values& LDIF_Values::merge(const LDIF_Values& other, bool takes_over) {
+    std::string_view text;
     const auto add_all = [&] {
-        // Merged into itself, a list may grow (a DN may read back as another): up to its end of
-        // before.
-        size_t count = other.size();
-        for (auto value = other.begin(); count > 0; ++value, --count) {
-            text = value->str();
-            add(text);
+        // Merged into itself, a list may grow: up to its end of before.
+        const size_t count = other.size();
+        for (size_t i = 0; i < count; ++i) {
+            const given_text given = other.texts()[i].given();
+            text = given;
+            // A text that was kept as it was given has passed the syntax already.
+            takes_over&& given.lasts() ? append(LDIF_Value::stored(type(), text, key_))
+                                       : add(given_text(text));
         }
     };
     const auto in_context = [&] {
@@ -206,15 +231,15 @@ LDIF_Values& LDIF_Values::operator+=(const LDIF_Values& other) {
     };
     // KEPT: what nobody expected is reported with the first value, not with the one that failed.
     with_system_error(in("LDIF_Values::operator +="), in_context, [&](LDIF_Exception& e) {
-        complete(e, other.empty() ? empty_str : other.values_.front().text);
+        complete(e, other.empty() ? empty_str : other.texts().front().view());
     });
     return *this;
 }
 
 LDIF_Values& LDIF_Values::operator-=(const std::string& text) {
     const auto body = [&]() -> LDIF_Values& {
-        const list::const_iterator value = find(text);
-        if (value != values_.end()) {
+        const const_iterator value = find(text);
+        if (value != end()) {
             erase(value);
         }
         return *this;
@@ -224,86 +249,142 @@ LDIF_Values& LDIF_Values::operator-=(const std::string& text) {
 }
 
 void LDIF_Values::complete(LDIF_Exception& e) const {
-    e.attrType = type_;
+    e.attrType = type();
     if (e.attribute.empty()) {
         e.attribute = name().text();
     }
 }
 
-void LDIF_Values::complete(LDIF_Exception& e, const std::string& text) const {
+void LDIF_Values::complete(LDIF_Exception& e, std::string_view text) const {
     complete(e);
     e.value = text;
 }
 
 void LDIF_Values::clear() {
-    values_.clear();
-    index_.reset();
+    first_ = {};
+    several_.reset();
+}
+
+LDIF_Value LDIF_Values::value_of(std::string_view text) const {
+    LDIF_Value value = LDIF_Value::stored(type(), text, key_);
+    if (several_ && several_->dns) {
+        const auto dn = several_->dns->find(text.data());
+        value.dn = dn == several_->dns->end() ? nullptr : std::make_unique<LDIF_DN>(dn->second);
+    }
+    return value;
+}
+
+LDIF_Values::several& LDIF_Values::more_than_a_text() {
+    if (!several_) {
+        auto all = std::make_unique<several>();
+        all->texts.reserve(2);
+        if (first_.has_value()) {
+            all->texts.push_back(std::move(first_));
+        }
+        several_ = std::move(all);
+    }
+    return *several_;
 }
 
 /// Adds the text as a value, unless there is an equal one.
-void LDIF_Values::add(const std::string& text) {
-    list added;
-    added.emplace_back(type_, text, key_);
-    if (position_of(added.front()) != values_.end()) {
+void LDIF_Values::add(const given_text& text) { append(LDIF_Value(type(), text, key_)); }
+
+void LDIF_Values::append(LDIF_Value&& value) {
+    if (!empty() && position_of(value) != size()) {
         return;
     }
-    if (index_) {
-        index_->emplace(hash_of(added.front()), added.begin());
+    if (empty() && !several_ && !value.dn) {
+        first_ = std::move(value.text);
+        return;
     }
-    values_.splice(values_.end(), added);
-}
-
-LDIF_Values::list::iterator LDIF_Values::find(const std::string& text) {
-    return values_.empty() ? values_.end() : position_of(LDIF_Value(type_, text, key_));
-}
-
-LDIF_Values::list::const_iterator LDIF_Values::find(const std::string& text) const {
-    return const_cast<LDIF_Values*>(this)->find(text);
-}
-
-LDIF_Values::list::const_iterator LDIF_Values::find(const LDIF_Value& value) const {
-    return const_cast<LDIF_Values*>(this)->position_of(value);
-}
-
-LDIF_Values::list::const_iterator LDIF_Values::erase(list::const_iterator value) {
-    forget(value);
-    return values_.erase(value);
-}
-
-/// The first value that is equal by the syntax.
-LDIF_Values::list::iterator LDIF_Values::position_of(const LDIF_Value& value) {
-    if (values_.size() <= longest_scan) {
-        return std::find_if(values_.begin(), values_.end(),
-                            [&](const LDIF_Value& own) { return own.compare(value) == 0; });
+    // Whatever may fail comes before the first change.
+    several& all = more_than_a_text();
+    if (all.texts.size() == all.texts.capacity()) {
+        all.texts.reserve(2 * all.texts.size());
     }
-    if (!index_) {
+    dn_map dn;
+    if (value.dn) {
+        dn.emplace(value.text.view().data(), *value.dn);
+        all.dns = all.dns ? std::move(all.dns) : std::make_unique<dn_map>();
+    }
+    if (all.index) {
+        all.index->emplace(hash_of(value), value.text);
+    }
+    if (value.dn) {
+        all.dns->merge(dn);
+    }
+    all.texts.push_back(std::move(value.text));
+}
+
+LDIF_Values::const_iterator LDIF_Values::find(const std::string& text) const {
+    return empty() ? end() : find(LDIF_Value(type(), text, key_));
+}
+
+LDIF_Values::const_iterator LDIF_Values::find(const LDIF_Value& value) const {
+    return {this, position_of(value)};
+}
+
+LDIF_Values::const_iterator LDIF_Values::erase(const const_iterator& value) {
+    if (!several_) {
+        first_ = {};
+        return end();
+    }
+    std::vector<kept_text>& texts = several_->texts;
+    const auto erased = texts.begin() + static_cast<ptrdiff_t>(value.position_);
+    forget(*erased);
+    if (several_->dns) {
+        several_->dns->erase(erased->view().data());
+    }
+    texts.erase(erased);
+    return value;
+}
+
+/// Where the first value stands that is equal by the syntax; the size for none.
+size_t LDIF_Values::position_of(const LDIF_Value& value) const {
+    if (size() > longest_scan) {
+        return indexed_position_of(value);
+    }
+    equal_texts* const equal = value.attrType == type() ? equal_texts_of(*type()) : nullptr;
+    const auto is_equal = [&](const kept_text& own) {
+        return equal ? equal(own, value.text) : value_of(own).compare(value) == 0;
+    };
+    return static_cast<size_t>(std::ranges::find_if(texts(), is_equal) - texts().begin());
+}
+
+size_t LDIF_Values::indexed_position_of(const LDIF_Value& value) const {
+    if (!several_->index) {
         index_values();
     }
-    const auto [first, last] = index_->equal_range(hash_of(value));
-    for (auto entry = first; entry != last; ++entry) {
-        if (entry->second->compare(value) == 0) {
-            return entry->second;
-        }
+    const auto [first, last] = several_->index->equal_range(hash_of(value));
+    const auto is_equal = [&](const auto& entry) {
+        return value_of(entry.second).compare(value) == 0;
+    };
+    const auto entry = std::find_if(first, last, is_equal);
+    if (entry == last) {
+        return size();
     }
-    return values_.end();
+    const auto is_it = [&](const kept_text& own) {
+        return own.view().data() == entry->second.data();
+    };
+    return static_cast<size_t>(std::ranges::find_if(texts(), is_it) - texts().begin());
 }
 
-void LDIF_Values::index_values() {
+void LDIF_Values::index_values() const {
     auto index = std::make_unique<hash_index>();
-    for (auto value = values_.begin(); value != values_.end(); ++value) {
-        index->emplace(hash_of(*value), value);
+    for (const kept_text& text : texts()) {
+        index->emplace(hash_of(value_of(text)), text);
     }
-    index_ = std::move(index);
+    several_->index = std::move(index);
 }
 
 /// Takes a value out of the index.
-void LDIF_Values::forget(list::const_iterator value) {
-    if (!index_) {
+void LDIF_Values::forget(std::string_view text) {
+    if (!several_->index) {
         return;
     }
-    const auto [first, last] = index_->equal_range(hash_of(*value));
-    const auto is_value = [&](const auto& entry) { return entry.second == value; };
-    index_->erase(std::find_if(first, last, is_value));
+    const auto [first, last] = several_->index->equal_range(hash_of(value_of(text)));
+    const auto is_it = [&](const auto& entry) { return entry.second.data() == text.data(); };
+    several_->index->erase(std::find_if(first, last, is_it));
 }
 
 std::string LDIF_Values::str() const {
@@ -313,7 +394,7 @@ std::string LDIF_Values::str() const {
 }
 
 void LDIF_Values::append_to(std::string& out) const {
-    for (const LDIF_Value& value : values_) {
-        out.append(name().text()).append(": ").append(value.str()).append("\n");
+    for (const kept_text& text : texts()) {
+        out.append(name().text()).append(": ").append(text).append("\n");
     }
 }

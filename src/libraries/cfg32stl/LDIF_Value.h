@@ -1,44 +1,45 @@
 #pragma once
 
+#include <array>
+#include <cstdint>
 #include <cstdlib>
 #include <iosfwd>
-#include <list>
+#include <iterator>
+#include <map>
 #include <memory>
+#include <optional>
+#include <span>
 #include <string>
+#include <string_view>
 #include <unordered_map>
+#include <vector>
 
 #include "LDIF_AttrType.h"
 #include "LDIF_DN.h"
 #include "cisString.h"
+#include "kept_text.h"
 
 class LDIF_Exception;
 struct aes_key_data;
 
 namespace cfg32 {
 
-struct free_deleter {
-    void operator()(void* memory) const { free(memory); }
-};
-
-}  // namespace cfg32
-
-namespace cfg32 {
-
-/// An attribute's name as the caller wrote it. Where that is the table's spelling it is kept there.
-class attribute_name {
+/// The bytes of a value. Those of a number need no memory of their own.
+class binary_form {
   public:
-    attribute_name(const std::string& name, const _AttrType& type);
-    attribute_name(const attribute_name& other);
-    attribute_name(attribute_name&&) noexcept = default;
-    attribute_name& operator=(const attribute_name& other);
-    attribute_name& operator=(attribute_name&&) noexcept = default;
-    ~attribute_name() = default;
-
-    const cisString& get() const { return own_ ? *own_ : *table_; }
+    const char* get() const { return number_ ? number_->data() : bytes_.get(); }
+    explicit operator bool() const { return get(); }
+    void reset() { *this = {}; }
+    /// Copies the bytes. False when there is no memory for them.
+    bool assign(const void* bytes, size_t length);
 
   private:
-    const cisString* table_ = nullptr;
-    std::unique_ptr<cisString> own_;
+    struct free_deleter {
+        void operator()(char* memory) const { free(memory); }
+    };
+
+    std::optional<std::array<char, sizeof(int64_t)>> number_;
+    std::unique_ptr<char, free_deleter> bytes_;
 };
 
 }  // namespace cfg32
@@ -47,16 +48,18 @@ class attribute_name {
 /// members.
 class LDIF_Value {
   public:
-    const _AttrType* attrType;  ///< not owned
-    std::string text;           ///< as the syntax stores it: a DN normalised, a password encoded
-    int binaryLength = 0;       ///< in bytes; at least 1 exactly when there is a binary form
-    std::unique_ptr<char, cfg32::free_deleter> binary;  ///< of integers: 8 bytes
-    std::unique_ptr<LDIF_DN> dn;                        ///< of distinguished names
-    aes_key_data* key;                                  ///< for passwords; may be null, not owned
+    const _AttrType* attrType;    ///< not owned
+    cfg32::kept_text text;        ///< as the syntax stores it: a DN normalised, a password encoded
+    int binaryLength = 0;         ///< in bytes; at least 1 exactly when there is a binary form
+    cfg32::binary_form binary;    ///< of integers: 8 bytes
+    std::unique_ptr<LDIF_DN> dn;  ///< of distinguished names; null where the text tells it all
+    aes_key_data* key;            ///< for passwords; may be null, not owned
 
     /// Throws what the syntax throws, completed by the text and the attribute's name.
     LDIF_Value(const _AttrType* type, const char* text, aes_key_data* key);
-    LDIF_Value(const _AttrType* type, const std::string& text, aes_key_data* key);
+    LDIF_Value(const _AttrType* type, const std::string& text, aes_key_data* key)
+        : LDIF_Value(type, cfg32::given_text(text), key) {}
+    LDIF_Value(const _AttrType* type, const cfg32::given_text& text, aes_key_data* key);
     LDIF_Value(const _AttrType* type, const void* bytes, int length, aes_key_data* key);
     LDIF_Value(const LDIF_Value& other);
     LDIF_Value(LDIF_Value&&) noexcept = default;
@@ -64,7 +67,13 @@ class LDIF_Value {
     LDIF_Value& operator=(LDIF_Value&&) noexcept = default;
     ~LDIF_Value() = default;
 
+    /// One that was checked before, of the text that its syntax stored then. It stands in that
+    /// text, which must outlive it.
+    static LDIF_Value stored(const _AttrType* type, std::string_view text, aes_key_data* key);
+
     std::string str() const;
+    /// The same, as a part of the value.
+    std::string_view shown() const;
     /// By the type's match. The text is made a value first, so one that the syntax refuses throws.
     int compare(const LDIF_Value& other) const;
     int compare(const std::string& other) const;
@@ -74,7 +83,8 @@ class LDIF_Value {
     void set_binary(const void* bytes, int length);
 
   private:
-    void check(const std::string& given);
+    LDIF_Value(const _AttrType* type, aes_key_data* key) : attrType(type), key(key) {}
+    void check(const cfg32::given_text& given);
 };
 
 std::ostream& operator<<(std::ostream& out, const LDIF_Value& value);
@@ -82,11 +92,17 @@ std::ostream& operator<<(std::ostream& out, const LDIF_Value& value);
 /// The values of one attribute, in the order they were added and free of duplicates, which the
 /// syntax's own comparison finds. Whether an attribute may have more than one is not looked at
 /// here.
+///
+/// Of a value the list keeps no more than the text that the syntax stored. Who looks at one gets an
+/// LDIF_Value made of it, which stands in the list and lasts until the list is changed.
 class LDIF_Values {
   public:
-    using list = std::list<LDIF_Value>;
+    class const_iterator;
 
-    LDIF_Values(const std::string& name, aes_key_data* key);
+    LDIF_Values(const std::string& name, aes_key_data* key)
+        : LDIF_Values(cfg32::attribute_name(name), key) {}
+    LDIF_Values(cfg32::attribute_name name, aes_key_data* key)
+        : name_(std::move(name)), key_(key) {}
     LDIF_Values(const LDIF_Values& other);
     LDIF_Values(LDIF_Values&&) noexcept = default;
     /// Replaces everything; every value is checked again by the syntax.
@@ -95,27 +111,31 @@ class LDIF_Values {
     ~LDIF_Values() = default;
 
     // A value is added as text and checked by this list's syntax; an equal one is dropped.
-    LDIF_Values& operator+=(const std::string& text);
+    LDIF_Values& operator+=(const cfg32::given_text& text);
     LDIF_Values& operator+=(const LDIF_Value& value);
     /// Values before one that is refused stay added.
-    LDIF_Values& operator+=(const LDIF_Values& other);
+    LDIF_Values& operator+=(const LDIF_Values& other) { return merge(other, false); }
+    LDIF_Values& operator+=(LDIF_Values&& other) { return merge(other, true); }
     /// Removes the value equal to the text, if there is one.
     LDIF_Values& operator-=(const std::string& text);
     void clear();
 
-    list::const_iterator find(const std::string& text) const;
-    list::iterator find(const std::string& text);
+    const_iterator find(const std::string& text) const;
     /// The value that is equal by the syntax.
-    list::const_iterator find(const LDIF_Value& value) const;
+    const_iterator find(const LDIF_Value& value) const;
     /// Returns the value that followed.
-    list::const_iterator erase(list::const_iterator value);
-    list::const_iterator begin() const { return values_.begin(); }
-    list::const_iterator end() const { return values_.end(); }
-    bool empty() const { return values_.empty(); }
-    size_t size() const { return values_.size(); }
+    const_iterator erase(const const_iterator& value);
+    const_iterator begin() const;
+    const_iterator end() const;
+    bool empty() const { return texts().empty(); }
+    size_t size() const { return texts().size(); }
+
+    /// What is kept of the values. None of them moves in memory before it is removed.
+    std::span<const cfg32::kept_text> texts() const;
 
     const cisString& name() const { return name_.get(); }  ///< as the caller wrote it
-    const _AttrType* type() const { return type_; }
+    const _AttrType* type() const { return name_.type(); }
+    const cfg32::attribute_name& typed_name() const { return name_; }
     aes_key_data* key() const { return key_; }
 
     /// A line "name: value" for each value.
@@ -123,18 +143,76 @@ class LDIF_Values {
     void append_to(std::string& out) const;
 
   private:
-    using hash_index = std::unordered_multimap<size_t, list::iterator>;
+    // By the values' hashes; the texts are the same as in the list.
+    using hash_index = std::unordered_multimap<size_t, std::string_view>;
 
-    void add(const std::string& text);
+    // By where the text stands.
+    using dn_map = std::map<const char*, LDIF_DN>;
+
+    struct several {
+        std::vector<cfg32::kept_text> texts;
+        std::unique_ptr<hash_index> index;  // of many only
+        std::unique_ptr<dn_map> dns;        // of values whose text does not tell all of the DN
+    };
+
+    LDIF_Values& merge(const LDIF_Values& other, bool takes_over);
+    void add(const cfg32::given_text& text);
+    void append(LDIF_Value&& value);
+    several& more_than_a_text();
     void complete(LDIF_Exception& e) const;
-    void complete(LDIF_Exception& e, const std::string& text) const;
-    list::iterator position_of(const LDIF_Value& value);
-    void index_values();
-    void forget(list::const_iterator value);
+    void complete(LDIF_Exception& e, std::string_view text) const;
+    LDIF_Value value_of(std::string_view text) const;
+    size_t position_of(const LDIF_Value& value) const;
+    size_t indexed_position_of(const LDIF_Value& value) const;
+    void index_values() const;
+    void forget(std::string_view text);
 
-    list values_;
-    const _AttrType* type_;
     cfg32::attribute_name name_;
     aes_key_data* key_;
-    std::unique_ptr<hash_index> index_;  // of long lists only
+    cfg32::kept_text first_;            // where a text is all there is
+    std::unique_ptr<several> several_;  // where there is more
 };
+
+/// Makes the values of a list.
+class LDIF_Values::const_iterator {
+  public:
+    using iterator_category = std::input_iterator_tag;
+    using value_type = LDIF_Value;
+    using difference_type = ptrdiff_t;
+    using reference = LDIF_Value;
+
+    class pointer {
+      public:
+        explicit pointer(LDIF_Value&& value) : value_(std::move(value)) {}
+        const LDIF_Value* operator->() const { return &value_; }
+
+      private:
+        LDIF_Value value_;
+    };
+
+    LDIF_Value operator*() const { return list_->value_of(list_->texts()[position_]); }
+    pointer operator->() const { return pointer(**this); }
+    const_iterator& operator++() {
+        ++position_;
+        return *this;
+    }
+    const_iterator operator++(int) { return {list_, position_++}; }
+    bool operator==(const const_iterator&) const = default;
+
+  private:
+    friend class LDIF_Values;
+    const_iterator(const LDIF_Values* list, size_t position) : list_(list), position_(position) {}
+
+    const LDIF_Values* list_;
+    size_t position_;
+};
+
+inline LDIF_Values::const_iterator LDIF_Values::begin() const { return {this, 0}; }
+inline LDIF_Values::const_iterator LDIF_Values::end() const { return {this, size()}; }
+
+inline std::span<const cfg32::kept_text> LDIF_Values::texts() const {
+    if (several_) {
+        return several_->texts;
+    }
+    return {&first_, first_.has_value() ? 1U : 0U};
+}

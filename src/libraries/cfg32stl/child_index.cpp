@@ -1,92 +1,124 @@
 #include "child_index.h"
 
 #include <algorithm>
+#include <utility>
+
+#include "dn_path.h"
 
 namespace cfg32 {
 
 namespace {
 
-/// True when the child's relative DN begins with the RDNs of dn from `from` to `to`.
-bool begins_with(const LDIF_Entry& child, const LDIF_DN& dn, size_t from, size_t to) {
-    const auto part = dn.rdns().begin();
-    const auto relative = child.dn().rdns().begin() + static_cast<ptrdiff_t>(child.depth());
-    const auto equal = [](const LDIF_RDN& l, const LDIF_RDN& r) { return l == r; };
-    return child.relative_size() >= to - from &&
-           std::equal(part + static_cast<ptrdiff_t>(from), part + static_cast<ptrdiff_t>(to),
-                      relative, equal);
-}
-
-/// Calls use(hash) with the hash of each root-side part of the child's relative DN but the whole.
+/// Calls use(hash) with the hash of each root-side part of the child's relative DN but the whole;
+/// returns the hash of that.
 template <class Use>
-void for_each_ancestor(const LDIF_Entry& child, Use use) {
-    const std::vector<LDIF_RDN>& rdns = child.dn().rdns();
+size_t for_each_ancestor(const LDIF_Entry& child, const dn_path& path, Use use) {
     size_t hash = 0;
-    for (size_t i = child.depth(); i + 1 < rdns.size(); ++i) {
-        hash = rdns[i].hash(hash);
-        use(hash);
-    }
-}
-
-/// The hash of the child's relative DN.
-size_t hash_of(const LDIF_Entry& child) {
-    const std::vector<LDIF_RDN>& rdns = child.dn().rdns();
-    size_t hash = 0;
-    for (size_t i = child.depth(); i < rdns.size(); ++i) {
-        hash = rdns[i].hash(hash);
+    for (size_t i = child.depth(); i < path.size(); ++i) {
+        if (i > child.depth()) {
+            use(hash);
+        }
+        hash = path.hash(i, hash);
     }
     return hash;
 }
 
+size_t hash_of(const LDIF_Entry& child, const dn_path& path) {
+    return for_each_ancestor(child, path, [](size_t) {});
+}
+
 }  // namespace
 
-void child_index::insert(position child) {
-    const uint64_t order = next_order_++;
-    by_dn_.emplace(hash_of(*child), numbered_child{child, order});
-    for_each_ancestor(*child, [&](size_t hash) { by_ancestor_[{hash, order}] = child; });
+void hashed_children::insert(size_t hash, position child) {
+    if (3 * slots_.size() <= 4 * count_) {
+        grow();
+    }
+    put({mark_of(hash), child});
+    ++count_;
+}
+
+void hashed_children::put(const slot& taken) {
+    size_t place = home_of(taken.mark);
+    while (slots_[place].mark != 0) {
+        place = next(place);
+    }
+    slots_[place] = taken;
+}
+
+void hashed_children::grow() {
+    const std::vector<slot> before =
+        std::exchange(slots_, std::vector<slot>(std::max<size_t>(4, 2 * slots_.size())));
+    for (const slot& each : before) {
+        if (each.mark != 0) {
+            put(each);
+        }
+    }
+}
+
+void hashed_children::erase(size_t hash, const LDIF_Entry& child) {
+    const auto is_child = [&](const LDIF_Entry& own) { return &own == &child; };
+    size_t free = home_of(mark_of(hash));
+    while (slots_[free].mark != mark_of(hash) || !is_child(*slots_[free].child)) {
+        free = next(free);
+    }
+    // What was put behind it for want of room moves up.
+    for (size_t place = next(free); slots_[place].mark != 0; place = next(place)) {
+        const auto distance = [&](size_t from) { return (place - from) & (slots_.size() - 1); };
+        if (distance(home_of(slots_[place].mark)) >= distance(free)) {
+            slots_[free] = slots_[place];
+            free = place;
+        }
+    }
+    slots_[free].mark = 0;
+    --count_;
+}
+
+void child_index::insert(position child, const dn_path& path) {
+    const size_t hash = for_each_ancestor(
+        *child, path, [&](size_t ancestor) { by_ancestor_.emplace(ancestor, child); });
+    by_dn_.insert(hash, child);
 }
 
 void child_index::erase(position child) {
-    const auto entry = entry_of(*child);
-    const uint64_t order = entry->second.order;
-    by_dn_.erase(entry);
-    for_each_ancestor(*child, [&](size_t hash) { by_ancestor_.erase({hash, order}); });
+    const dn_path path(child->named_dn());
+    const size_t hash = for_each_ancestor(*child, path, [&](size_t ancestor) {
+        const auto [first, last] = by_ancestor_.equal_range(ancestor);
+        by_ancestor_.erase(
+            std::find_if(first, last, [&](const auto& entry) { return entry.second == child; }));
+    });
+    by_dn_.erase(hash, *child);
 }
 
 child_index::position child_index::position_of(const LDIF_Entry& child) const {
-    return entry_of(child)->second.child;
+    const auto is_child = [&](const LDIF_Entry& own) { return &own == &child; };
+    return *by_dn_.find(hash_of(child, dn_path(child.named_dn())), is_child);
 }
 
-child_index::dn_map::const_iterator child_index::entry_of(const LDIF_Entry& child) const {
-    const auto [first, last] = by_dn_.equal_range(hash_of(child));
-    return std::find_if(first, last,
-                        [&](const auto& entry) { return &*entry.second.child == &child; });
-}
-
-LDIF_Entry* child_index::equal_or_ancestor(const LDIF_DN& dn, size_t from) const {
+LDIF_Entry* child_index::equal_or_ancestor(const dn_path& dn, size_t from) const {
     size_t hash = 0;
-    for (size_t to = from + 1; to <= dn.rdns().size(); ++to) {
-        hash = dn.rdns()[to - 1].hash(hash);
-        const auto [first, last] = by_dn_.equal_range(hash);
-        for (auto entry = first; entry != last; ++entry) {
-            const position child = entry->second.child;
-            if (child->relative_size() == to - from && begins_with(*child, dn, from, to)) {
-                return &*child;
-            }
+    for (size_t to = from + 1; to <= dn.size(); ++to) {
+        hash = dn.hash(to - 1, hash);
+        const auto is_wanted = [&](const LDIF_Entry& child) {
+            return dn.is_relative_dn(from, to, child);
+        };
+        if (const position* found = by_dn_.find(hash, is_wanted)) {
+            return &**found;
         }
     }
     return nullptr;
 }
 
-std::vector<child_index::position> child_index::descendants(const LDIF_Entry& sibling) const {
+std::vector<child_index::position> child_index::descendants(const LDIF_Entry& sibling,
+                                                            const dn_path& path) const {
     std::vector<position> found;
     if (by_ancestor_.empty()) {
         return found;
     }
-    const size_t hash = hash_of(sibling);
-    for (auto entry = by_ancestor_.lower_bound({hash, 0});
-         entry != by_ancestor_.end() && entry->first.first == hash; ++entry) {
-        if (begins_with(*entry->second, sibling.dn(), sibling.depth(),
-                        sibling.dn().rdns().size())) {
+    const auto [first, last] = by_ancestor_.equal_range(hash_of(sibling, path));
+    for (auto entry = first; entry != last; ++entry) {
+        const LDIF_Entry& child = *entry->second;
+        if (dn_path(child.named_dn())
+                .has_equal_part(child.depth(), path, sibling.depth(), sibling.relative_size())) {
             found.push_back(entry->second);
         }
     }

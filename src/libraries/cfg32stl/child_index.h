@@ -1,15 +1,41 @@
 #pragma once
 
 #include <cstddef>
-#include <cstdint>
 #include <map>
-#include <unordered_map>
-#include <utility>
 #include <vector>
 
 #include "LDIF_Entry.h"
 
 namespace cfg32 {
+
+/// Children by the hashes of their relative DNs, in one piece of memory: a hash table with linear
+/// probing.
+class hashed_children {
+  public:
+    using position = LDIF_Entry::list::iterator;
+
+    void insert(size_t hash, position child);
+    void erase(size_t hash, const LDIF_Entry& child);
+
+    /// The child of that hash for which is_wanted(child) is true; null for none.
+    template <class Predicate>
+    const position* find(size_t hash, Predicate is_wanted) const;
+
+  private:
+    struct slot {
+        size_t mark = 0;  // of a taken one the hash, with the lowest bit set
+        position child;
+    };
+
+    static size_t mark_of(size_t hash) { return hash | 1; }
+    size_t home_of(size_t mark) const { return (mark >> 1) & (slots_.size() - 1); }
+    size_t next(size_t place) const { return (place + 1) & (slots_.size() - 1); }
+    void put(const slot& taken);
+    void grow();
+
+    std::vector<slot> slots_;  // none, or a power of two of which some are free
+    size_t count_ = 0;
+};
 
 /// Finds an entry's children by relative DN, so that a wide tree costs no more than a narrow one.
 ///
@@ -21,35 +47,38 @@ class child_index {
   public:
     using position = LDIF_Entry::list::iterator;
 
-    /// Enters a child under its relative DN, as the last in order.
-    void insert(position child);
+    /// Enters a child under its relative DN, as the last in order. path is its DN.
+    void insert(position child, const dn_path& path);
     void erase(position child);
 
     /// Where a child that was entered stands.
     position position_of(const LDIF_Entry& child) const;
 
-    /// The child whose relative DN equals dn, or is an ancestor of it, when the first `from` RDNs
-    /// of dn are left out; null for none.
-    LDIF_Entry* equal_or_ancestor(const LDIF_DN& dn, size_t from) const;
+    /// The child whose relative DN equals the DN, or is an ancestor of it, when the first `from`
+    /// RDNs of it are left out; null for none.
+    LDIF_Entry* equal_or_ancestor(const dn_path& dn, size_t from) const;
 
-    /// The children that are descendants of an entry that is to be their sibling, in order.
-    std::vector<position> descendants(const LDIF_Entry& sibling) const;
+    /// The children that are descendants of an entry that is to be their sibling, in order. path is
+    /// its DN.
+    std::vector<position> descendants(const LDIF_Entry& sibling, const dn_path& path) const;
 
   private:
-    struct numbered_child {
-        position child;
-        uint64_t order;
-    };
-    using dn_map = std::unordered_multimap<size_t, numbered_child>;
-
-    dn_map::const_iterator entry_of(const LDIF_Entry& child) const;
-
-    // Of children below the same missing ancestor the order tells which came first.
-    using hash_and_order = std::pair<size_t, uint64_t>;
-
-    dn_map by_dn_;
-    std::map<hash_and_order, position> by_ancestor_;
-    uint64_t next_order_ = 0;
+    hashed_children by_dn_;
+    std::multimap<size_t, position> by_ancestor_;  // in order, of each ancestor
 };
+
+template <class Predicate>
+const hashed_children::position* hashed_children::find(size_t hash, Predicate is_wanted) const {
+    if (slots_.empty()) {
+        return nullptr;
+    }
+    const size_t mark = mark_of(hash);
+    for (size_t place = home_of(mark); slots_[place].mark != 0; place = next(place)) {
+        if (slots_[place].mark == mark && is_wanted(*slots_[place].child)) {
+            return &slots_[place].child;
+        }
+    }
+    return nullptr;
+}
 
 }  // namespace cfg32

@@ -20,7 +20,7 @@ namespace {
 using namespace std::chrono_literals;
 
 constexpr size_t read_ahead = 4096;
-constexpr size_t compared_at_once = 16384;
+constexpr size_t compared_at_once = 65536;
 
 bool write_all(int file, std::string_view text, size_t offset) {
     while (!text.empty()) {
@@ -117,9 +117,12 @@ bool wait_for_another_time(int file, const timespec& before, struct stat& status
 
 bool read_all(int file, size_t expected, std::string& text) {
     size_t length = 0;
+    // One more than expected, so that the last read finds the end without growing the text.
+    text.resize(expected + 1);
     for (;;) {
-        // One more than expected, so that the last read finds the end without growing the text.
-        text.resize(length < expected ? expected + 1 : length + read_ahead + length / 2);
+        if (length == text.size()) {
+            text.resize(length + read_ahead + length / 2);
+        }
         const ssize_t count = retry_interrupted([&] {
             return pread(file, text.data() + length, text.size() - length,
                          static_cast<off_t>(length));

@@ -6,6 +6,9 @@
 #include <cstdlib>
 #include <cstring>
 #include <new>
+#include <string>
+#include <string_view>
+#include <vector>
 
 #include "LDIF_File.h"
 #include "LDIF_Search.h"
@@ -29,6 +32,26 @@ constexpr const char* decoded_names[] = {
     "oru-slapdProxyPw",
 };
 
+/// The names of the wanted attributes; none means all.
+class wanted_attributes {
+  public:
+    explicit wanted_attributes(char** names) {
+        for (; names && *names; ++names) {
+            names_.emplace_back(*names);
+        }
+    }
+
+    bool are_all() const { return names_.empty(); }
+    bool have(const LDIF_Attribute& attribute) const {
+        const attribute_name& name = attribute.values().typed_name();
+        return std::ranges::any_of(
+            names_, [&](const attribute_name& own) { return own.compare(name) == 0; });
+    }
+
+  private:
+    std::vector<attribute_name> names_;
+};
+
 /// Appends nodes to a chain.
 class message_chain {
   public:
@@ -49,11 +72,15 @@ class message_chain {
     CfgMessage** end_;
 };
 
-char* copy_of(const std::string& text) {
-    char* copy = strdup(text.c_str());
+/// strdup: up to the first NUL.
+char* copy_of(std::string_view text) {
+    const size_t length = strnlen(text.data(), text.size());
+    auto* copy = static_cast<char*>(malloc(length + 1));
     if (!copy) {
         throw std::bad_alloc();
     }
+    memcpy(copy, text.data(), length);
+    copy[length] = '\0';
     return copy;
 }
 
@@ -66,18 +93,18 @@ bool is_password(const LDIF_Attribute& attribute) {
 /// True for a password that is returned in clear: the file was opened by a bind, and the
 /// attribute is one of the few and was asked for by name.
 bool is_decoded(const LDIF_Attribute& attribute, const LDIF_File& file,
-                const LDIF_AttrFilter& wanted) {
+                const wanted_attributes& wanted) {
     const auto begins_name = [&](const char* prefix) {
         return strncasecmp(attribute.name().c_str(), prefix, strlen(prefix)) == 0;
     };
     return !attribute.values().empty() && file.getAuthentication() != 0 && is_password(attribute) &&
-           wanted.contains(attribute.name()) &&
+           wanted.have(attribute) &&
            std::any_of(std::begin(decoded_names), std::end(decoded_names), begins_name);
 }
 
 /// The password in clear, allocated by the password routine with malloc.
-char* decoded(const LDIF_Value& value, aes_key_data* key, const char* dn, const char* name) {
-    const std::string stored = value.str();
+char* decoded(const std::string& stored, const LDIF_Attribute& attribute, aes_key_data* key,
+              const char* dn, const char* name) {
     const std::string input = stored.empty() ? stored : decoder_input(stored);
     char* clear = nullptr;
     if (input.size() >= decode_buffer_size ||
@@ -86,7 +113,7 @@ char* decoded(const LDIF_Value& value, aes_key_data* key, const char* dn, const 
             e.value = stored;
             e.entryDn = dn;
             e.attribute = name;
-            e.attrType = value.attrType;
+            e.attrType = attribute.values().type();
         });
     }
     return clear;
@@ -95,17 +122,15 @@ char* decoded(const LDIF_Value& value, aes_key_data* key, const char* dn, const 
 /// Builds the nodes of a result.
 class result_builder {
   public:
-    result_builder(const LDIF_File& file, const LDIF_AttrFilter& wanted, aes_key_data* key)
+    result_builder(const LDIF_File& file, const wanted_attributes& wanted, aes_key_data* key)
         : file_(file), wanted_(wanted), key_(key) {}
 
     void add(const std::vector<const LDIF_Entry*>& found, CfgMessage** first) const {
         message_chain entries(first);
-        std::string dn;
         for (const LDIF_Entry* entry : found) {
             CfgMessage& node = entries.append(entry_message);
-            dn.clear();
-            entry->dn().append_to(dn);
-            node.text = copy_of(dn);
+            const kept_dn& dn = entry->named_dn();
+            node.text = dn.is_simple() ? copy_of(dn.text()) : copy_of(dn.parsed().str());
             add_attributes(*entry, node);
         }
     }
@@ -114,7 +139,7 @@ class result_builder {
     void add_attributes(const LDIF_Entry& entry, CfgMessage& parent) const {
         message_chain attributes(&parent.child);
         for (const LDIF_Attribute& attribute : entry.attributes()) {
-            if (!wanted_.empty() && !wanted_.contains(attribute.name())) {
+            if (!wanted_.are_all() && !wanted_.have(attribute)) {
                 continue;
             }
             CfgMessage& node = attributes.append(attribute_message);
@@ -126,15 +151,16 @@ class result_builder {
     void add_values(const LDIF_Attribute& attribute, const char* dn, CfgMessage& parent) const {
         const bool is_clear = is_decoded(attribute, file_, wanted_);
         message_chain values(&parent.child);
-        for (const LDIF_Value& value : attribute.values()) {
+        for (const kept_text& text : attribute.values().texts()) {
             CfgMessage& node = values.append(value_message);
-            node.text = is_clear ? decoded(value, key_, dn, parent.text) : copy_of(value.str());
+            node.text =
+                is_clear ? decoded(text.str(), attribute, key_, dn, parent.text) : copy_of(text);
             node.is_secret = is_clear;
         }
     }
 
     const LDIF_File& file_;
-    const LDIF_AttrFilter& wanted_;
+    const wanted_attributes& wanted_;
     aes_key_data* key_;
 };
 
@@ -147,14 +173,6 @@ LDIF_Search_Results::Scope scope_of(int number) {
         default:
             return LDIF_Search_Results::Base;
     }
-}
-
-LDIF_AttrFilter wanted_attributes(char** names) {
-    LDIF_AttrFilter wanted;
-    for (; names && *names; ++names) {
-        wanted.insert(cisString(*names));
-    }
-    return wanted;
 }
 
 /// Builds the result, or releases what was built of it.
@@ -189,7 +207,7 @@ int cfg_search_s(CfgHandle* handle, const char* base, int scope, const char* fil
         file.refresh();
         const LDIF_DN dn{cisString(base)};
         const LDIF_Filter wanted_entries{std::string(filter ? filter : "")};
-        const LDIF_AttrFilter wanted = wanted_attributes(attrs);
+        const wanted_attributes wanted(attrs);
         const std::vector<const LDIF_Entry*> found =
             file.matches(dn, scope_of(scope), wanted_entries);
         return build(result_builder(file, wanted, handle->keyData), found, result);

@@ -31,19 +31,19 @@ void checked_entries::add(entry_section& section, LDIF_Attribute&& attribute, in
                           bool is_told) {
     const auto known = section.attributes.find(attribute.name());
     if (known == section.attributes.end()) {
-        value_lines_[&*attribute.values().begin()] = line;
+        value_lines_[attribute.values().texts().front().view().data()] = line;
         section.attributes += std::move(attribute);
         return;
     }
     const size_t before = known->values().size();
     *known += attribute;
     if (known->values().size() > before) {
-        value_lines_[&*std::prev(known->values().end())] = line;
+        value_lines_[known->values().texts().back().view().data()] = line;
         if (is_told) {
             report_second_value(*known, line, section.written);
         }
     } else if (is_told) {
-        const LDIF_Value& first = *std::as_const(known->values()).find(*attribute.values().begin());
+        const LDIF_Value first = *known->values().find(*attribute.values().begin());
         problem& found = found_.add(kind::duplicate_value, file_.value_place(line),
                                     "value stands twice, the first one" + on_line(line_of(first)) +
                                         "; the next rewrite drops this one");
@@ -70,7 +70,7 @@ void checked_entries::report_second_value(const LDIF_Attribute& attribute, int l
 }
 
 int checked_entries::line_of(const LDIF_Value& value) const {
-    const auto known = value_lines_.find(&value);
+    const auto known = value_lines_.find(value.text.view().data());
     return known == value_lines_.end() ? 0 : known->second;
 }
 
@@ -83,7 +83,7 @@ checked_entries::checked_entry* checked_entries::find(const LDIF_DN& dn) {
 
 void checked_entries::add_header(LDIF_Attribute&& attribute, int line) {
     entry_section header;
-    value_lines_[&*attribute.values().begin()] = line;
+    value_lines_[attribute.values().texts().front().view().data()] = line;
     header.attributes += std::move(attribute);
     close(std::move(header));
 }
@@ -154,7 +154,7 @@ void checked_entries::merge(LDIF_Attribute& known, const LDIF_Attribute& again,
         const size_t before = known.values().size();
         known.values() += value;
         if (known.values().size() > before) {
-            value_lines_[&*std::prev(known.values().end())] = line_of(value);
+            value_lines_[known.values().texts().back().view().data()] = line_of(value);
             if (line_of(value) > 0) {
                 report_second_value(known, line_of(value), section.written);
             }
@@ -255,8 +255,9 @@ std::string checked_entries::why_unwritable(const LDIF_Attribute& attribute) con
         return fmt::format("the name \"{}\" begins with a blank and has several values",
                            shown_line(name));
     }
+    const bool is_dn = attribute.values().type()->fromStr == dnFromStr;
     for (const LDIF_Value& value : attribute.values()) {
-        if (value.dn && breaks_line(value.text)) {
+        if (is_dn && breaks_line(value.text)) {
             return fmt::format("a value of {}{} has a line break or NUL", name,
                                on_line(line_of(value)));
         }

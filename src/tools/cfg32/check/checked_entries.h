@@ -71,8 +71,8 @@ class checked_entries {
     const file_text& file_;
     std::deque<checked_entry> entries_;
     std::unordered_multimap<size_t, checked_entry*> by_dn_;
-    std::unordered_map<const LDIF_Value*, int> value_lines_;
-    bool is_rewritten_ = false;  // by a load that keeps lines aside
+    std::unordered_map<const char*, int> value_lines_;  // by where its text stands
+    bool is_rewritten_ = false;                         // by a load that keeps lines aside
 };
 
 }  // namespace cfg32::tool

@@ -95,7 +95,7 @@ bool is_unprintable(const LDIF_DN& dn) {
     }
 }
 
-bool breaks_line(const std::string& text) {
+bool breaks_line(std::string_view text) {
     return text.find_first_of(std::string("\n\r\0", 3)) != std::string::npos;
 }
 

@@ -23,6 +23,6 @@ std::string change_of(const LDIF_DN& dn, const std::string& written);
 /// True when the DN can't stand in a line of the file.
 bool is_unprintable(const LDIF_DN& dn);
 /// The same of a text.
-bool breaks_line(const std::string& text);
+bool breaks_line(std::string_view text);
 
 }  // namespace cfg32::tool

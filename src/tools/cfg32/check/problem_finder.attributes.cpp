@@ -196,7 +196,8 @@ void problem_finder::end_run() {
 
 /// What can be said of a value that its syntax accepts.
 void problem_finder::check_value(const LDIF_Value& value) {
-    const std::string change = value.dn ? change_of(*value.dn, line_.value) : "";
+    const bool is_dn = value.attrType->fromStr == dnFromStr;
+    const std::string change = is_dn ? change_of(LDIF_DN(cisString(line_.value)), line_.value) : "";
     if (!change.empty()) {
         add(kind::dn_changes, value_place(), change);
     }
