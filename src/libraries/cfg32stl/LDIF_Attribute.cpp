@@ -184,6 +184,10 @@ LDIF_Attributes::const_iterator LDIF_Attributes::find(const attribute_name& name
     return place != end() && order(*place) == 0 ? place : end();
 }
 
+void LDIF_Attributes::fit() {
+    attributes_ = list(std::make_move_iterator(begin()), std::make_move_iterator(end()));
+}
+
 std::string LDIF_Attributes::str() const {
     std::string text;
     append_to(text);

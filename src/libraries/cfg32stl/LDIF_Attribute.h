@@ -79,9 +79,9 @@ class LDIF_Attributes {
     const_iterator end() const { return attributes_.end(); }
     bool empty() const { return attributes_.empty(); }
     size_t size() const { return attributes_.size(); }
-    /// Room for the attributes that an entry has, and no more.
     void reserve(size_t count) { attributes_.reserve(count); }
-    void shrink_to_fit() { attributes_.shrink_to_fit(); }
+    /// Gives back the memory of attributes that are not there.
+    void fit();
 
     std::string str() const;
     void append_to(std::string& out) const;

@@ -38,7 +38,7 @@ LDIF_Entry::LDIF_Entry(const LDIF_Line& line, const LDIF_Comment& comment)
 
 LDIF_Entry::LDIF_Entry(const LDIF_Entry& other)
     : name_(other.name_),
-      attributes_(other.attributes_),
+      attributes_(other.attributes()),
       children_(other.children_),
       depth_(other.depth_),
       dn_(other.dn_),
@@ -68,12 +68,12 @@ LDIF_Entry& LDIF_Entry::operator+=(const LDIF_Comment& comment) {
 }
 
 LDIF_Entry& LDIF_Entry::operator+=(const LDIF_Attribute& attribute) {
-    attributes_ += attribute;
+    attributes() += attribute;
     return *this;
 }
 
 LDIF_Entry& LDIF_Entry::operator+=(LDIF_Attribute&& attribute) {
-    attributes_ += std::move(attribute);
+    attributes() += std::move(attribute);
     return *this;
 }
 
@@ -138,7 +138,7 @@ LDIF_Entry& LDIF_Entry::hang(list& node, const dn_path& dn, size_t depth) {
 /// Merges an entry of the same DN into this one.
 LDIF_Entry& LDIF_Entry::absorb(LDIF_Entry& again) {
     comment_ += again.comment_;
-    attributes_ += again.attributes_;
+    attributes() += again.attributes();
     again.index_.reset();
     while (!again.children_.empty()) {
         list node;
@@ -191,7 +191,11 @@ void LDIF_Entry::append_to(std::string& out) const {
         dn_.append_to(out.append(name().text()).append(": "));
         out += '\n';
     }
-    attributes_.append_to(out);
+    if (has_unread_lines()) {
+        out += unread_.text();
+    } else {
+        attributes().append_to(out);
+    }
     if (ends_with_blank_line()) {
         out += '\n';
     }
@@ -199,7 +203,10 @@ void LDIF_Entry::append_to(std::string& out) const {
 
 size_t LDIF_Entry::line_count() const {
     size_t count = comment_.line_count() + (is_root() ? 0 : 1) + (ends_with_blank_line() ? 1 : 0);
-    for (const LDIF_Attribute& attribute : attributes_) {
+    if (has_unread_lines()) {
+        return count + static_cast<size_t>(std::ranges::count(unread_.text(), '\n'));
+    }
+    for (const LDIF_Attribute& attribute : attributes()) {
         count += attribute.comment().line_count() + attribute.values().size();
     }
     return count;
@@ -209,6 +216,12 @@ size_t LDIF_Entry::line_count() const {
 bool LDIF_Entry::ends_with_blank_line() const {
     return !is_root() ||
            (!children_.empty() && !children_.front().comment_.begins_with_blank_line());
+}
+
+LDIF_Attributes& LDIF_Entry::read_unread() const {
+    attributes_ = unread_.read();
+    unread_ = {};
+    return attributes_;
 }
 
 LDIF_Entry& LDIF_Entry::clear() { return *this = LDIF_Entry(); }

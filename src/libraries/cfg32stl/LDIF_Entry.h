@@ -13,6 +13,7 @@
 #include "LDIF_Line.h"
 #include "cisString.h"
 #include "dn_path.h"
+#include "unread_attributes.h"
 
 namespace cfg32 {
 class child_index;
@@ -86,8 +87,12 @@ class LDIF_Entry {
     /// How many RDNs the relative DN has.
     size_t relative_size() const { return dn_.size() - depth_; }
     const LDIF_Comment& comment() const { return comment_; }
-    const LDIF_Attributes& attributes() const { return attributes_; }
-    LDIF_Attributes& attributes() { return attributes_; }
+    const LDIF_Attributes& attributes() const { return read_attributes(); }
+    LDIF_Attributes& attributes() { return read_attributes(); }
+    /// Makes these the attributes, instead of what there was.
+    void leave_unread(const cfg32::unread_attributes& lines) { unread_ = lines; }
+    /// Lines that are printed as they stand; none once somebody has looked at the attributes.
+    bool has_unread_lines() const { return unread_.is_canonical(); }
     const list& children() const { return children_; }
 
     /// A copy of what names the entry, without comment, attributes and children.
@@ -101,11 +106,16 @@ class LDIF_Entry {
     void append(list& node, const cfg32::dn_path& dn);
     void index_children();
     bool ends_with_blank_line() const;
+    LDIF_Attributes& read_attributes() const {
+        return unread_.empty() ? attributes_ : read_unread();
+    }
+    LDIF_Attributes& read_unread() const;
 
     // What a search looks at stands together.
     cfg32::attribute_name name_{""};
-    LDIF_Attributes attributes_;
+    mutable LDIF_Attributes attributes_;
     list children_;
+    mutable cfg32::unread_attributes unread_;  // then there are no others
     size_t depth_ = 0;
     cfg32::kept_dn dn_;
     LDIF_Comment comment_;

@@ -26,14 +26,11 @@ constexpr failure unknown_line{80, 1000, "Unknown LDIF_Line::Type!"};
 
 constexpr int object_class_violation = 65;
 
-/// Room that most entries do with while they are read.
-constexpr size_t usual_attributes = 16;
-
 /// One pass over the text of a file, which fills a tree. The tree stands in the text.
 class loader {
   public:
     loader(LDIF_Entry& root, LDIF_Comment& pending, aes_key_data* key)
-        : root_(root), pending_(pending), key_(key) {}
+        : root_(root), pending_(pending), key_(key), lines_(key) {}
 
     void run(std::string_view text);
 
@@ -48,6 +45,7 @@ class loader {
     void blank_line();
     void dn_line();
     void attribute_line();
+    bool leave_unread();
     void add_attribute();
     void add_root_attribute(LDIF_Attribute&& attribute);
     void require_root_attribute(const char* name, const char* value, bool& seen);
@@ -58,7 +56,9 @@ class loader {
     aes_key_data* key_;
     logical_line line_;
     int line_number_ = 0;
+    const char* end_of_line_ = nullptr;
     LDIF_Entry::list open_;  // the entry that attribute lines belong to, if there is one
+    unread_lines lines_;     // of that entry
     bool version_seen_ = false;
     bool charset_seen_ = false;
     bool done_ = false;
@@ -84,6 +84,7 @@ void loader::read_line(line_source& source) {
     const int last = line_number_;
     ++line_number_;  // what a failing read reports
     line_number_ = line_.next(source, last);
+    end_of_line_ = source.rest().data();
 }
 
 void loader::dispatch() {
@@ -94,6 +95,7 @@ void loader::dispatch() {
             return blank_line();
         case LDIF_Line::comment:
             pending_.append(line_.with_newline());
+            lines_.take_comment(line_);
             return;
         case LDIF_Line::dn:
             return dn_line();
@@ -125,7 +127,7 @@ void loader::dn_line() {
     reuse_line_ = false;
     open_.emplace_back(attribute_name(line_.attribute), kept_dn(line_.value), std::move(pending_));
     pending_.clear();
-    open_.front().attributes().reserve(usual_attributes);
+    lines_.start(end_of_line_);
 }
 
 /// Adds the attribute to the root of a file without it; the comment before the first entry moves
@@ -144,7 +146,9 @@ void loader::require_root_attribute(const char* name, const char* value, bool& s
 /// that attribute, so that a bad line above the first entry ends the load.
 void loader::attribute_line() {
     try {
-        add_attribute();
+        if (!leave_unread()) {
+            add_attribute();
+        }
     } catch (const LDIF_Exception& e) {
         // Exhausted memory says nothing about the line.
         if (e.ldapErr == object_class_violation || e.sysErrno == ENOMEM) {
@@ -154,6 +158,17 @@ void loader::attribute_line() {
         found_invalid_lines_ = true;
         reuse_line_ = true;
     }
+}
+
+/// True when the line was checked, and need not be read before somebody asks for it.
+bool loader::leave_unread() {
+    if (open_.empty() || !lines_.take(line_, end_of_line_)) {
+        return false;
+    }
+    open_.front().leave_unread(lines_.taken());
+    pending_.clear();
+    reuse_line_ = false;
+    return true;
 }
 
 void loader::add_attribute() {
@@ -189,7 +204,6 @@ void loader::add_root_attribute(LDIF_Attribute&& attribute) {
 
 void loader::close_entry() {
     if (!open_.empty()) {
-        open_.front().attributes().shrink_to_fit();
         root_.place(open_);
         open_.clear();
     }

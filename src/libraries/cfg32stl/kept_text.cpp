@@ -13,9 +13,7 @@ kept_text::kept_text(const kept_text& other) {
 void kept_text::copy(std::string_view text) {
     char* own = new char[text.size()];
     text.copy(own, text.size());
-    data_ = own;
-    set_size(text.size());
-    is_own_ = true;
+    set(own, text.size(), own_text);
 }
 
 void kept_text::append(const given_text& text) {
@@ -23,22 +21,21 @@ void kept_text::append(const given_text& text) {
         *this = kept_text(text);
         return;
     }
-    const size_t size = size_ + text.size();
-    if (!is_own_ && text.lasts() && data_ + size_ == text.view().data()) {
-        set_size(size);
+    const size_t total = size() + text.size();
+    if (!is_own() && text.lasts() && data_ + size() == text.view().data()) {
+        set(data_, total, 0);
         return;
     }
-    if (!has_room_ || size > std::bit_ceil(size_t{size_})) {
-        char* own = new char[std::bit_ceil(size)];
-        view().copy(own, size_);
-        text.view().copy(own + size_, text.size());
-        release();
-        data_ = own;
-        is_own_ = has_room_ = true;
-    } else {
-        text.view().copy(const_cast<char*>(data_) + size_, text.size());
+    const bool has_room = (size_and_flags_ & room) != 0 && total <= std::bit_ceil(size());
+    char* own = has_room ? const_cast<char*>(data_) : new char[std::bit_ceil(total)];
+    if (!has_room) {
+        view().copy(own, size());
     }
-    set_size(size);
+    text.view().copy(own + size(), text.size());  // before the old text goes, which it may be of
+    if (!has_room) {
+        release();
+    }
+    set(own, total, own_text | room);
 }
 
 }  // namespace cfg32

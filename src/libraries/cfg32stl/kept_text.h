@@ -7,6 +7,7 @@
 #include <ostream>
 #include <string>
 #include <string_view>
+#include <utility>
 
 namespace cfg32 {
 
@@ -54,31 +55,36 @@ class kept_text {
     ~kept_text() { release(); }
 
     bool has_value() const { return data_; }
-    std::string_view view() const { return {data_, size_}; }
+    std::string_view view() const { return {data_, size()}; }
     /// For somebody who takes it over, and what it stands in.
-    given_text given() const { return is_own_ ? given_text(view()) : given_text::lasting(view()); }
+    given_text given() const { return is_own() ? given_text(view()) : given_text::lasting(view()); }
     operator std::string_view() const { return view(); }
     std::string str() const { return std::string(view()); }
-    bool empty() const { return size_ == 0; }
-    size_t size() const { return size_; }
+    bool empty() const { return size() == 0; }
+    size_t size() const { return size_and_flags_ >> flag_bits; }
 
     /// What stands behind the kept text in memory, and lasts like it, is not copied.
     void append(const given_text& text);
     /// Drops so many characters at the end.
-    void remove_suffix(size_t count) { set_size(size() - count); }
+    void remove_suffix(size_t count) { size_and_flags_ -= count << flag_bits; }
 
   private:
-    void set_size(size_t size) { size_ = size & size_mask; }
+    // In the lowest bits of the size.
+    static constexpr size_t own_text = 1;
+    static constexpr size_t room = 2;  // of its own, for as much as the next power of two
+    static constexpr int flag_bits = 2;
+
+    bool is_own() const { return (size_and_flags_ & own_text) != 0; }
+    void set(const char* data, size_t size, size_t flags) {
+        data_ = data;
+        size_and_flags_ = size << flag_bits | flags;
+    }
     void copy(std::string_view text);
     void take(kept_text& other) noexcept;
     void release() noexcept;
 
-    static constexpr size_t size_mask = ~size_t{} >> 2;
-
     const char* data_ = nullptr;
-    size_t size_ : 62 = 0;
-    size_t is_own_ : 1 = false;
-    size_t has_room_ : 1 = false;  // of its own, for as much as the next power of two
+    size_t size_and_flags_ = 0;
 };
 static_assert(sizeof(kept_text) == 16);
 
@@ -92,8 +98,7 @@ inline std::ostream& operator<<(std::ostream& out, const kept_text& text) {
 
 inline kept_text::kept_text(const given_text& text) {
     if (text.lasts()) {
-        data_ = text.view().data();
-        set_size(text.size());
+        set(text.view().data(), text.size(), 0);
     } else {
         copy(text);
     }
@@ -108,17 +113,12 @@ inline kept_text& kept_text::operator=(kept_text&& other) noexcept {
 }
 
 inline void kept_text::take(kept_text& other) noexcept {
-    data_ = other.data_;
-    size_ = other.size_;
-    is_own_ = other.is_own_;
-    has_room_ = other.has_room_;
-    other.data_ = nullptr;
-    other.size_ = 0;
-    other.is_own_ = other.has_room_ = false;
+    data_ = std::exchange(other.data_, nullptr);
+    size_and_flags_ = std::exchange(other.size_and_flags_, 0);
 }
 
 inline void kept_text::release() noexcept {
-    if (is_own_) {
+    if (is_own()) {
         delete[] data_;
     }
 }

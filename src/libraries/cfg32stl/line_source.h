@@ -31,6 +31,9 @@ class line_source {
     /// False when it is known at once that the next line is valid and no continuation line.
     bool may_be_continued() const;
 
+    /// What is not taken yet.
+    std::string_view rest() const { return text_.view().substr(position_); }
+
     size_t position() const { return position_; }
     /// Goes back to a position of before; clears the end, but not a failure to read anything.
     void go_back(size_t position);

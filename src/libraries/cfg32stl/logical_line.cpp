@@ -117,6 +117,7 @@ int logical_line::read(Source& in, int last) {
     }
     const physical_line first = take(in, line_memory_);
     const std::string_view text = first.text;
+    is_in_ascii_ = first.is_plain;
     if (first.is_blank()) {
         type = LDIF_Line::blankLine;
         keep_line({}, text.empty() && first.lasts && !in.at_end() ? text.data() : "\n");
@@ -159,7 +160,7 @@ int logical_line::read_value(Source& in, int last, const Line& first, std::strin
     }
     if (in.may_be_continued()) {
         value_memory_ = begin;
-        return read_continuation(in, last, first.is_plain);
+        return read_continuation(in, last);
     }
     value = stored(first, first.without_space_behind(begin), value_memory_);
     return last;
@@ -167,21 +168,32 @@ int logical_line::read_value(Source& in, int last, const Line& first, std::strin
 
 /// Adds to the begin of the value what continuation lines have of it.
 template <class Source>
-[[gnu::noinline]] int logical_line::read_continuation(Source& in, int last, bool is_plain) {
+[[gnu::noinline]] int logical_line::read_continuation(Source& in, int last) {
     while (!in.at_end()) {
         const auto before = in.position();
         const physical_line next = take(in, line_memory_);
         if (!next.is_continuation()) {
             in.go_back(before);
             const std::string_view text = value_memory_;
-            value = is_plain ? without_trailing_ascii_space(text) : without_trailing_space(text);
+            value =
+                is_in_ascii_ ? without_trailing_ascii_space(text) : without_trailing_space(text);
             return last;
         }
         value_memory_ += next.continuation();
-        is_plain = is_plain && next.is_plain;
+        is_in_ascii_ = is_in_ascii_ && next.is_plain;
         ++last;
     }
     return last;
+}
+
+bool logical_line::is_canonical() const {
+    if (!attribute.lasts() || !value.lasts() || value.empty()) {
+        return false;
+    }
+    const char* const separator = attribute.view().data() + attribute.size();
+    const char* const begin = value.view().data();
+    return begin == separator + 2 && separator[0] == ':' && separator[1] == ' ' &&
+           begin[value.size()] == '\n';
 }
 
 void logical_line::change_to_invalid_attribute() {

@@ -24,6 +24,11 @@ class logical_line {
     logical_line(const logical_line&) = delete;
     logical_line& operator=(const logical_line&) = delete;
 
+    /// True when all of it is ASCII, and reads the same in every locale.
+    bool is_in_ascii() const { return is_in_ascii_; }
+    /// True for an attribute line that stands in the source as it is written.
+    bool is_canonical() const;
+
     /// Of a comment or blank line: its file form, with the newline.
     const given_text& with_newline() const { return with_newline_; }
 
@@ -40,10 +45,11 @@ class logical_line {
     template <class Source, class Line>
     int read_value(Source& in, int last, const Line& first, std::string_view begin);
     template <class Source>
-    int read_continuation(Source& in, int last, bool is_plain);
+    int read_continuation(Source& in, int last);
     void keep_line(std::string_view line, const char* lasting);
 
     given_text with_newline_ = "";
+    bool is_in_ascii_ = true;
     std::string line_memory_;
     std::string attribute_memory_;
     std::string value_memory_;

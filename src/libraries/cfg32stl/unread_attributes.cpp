@@ -1,0 +1,92 @@
+#include "unread_attributes.h"
+
+#include <algorithm>
+#include <limits>
+#include <utility>
+
+#include "LDIF_Comment.h"
+#include "LDIF_Exception.h"
+#include "LDIF_Line.h"
+#include "LDIF_Value.h"
+#include "line_source.h"
+#include "logical_line.h"
+
+namespace cfg32 {
+
+LDIF_Attributes unread_attributes::read() const {
+    LDIF_Attributes attributes;
+    attributes.reserve(usual_attributes);
+    LDIF_Comment pending;
+    line_source source(given_text::lasting(text()));
+    logical_line line;
+    for (int last = line.next(source, 0); line.type != LDIF_Line::endOfFile;
+         last = line.next(source, last)) {
+        if (line.type == LDIF_Line::comment) {
+            pending.append(line.with_newline());
+            continue;
+        }
+        attributes +=
+            LDIF_Attribute(key_, attribute_name(line.attribute), line.value, std::move(pending));
+        pending.clear();
+    }
+    attributes.fit();
+    return attributes;
+}
+
+void unread_lines::start(const char* begin) {
+    begin_ = begin;
+    size_ = 0;
+    is_open_ = is_sorted_ = is_canonical_ = true;
+    has_password_ = false;
+    last_ = attribute_name("");
+    last_values_.clear();
+}
+
+void unread_lines::take_comment(const logical_line& line) {
+    // One that is converted depends on the locale of the moment.
+    is_open_ = is_open_ && line.with_newline().lasts();
+}
+
+bool unread_lines::take(const logical_line& line, const char* end) {
+    const auto size = static_cast<size_t>(end - begin_);
+    is_open_ = is_open_ && line.has_separator && line.is_in_ascii() && end[-1] == '\n' &&
+               size <= std::numeric_limits<uint32_t>::max();
+    if (!is_open_) {
+        return false;
+    }
+    attribute_name name(line.attribute);
+    is_open_ = false;  // unless nothing is thrown
+    const LDIF_Value value(name.type(), line.value, key_);
+    is_canonical_ = is_canonical_ && line.is_canonical();
+    is_open_ = value.text == line.value.view() && follow(name, value.text);
+    last_ = std::move(name);
+    size_ = is_open_ ? size : size_;
+    return is_open_;
+}
+
+/// Takes the next line's name and value. False for one that must be read at once.
+bool unread_lines::follow(const attribute_name& name, std::string_view value) {
+    const int order = last_.compare(name);
+    is_sorted_ = is_sorted_ && order <= 0;
+    is_canonical_ = is_canonical_ && is_sorted_;
+    has_password_ = has_password_ || name.type()->match == pwCompare;
+    if (order != 0) {
+        last_values_.clear();
+    }
+    // Passwords that are compared may turn out not to be decodable.
+    if (has_password_ && (!is_sorted_ || (order == 0 && name.type()->match == pwCompare))) {
+        return false;
+    }
+    if (is_canonical_) {
+        const LDIF_Value wanted = LDIF_Value::stored(name.type(), value, key_);
+        const auto is_equal = [&](std::string_view own) {
+            return LDIF_Value::stored(name.type(), own, key_).compare(wanted) == 0;
+        };
+        is_canonical_ = std::ranges::none_of(last_values_, is_equal) &&
+                        (order != 0 || last_.get().text() == name.get().text());
+        last_values_.push_back(value);
+    }
+    return true;
+}
+
+}  // namespace cfg32
