@@ -162,7 +162,7 @@ class name_table {
 
     static bool is_named(const named_type& row, std::string_view name) {
         const std::string& own = row.name.text();
-        return own.size() == name.size() && (own == name || compare_without_case(own, name) == 0);
+        return own.size() == name.size() && (own == name || equal_without_case(own, name));
     }
 
     /// Of eight characters in the middle, eight at the end, and the length: the names begin mostly

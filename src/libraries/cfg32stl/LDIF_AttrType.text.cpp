@@ -28,10 +28,6 @@ length_bounds bounds_of(const _AttrType& type) {
     return {lower, type.maximum >= lower ? type.maximum : 0};
 }
 
-bool equal_words(std::string_view left, std::string_view right) {
-    return compare_without_case(left, right) == 0;
-}
-
 int compare_texts_without_case(std::string_view left, std::string_view right) {
     if (left.empty() || right.empty()) {
         return static_cast<int>(right.empty()) - static_cast<int>(left.empty());
@@ -89,7 +85,7 @@ const match_support ces_match{
 
 const match_support cis_match{
     [](std::string_view left, std::string_view right) {
-        return compare_texts_without_case(left, right) == 0;
+        return left.empty() == right.empty() && equal_without_case(left, right);
     },
     [](const LDIF_Value& value) { return hash_without_case(value.shown()); }, nullptr};
 
@@ -151,12 +147,12 @@ void enumFromStr(LDIF_Value& value, const given_text& text) {
     cisFromStr(value, text);
     const std::string_view word = value.text;
     // A configuration that names the masking scheme can be read when no key is at hand.
-    if (!value.key && type->name && equal_words(type->name, "oru-slapdPwEncryption") &&
-        equal_words(word, "imask")) {
+    if (!value.key && type->name && equal_without_case(type->name, "oru-slapdPwEncryption") &&
+        equal_without_case(word, "imask")) {
         return;
     }
     for (const char* const* allowed = type->enumValues; *allowed; ++allowed) {
-        if (equal_words(*allowed, word)) {
+        if (equal_without_case(*allowed, word)) {
             return;
         }
     }

@@ -91,8 +91,9 @@ class LDIF_Entry {
     LDIF_Attributes& attributes() { return read_attributes(); }
     /// Makes these the attributes, instead of what there was.
     void leave_unread(const cfg32::unread_attributes& lines) { unread_ = lines; }
-    /// Lines that are printed as they stand; none once somebody has looked at the attributes.
+    /// True until somebody looks at the attributes, if they are printed as they stand.
     bool has_unread_lines() const { return unread_.is_canonical(); }
+    const cfg32::unread_attributes& unread_lines() const { return unread_; }
     const list& children() const { return children_; }
 
     /// A copy of what names the entry, without comment, attributes and children.

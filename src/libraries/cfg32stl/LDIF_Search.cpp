@@ -72,6 +72,9 @@ LDIF_Filter& LDIF_Filter::operator=(const std::string& text) {
 }
 
 bool LDIF_Filter::match(const LDIF_Entry& entry) const {
+    if (entry.has_unread_lines()) {
+        return match(entry.unread_lines());
+    }
     const LDIF_Attributes& attributes = entry.attributes();
     const auto attribute = attributes.find(attribute_);
     if (attribute == attributes.end()) {
@@ -81,10 +84,30 @@ bool LDIF_Filter::match(const LDIF_Entry& entry) const {
     if (any_value_ || values.empty()) {
         return any_value_;
     }
-    if (!wanted_ || wanted_->key != values.key()) {
-        wanted_.emplace(values.type(), value_, values.key());
+    return values.find(wanted_value(values.key())) != values.end();
+}
+
+/// The same without reading more of the lines than it takes.
+bool LDIF_Filter::match(const unread_attributes& lines) const {
+    bool is_found = false;
+    lines.for_each_value_of(attribute().text(), [&](std::string_view value) {
+        return is_found = any_value_ || is_wanted(value, lines.key());
+    });
+    return is_found;
+}
+
+bool LDIF_Filter::is_wanted(std::string_view value, aes_key_data* key) const {
+    const LDIF_Value& wanted = wanted_value(key);
+    return equal_ ? equal_(value, wanted.text)
+                  : LDIF_Value::stored(wanted.attrType, value, key).compare(wanted) == 0;
+}
+
+const LDIF_Value& LDIF_Filter::wanted_value(aes_key_data* key) const {
+    if (!wanted_ || wanted_->key != key) {
+        wanted_.emplace(attribute_.type(), value_, key);
+        equal_ = equal_texts_of(*attribute_.type());
     }
-    return values.find(*wanted_) != values.end();
+    return *wanted_;
 }
 
 LDIF_Search_Results::LDIF_Search_Results(const Scope& scope, const LDIF_Filter& filter,
@@ -125,24 +148,45 @@ using open_entries = std::vector<std::pair<const LDIF_Entry*, LDIF_Entry::list::
 std::vector<const LDIF_Entry*> cfg32::matches(const LDIF_Entry& base,
                                               LDIF_Search_Results::Scope scope,
                                               const LDIF_Filter& filter) {
-    using results = LDIF_Search_Results;
+    const bool is_one_level = scope == LDIF_Search_Results::OneLevel;
     std::vector<const LDIF_Entry*> found;
     open_entries open;  // from the base down
-    const auto enter = [&](const LDIF_Entry& entry) {
-        const bool is_base = open.empty();
-        const bool is_walked = scope == results::Subtree || (is_base && scope == results::OneLevel);
-        open.emplace_back(&entry, is_walked ? entry.children().begin() : entry.children().end());
-        if (filter.match(entry) && !(is_base && scope == results::OneLevel)) {
-            found.push_back(&entry);
-        }
+    const LDIF_Entry* matched = nullptr;
+    const auto match = [&](const LDIF_Entry& entry) {
+        matched = &entry;
+        const bool is_match = filter.match(entry);
+        matched = nullptr;
+        return is_match;
     };
     try {
-        enter(base);
+        if (match(base) && !is_one_level) {
+            found.push_back(&base);
+        }
+        if (scope != LDIF_Search_Results::Base) {
+            open.emplace_back(&base, base.children().begin());
+        }
         while (!open.empty()) {
-            auto& [entry, next] = open.back();
-            next == entry->children().end() ? open.pop_back() : enter(*next++);
+            auto& [parent, next] = open.back();
+            if (next == parent->children().end()) {
+                open.pop_back();
+                continue;
+            }
+            const LDIF_Entry& entry = *next++;
+            if (next != parent->children().end()) {
+                // Entries and their texts are far apart: the memory has time to answer.
+                __builtin_prefetch(next->unread_lines().text().data());
+            }
+            if (match(entry)) {
+                found.push_back(&entry);
+            }
+            if (!is_one_level && !entry.children().empty()) {
+                open.emplace_back(&entry, entry.children().begin());
+            }
         }
     } catch (...) {
+        if (matched) {
+            open.emplace_back(matched, matched->children().end());
+        }
         if (open.empty()) {
             throw;
         }

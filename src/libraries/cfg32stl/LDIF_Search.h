@@ -31,10 +31,15 @@ class LDIF_Filter {
     bool any_value() const { return any_value_; }
 
   private:
+    bool match(const cfg32::unread_attributes& lines) const;
+    bool is_wanted(std::string_view value, aes_key_data* key) const;
+    const LDIF_Value& wanted_value(aes_key_data* key) const;
+
     cfg32::attribute_name attribute_{"objectclass"};
     std::string value_;
-    bool any_value_ = true;                     // the attribute's presence is all that counts
-    mutable std::optional<LDIF_Value> wanted_;  // the value, once an attribute has told its type
+    bool any_value_ = true;                        // the attribute's presence is all that counts
+    mutable std::optional<LDIF_Value> wanted_;     // the value, once there is one to compare with
+    mutable cfg32::equal_texts* equal_ = nullptr;  // then
 };
 
 /// The names of the wanted attributes; empty means all.

@@ -122,6 +122,15 @@ character first_character(std::string_view text);
 /// strcasecmp of two texts: each ends at its first NUL, if it has one.
 int compare_without_case(std::string_view left, std::string_view right);
 
+/// True when that is 0. Most texts that are not equal differ in their first letters.
+inline bool equal_without_case(std::string_view left, std::string_view right) {
+    constexpr int case_bit = 0x20;
+    const bool have_letters =
+        !left.empty() && !right.empty() && is_ascii(left.front()) && is_ascii(right.front());
+    return !(have_letters && ((left.front() ^ right.front()) & ~case_bit) != 0) &&
+           compare_without_case(left, right) == 0;
+}
+
 /// A hash that is the same for texts that are equal without regard to case; seed continues another
 /// hash.
 size_t hash_without_case(std::string_view text, size_t seed = 0xcbf29ce484222325);

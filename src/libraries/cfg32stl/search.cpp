@@ -12,6 +12,7 @@
 
 #include "LDIF_File.h"
 #include "LDIF_Search.h"
+#include "LDIF_Util.h"
 #include "cfg32_platform.h"
 #include "handle.h"
 #include "message.h"
@@ -26,7 +27,7 @@ constexpr failure not_decoded{84, 1000, "unformat_password();"};
 constexpr size_t decode_buffer_size = 1024;
 
 /// Passwords that the administrator reads in clear; names that begin so, in any case.
-constexpr const char* decoded_names[] = {
+constexpr std::string_view decoded_names[] = {
     "oru-slapdSslKeyDatabasePW",
     "oru-slapdMasterPW",
     "oru-slapdProxyPw",
@@ -42,14 +43,14 @@ class wanted_attributes {
     }
 
     bool are_all() const { return names_.empty(); }
-    bool have(const LDIF_Attribute& attribute) const {
-        const attribute_name& name = attribute.values().typed_name();
-        return std::ranges::any_of(
-            names_, [&](const attribute_name& own) { return own.compare(name) == 0; });
+    bool have(std::string_view name) const {
+        return std::ranges::any_of(names_, [&](std::string_view own) {
+            return own.size() == name.size() && equal_without_case(own, name);
+        });
     }
 
   private:
-    std::vector<attribute_name> names_;
+    std::vector<std::string_view> names_;
 };
 
 /// Appends nodes to a chain.
@@ -84,27 +85,25 @@ char* copy_of(std::string_view text) {
     return copy;
 }
 
-bool is_password(const LDIF_Attribute& attribute) {
+bool is_password(const _AttrType* type) {
     static const _AttrType* const password_type = getAttrType("oru-slapdAdminPW");
-    const _AttrType* type = attribute.values().type();
     return type && type->match == password_type->match;
 }
 
 /// True for a password that is returned in clear: the file was opened by a bind, and the
 /// attribute is one of the few and was asked for by name.
-bool is_decoded(const LDIF_Attribute& attribute, const LDIF_File& file,
-                const wanted_attributes& wanted) {
-    const auto begins_name = [&](const char* prefix) {
-        return strncasecmp(attribute.name().c_str(), prefix, strlen(prefix)) == 0;
+bool is_decoded(std::string_view name, const LDIF_File& file, const wanted_attributes& wanted) {
+    const auto begins_name = [&](std::string_view prefix) {
+        return compare_without_case(name.substr(0, prefix.size()), prefix) == 0;
     };
-    return !attribute.values().empty() && file.getAuthentication() != 0 && is_password(attribute) &&
-           wanted.have(attribute) &&
-           std::any_of(std::begin(decoded_names), std::end(decoded_names), begins_name);
+    return file.getAuthentication() != 0 && wanted.have(name) &&
+           std::ranges::any_of(decoded_names, begins_name) &&
+           is_password(attribute_name(name).type());
 }
 
 /// The password in clear, allocated by the password routine with malloc.
-char* decoded(const std::string& stored, const LDIF_Attribute& attribute, aes_key_data* key,
-              const char* dn, const char* name) {
+char* decoded(std::string_view text, aes_key_data* key, const char* dn, const char* name) {
+    const std::string stored(text);
     const std::string input = stored.empty() ? stored : decoder_input(stored);
     char* clear = nullptr;
     if (input.size() >= decode_buffer_size ||
@@ -113,56 +112,84 @@ char* decoded(const std::string& stored, const LDIF_Attribute& attribute, aes_ke
             e.value = stored;
             e.entryDn = dn;
             e.attribute = name;
-            e.attrType = attribute.values().type();
+            e.attrType = getAttrType(name);
         });
     }
     return clear;
 }
 
-/// Builds the nodes of a result.
-class result_builder {
-  public:
-    result_builder(const LDIF_File& file, const wanted_attributes& wanted, aes_key_data* key)
-        : file_(file), wanted_(wanted), key_(key) {}
+/// Whose result it is, and what is wanted of it.
+struct search_context {
+    const LDIF_File& file;
+    const wanted_attributes& wanted;
+    aes_key_data* key;
+};
 
-    void add(const std::vector<const LDIF_Entry*>& found, CfgMessage** first) const {
-        message_chain entries(first);
-        for (const LDIF_Entry* entry : found) {
-            CfgMessage& node = entries.append(entry_message);
-            const kept_dn& dn = entry->named_dn();
-            node.text = dn.is_simple() ? copy_of(dn.text()) : copy_of(dn.parsed().str());
-            add_attributes(*entry, node);
+/// Builds the nodes of an entry's attributes: begin() for each, and add() for its values.
+class attribute_builder {
+  public:
+    attribute_builder(const search_context& context, CfgMessage& entry)
+        : context_(context), dn_(entry.text), attributes_(&entry.child) {}
+
+    void begin(std::string_view name) {
+        is_wanted_ = context_.wanted.are_all() || context_.wanted.have(name);
+        if (is_wanted_) {
+            attribute_ = &attributes_.append(attribute_message);
+            attribute_->text = copy_of(name);
+            values_ = message_chain(&attribute_->child);
+            is_clear_ = is_decoded(name, context_.file, context_.wanted);
+        }
+    }
+
+    void add(std::string_view value) {
+        if (is_wanted_) {
+            CfgMessage& node = values_.append(value_message);
+            node.text =
+                is_clear_ ? decoded(value, context_.key, dn_, attribute_->text) : copy_of(value);
+            node.is_secret = is_clear_;
         }
     }
 
   private:
-    void add_attributes(const LDIF_Entry& entry, CfgMessage& parent) const {
-        message_chain attributes(&parent.child);
-        for (const LDIF_Attribute& attribute : entry.attributes()) {
-            if (!wanted_.are_all() && !wanted_.have(attribute)) {
-                continue;
-            }
-            CfgMessage& node = attributes.append(attribute_message);
-            node.text = copy_of(attribute.name().text());
-            add_values(attribute, parent.text, node);
-        }
-    }
-
-    void add_values(const LDIF_Attribute& attribute, const char* dn, CfgMessage& parent) const {
-        const bool is_clear = is_decoded(attribute, file_, wanted_);
-        message_chain values(&parent.child);
-        for (const kept_text& text : attribute.values().texts()) {
-            CfgMessage& node = values.append(value_message);
-            node.text =
-                is_clear ? decoded(text.str(), attribute, key_, dn, parent.text) : copy_of(text);
-            node.is_secret = is_clear;
-        }
-    }
-
-    const LDIF_File& file_;
-    const wanted_attributes& wanted_;
-    aes_key_data* key_;
+    const search_context& context_;
+    const char* dn_;
+    message_chain attributes_;
+    bool is_wanted_ = false;
+    CfgMessage* attribute_ = nullptr;
+    message_chain values_{nullptr};
+    bool is_clear_ = false;
 };
+
+void add_attributes(const LDIF_Entry& entry, attribute_builder builder) {
+    if (entry.has_unread_lines()) {
+        std::string_view last;
+        entry.unread_lines().for_each_value([&](std::string_view name, std::string_view value) {
+            if (name != last) {
+                builder.begin(name);
+                last = name;
+            }
+            builder.add(value);
+        });
+        return;
+    }
+    for (const LDIF_Attribute& attribute : entry.attributes()) {
+        builder.begin(attribute.name().text());
+        for (const kept_text& text : attribute.values().texts()) {
+            builder.add(text);
+        }
+    }
+}
+
+void add_entries(const std::vector<const LDIF_Entry*>& found, const search_context& context,
+                 CfgMessage** first) {
+    message_chain entries(first);
+    for (const LDIF_Entry* entry : found) {
+        CfgMessage& node = entries.append(entry_message);
+        const kept_dn& dn = entry->named_dn();
+        node.text = dn.is_simple() ? copy_of(dn.text()) : copy_of(dn.parsed().str());
+        add_attributes(*entry, attribute_builder(context, node));
+    }
+}
 
 LDIF_Search_Results::Scope scope_of(int number) {
     switch (number) {
@@ -176,14 +203,14 @@ LDIF_Search_Results::Scope scope_of(int number) {
 }
 
 /// Builds the result, or releases what was built of it.
-int build(const result_builder& builder, const std::vector<const LDIF_Entry*>& found,
+int build(const std::vector<const LDIF_Entry*>& found, const search_context& context,
           CfgMessage** result) {
     const auto release = [&] {
         cfg_msgfree(*result);
         *result = nullptr;
     };
     try {
-        builder.add(found, result);
+        add_entries(found, context, result);
         return CFG_SUCCESS;
     } catch (const LDIF_Exception&) {
         release();
@@ -210,6 +237,6 @@ int cfg_search_s(CfgHandle* handle, const char* base, int scope, const char* fil
         const wanted_attributes wanted(attrs);
         const std::vector<const LDIF_Entry*> found =
             file.matches(dn, scope_of(scope), wanted_entries);
-        return build(result_builder(file, wanted, handle->keyData), found, result);
+        return build(found, {file, wanted, handle->keyData}, result);
     });
 }

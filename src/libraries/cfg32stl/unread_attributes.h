@@ -4,12 +4,14 @@
 // it can tell what they will be; the entry keeps the place of their lines, and reads them when
 // somebody looks.
 
+#include <cctype>
 #include <cstdint>
 #include <string_view>
 #include <vector>
 
 #include "LDIF_AttrType.h"
 #include "LDIF_Attribute.h"
+#include "LDIF_Util.h"
 
 struct aes_key_data;
 
@@ -38,12 +40,55 @@ class unread_attributes {
     /// Reads what was checked. Memory may be exhausted; nothing else can fail.
     LDIF_Attributes read() const;
 
+    // Of canonical ones: calls use(name, value) for each value, in order.
+    template <class Use>
+    void for_each_value(Use use) const;
+    /// Of canonical ones: calls use(value) for the values of that attribute until it returns true.
+    template <class Use>
+    void for_each_value_of(std::string_view name, Use use) const;
+
+    aes_key_data* key() const { return key_; }
+
   private:
+    static constexpr std::string_view separator = ": ";
+
     const char* text_ = nullptr;
     uint32_t size_ = 0;
     bool is_canonical_ = false;
     aes_key_data* key_ = nullptr;
 };
+
+template <class Use>
+void unread_attributes::for_each_value(Use use) const {
+    for (std::string_view rest = text(); !rest.empty();) {
+        const std::string_view line = rest.substr(0, rest.find('\n'));
+        rest.remove_prefix(line.size() + 1);
+        if (line.front() != '#') {
+            const size_t colon = line.find(separator.front());
+            use(line.substr(0, colon), line.substr(colon + separator.size()));
+        }
+    }
+}
+
+template <class Use>
+void unread_attributes::for_each_value_of(std::string_view name, Use use) const {
+    bool is_found = false;
+    for (std::string_view rest = text(); !rest.empty(); rest.remove_prefix(rest.find('\n') + 1)) {
+        if (rest.front() == '#') {
+            continue;
+        }
+        if (rest.substr(name.size()).starts_with(separator) &&
+            equal_without_case(rest.substr(0, name.size()), name)) {
+            const std::string_view value = rest.substr(name.size() + separator.size());
+            is_found = true;
+            if (use(value.substr(0, value.find('\n')))) {
+                return;
+            }
+        } else if (is_found || tolower(rest.front()) > tolower(name.front())) {
+            return;  // they are sorted
+        }
+    }
+}
 
 /// Checks the attribute lines of an entry that are to be left unread.
 class unread_lines {
