@@ -65,7 +65,8 @@ inline std::string_view line_source::take() {
 
 inline bool line_source::may_be_continued() const {
     const std::string_view text = text_;
-    return !is_clean_ || position_ == text.size() || is_ascii_space(text[position_]);
+    return !is_clean_ || position_ == text.size() ||
+           (text[position_] != '\n' && is_ascii_space(text[position_]));
 }
 
 inline void line_source::go_back(size_t position) {

@@ -158,25 +158,30 @@ int logical_line::read_value(Source& in, int last, const Line& first, std::strin
     if (in.at_end()) {
         return last;
     }
-    if (in.may_be_continued()) {
-        value_memory_ = begin;
-        return read_continuation(in, last);
+    if (!in.may_be_continued()) {
+        value = stored(first, first.without_space_behind(begin), value_memory_);
+        return last;
     }
-    value = stored(first, first.without_space_behind(begin), value_memory_);
-    return last;
+    const int now = read_continuations(in, last, begin);
+    if (now == last && first.lasts && !in.at_end()) {  // it was not continued
+        value = given_text::lasting(first.without_space_behind(begin));
+    }
+    return now;
 }
 
 /// Adds to the begin of the value what continuation lines have of it.
 template <class Source>
-[[gnu::noinline]] int logical_line::read_continuation(Source& in, int last) {
+[[gnu::noinline]] int logical_line::read_continuations(Source& in, int last,
+                                                       std::string_view begin) {
+    value_memory_ = begin;
     while (!in.at_end()) {
         const auto before = in.position();
         const physical_line next = take(in, line_memory_);
         if (!next.is_continuation()) {
             in.go_back(before);
             const std::string_view text = value_memory_;
-            value =
-                is_in_ascii_ ? without_trailing_ascii_space(text) : without_trailing_space(text);
+            value = is_in_ascii_ ? without_trailing_ascii_space(text)
+                                 : without_trailing_space(text);
             return last;
         }
         value_memory_ += next.continuation();

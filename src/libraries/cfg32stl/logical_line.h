@@ -45,7 +45,7 @@ class logical_line {
     template <class Source, class Line>
     int read_value(Source& in, int last, const Line& first, std::string_view begin);
     template <class Source>
-    int read_continuation(Source& in, int last);
+    int read_continuations(Source& in, int last, std::string_view begin);
     void keep_line(std::string_view line, const char* lasting);
 
     given_text with_newline_ = "";

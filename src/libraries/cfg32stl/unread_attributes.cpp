@@ -37,7 +37,7 @@ void unread_lines::start(const char* begin) {
     begin_ = begin;
     size_ = 0;
     is_open_ = is_sorted_ = is_canonical_ = true;
-    has_password_ = false;
+    has_password_ = is_commented_ = false;
     last_ = attribute_name("");
     last_values_.clear();
 }
@@ -45,6 +45,7 @@ void unread_lines::start(const char* begin) {
 void unread_lines::take_comment(const logical_line& line) {
     // One that is converted depends on the locale of the moment.
     is_open_ = is_open_ && line.with_newline().lasts();
+    is_commented_ = true;
 }
 
 bool unread_lines::take(const logical_line& line, const char* end) {
@@ -60,6 +61,7 @@ bool unread_lines::take(const logical_line& line, const char* end) {
     is_canonical_ = is_canonical_ && line.is_canonical();
     is_open_ = value.text == line.value.view() && follow(name, value.text);
     last_ = std::move(name);
+    is_commented_ = false;
     size_ = is_open_ ? size : size_;
     return is_open_;
 }
@@ -82,8 +84,10 @@ bool unread_lines::follow(const attribute_name& name, std::string_view value) {
         const auto is_equal = [&](std::string_view own) {
             return LDIF_Value::stored(name.type(), own, key_).compare(wanted) == 0;
         };
-        is_canonical_ = std::ranges::none_of(last_values_, is_equal) &&
-                        (order != 0 || last_.get().text() == name.get().text());
+        // An attribute's comments are printed before its first value, with the name of that.
+        const bool is_as_printed =
+            order != 0 || (!is_commented_ && last_.get().text() == name.get().text());
+        is_canonical_ = is_as_printed && std::ranges::none_of(last_values_, is_equal);
         last_values_.push_back(value);
     }
     return true;

@@ -4,7 +4,6 @@
 // it can tell what they will be; the entry keeps the place of their lines, and reads them when
 // somebody looks.
 
-#include <cctype>
 #include <cstdint>
 #include <string_view>
 #include <vector>
@@ -77,14 +76,14 @@ void unread_attributes::for_each_value_of(std::string_view name, Use use) const 
         if (rest.front() == '#') {
             continue;
         }
-        if (rest.substr(name.size()).starts_with(separator) &&
+        if (rest.size() > name.size() && rest.substr(name.size()).starts_with(separator) &&
             equal_without_case(rest.substr(0, name.size()), name)) {
             const std::string_view value = rest.substr(name.size() + separator.size());
             is_found = true;
             if (use(value.substr(0, value.find('\n')))) {
                 return;
             }
-        } else if (is_found || tolower(rest.front()) > tolower(name.front())) {
+        } else if (is_found || compare_without_case(rest.substr(0, 1), name.substr(0, 1)) > 0) {
             return;  // they are sorted
         }
     }
@@ -116,6 +115,7 @@ class unread_lines {
     bool is_sorted_ = true;
     bool is_canonical_ = true;
     bool has_password_ = false;
+    bool is_commented_ = false;  // the line that follows
     attribute_name last_{""};
     std::vector<std::string_view> last_values_;  // while everything is canonical
 };
