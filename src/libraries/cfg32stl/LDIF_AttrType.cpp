@@ -225,10 +225,7 @@ attribute_name::attribute_name(std::string_view name) {
 attribute_name::attribute_name(const attribute_name& other)
     : named_(other.is_own() ? new named_type(*other.named_) : other.named_) {}
 
-int attribute_name::compare(const attribute_name& other) const {
-    if (named_ == other.named_) {
-        return 0;
-    }
+int attribute_name::compare_names(const attribute_name& other) const {
     // The rows are in the order of their names.
     if (type()->name && other.type()->name) {
         return static_cast<int>(type() > other.type()) - static_cast<int>(type() < other.type());

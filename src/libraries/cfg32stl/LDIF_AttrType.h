@@ -90,7 +90,9 @@ class attribute_name {
     const _AttrType* type() const { return named_->type; }
 
     /// As the names' compare() orders them.
-    int compare(const attribute_name& other) const;
+    int compare(const attribute_name& other) const {
+        return named_ == other.named_ ? 0 : compare_names(other);
+    }
 
     struct named_type {
         cisString name;
@@ -100,6 +102,7 @@ class attribute_name {
   private:
     friend class name_table;
 
+    int compare_names(const attribute_name& other) const;
     bool is_own() const { return named_ < first_ || named_ > last_; }
 
     // The table's, once there is a name; the last one is for those without.

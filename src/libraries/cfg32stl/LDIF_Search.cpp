@@ -1,5 +1,6 @@
 #include "LDIF_Search.h"
 
+#include <algorithm>
 #include <cstdlib>
 #include <exception>
 #include <ostream>
@@ -84,13 +85,18 @@ bool LDIF_Filter::match(const LDIF_Entry& entry) const {
     if (any_value_ || values.empty()) {
         return any_value_;
     }
-    return values.find(wanted_value(values.key())) != values.end();
+    const LDIF_Value& wanted = wanted_value(values.key());
+    if (equal_ && values.size() <= LDIF_Values::longest_scan) {
+        return std::ranges::any_of(
+            values.texts(), [&](const kept_text& text) { return is_wanted(text, values.key()); });
+    }
+    return values.find(wanted) != values.end();
 }
 
 /// The same without reading more of the lines than it takes.
 bool LDIF_Filter::match(const unread_attributes& lines) const {
     bool is_found = false;
-    lines.for_each_value_of(attribute().text(), [&](std::string_view value) {
+    lines.for_each_value_of(attribute().text(), [&](std::string_view, std::string_view value) {
         return is_found = any_value_ || is_wanted(value, lines.key());
     });
     return is_found;

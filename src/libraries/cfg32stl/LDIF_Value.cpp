@@ -22,9 +22,6 @@ constexpr failure no_buffer{90, 1000, "Allocation failed"};
 constexpr failure no_to_str{80, 1000, "Invalid LDIF_Value detected: attrType->toStr == NULL"};
 constexpr failure no_match{80, 1000, "Invalid LDIF_Value detected: attrType->match == NULL"};
 
-/// Lists longer than this are searched through an index.
-constexpr size_t longest_scan = 16;
-
 }  // namespace
 
 LDIF_Value::LDIF_Value(const _AttrType* type, const char* text, aes_key_data* key)

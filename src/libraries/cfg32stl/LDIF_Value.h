@@ -99,6 +99,9 @@ class LDIF_Values {
   public:
     class const_iterator;
 
+    /// More values than this are searched through an index.
+    static constexpr size_t longest_scan = 16;
+
     LDIF_Values(const std::string& name, aes_key_data* key)
         : LDIF_Values(cfg32::attribute_name(name), key) {}
     LDIF_Values(cfg32::attribute_name name, aes_key_data* key)

@@ -6,6 +6,7 @@
 #include <cstdlib>
 #include <cstring>
 #include <new>
+#include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -43,6 +44,10 @@ class wanted_attributes {
     }
 
     bool are_all() const { return names_.empty(); }
+    /// The name, if there is but one.
+    std::optional<std::string_view> only() const {
+        return names_.size() == 1 ? std::optional(names_.front()) : std::nullopt;
+    }
     bool have(std::string_view name) const {
         return std::ranges::any_of(names_, [&](std::string_view own) {
             return own.size() == name.size() && equal_without_case(own, name);
@@ -160,18 +165,25 @@ class attribute_builder {
     bool is_clear_ = false;
 };
 
-void add_attributes(const LDIF_Entry& entry, attribute_builder builder) {
-    if (entry.has_unread_lines()) {
-        std::string_view last;
-        entry.unread_lines().for_each_value([&](std::string_view name, std::string_view value) {
-            if (name != last) {
-                builder.begin(name);
-                last = name;
-            }
-            builder.add(value);
-        });
-        return;
+void add_lines(const unread_attributes& lines, const wanted_attributes& wanted,
+               attribute_builder builder) {
+    std::string_view last;
+    const auto add = [&](std::string_view name, std::string_view value) {
+        if (name != last) {
+            builder.begin(name);
+            last = name;
+        }
+        builder.add(value);
+        return false;
+    };
+    if (const std::optional<std::string_view> only = wanted.only()) {
+        lines.for_each_value_of(*only, add);
+    } else {
+        lines.for_each_value(add);
     }
+}
+
+void add_attributes(const LDIF_Entry& entry, attribute_builder builder) {
     for (const LDIF_Attribute& attribute : entry.attributes()) {
         builder.begin(attribute.name().text());
         for (const kept_text& text : attribute.values().texts()) {
@@ -187,7 +199,12 @@ void add_entries(const std::vector<const LDIF_Entry*>& found, const search_conte
         CfgMessage& node = entries.append(entry_message);
         const kept_dn& dn = entry->named_dn();
         node.text = dn.is_simple() ? copy_of(dn.text()) : copy_of(dn.parsed().str());
-        add_attributes(*entry, attribute_builder(context, node));
+        const attribute_builder builder(context, node);
+        if (entry->has_unread_lines()) {
+            add_lines(entry->unread_lines(), context.wanted, builder);
+        } else {
+            add_attributes(*entry, builder);
+        }
     }
 }
 

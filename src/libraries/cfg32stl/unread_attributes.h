@@ -42,7 +42,8 @@ class unread_attributes {
     // Of canonical ones: calls use(name, value) for each value, in order.
     template <class Use>
     void for_each_value(Use use) const;
-    /// Of canonical ones: calls use(value) for the values of that attribute until it returns true.
+    /// Of canonical ones: calls use(name, value) for the values of that attribute until it returns
+    /// true.
     template <class Use>
     void for_each_value_of(std::string_view name, Use use) const;
 
@@ -80,7 +81,7 @@ void unread_attributes::for_each_value_of(std::string_view name, Use use) const 
             equal_without_case(rest.substr(0, name.size()), name)) {
             const std::string_view value = rest.substr(name.size() + separator.size());
             is_found = true;
-            if (use(value.substr(0, value.find('\n')))) {
+            if (use(rest.substr(0, name.size()), value.substr(0, value.find('\n')))) {
                 return;
             }
         } else if (is_found || compare_without_case(rest.substr(0, 1), name.substr(0, 1)) > 0) {
