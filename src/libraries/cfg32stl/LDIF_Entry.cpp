@@ -202,14 +202,14 @@ void LDIF_Entry::append_to(std::string& out) const {
 }
 
 size_t LDIF_Entry::line_count() const {
-    size_t count = comment_.line_count() + (is_root() ? 0 : 1) + (ends_with_blank_line() ? 1 : 0);
+    size_t count = comment_.line_count() + (is_root() ? 0 : 1);
     if (has_unread_lines()) {
-        return count + static_cast<size_t>(std::ranges::count(unread_.text(), '\n'));
+        return count;
     }
     for (const LDIF_Attribute& attribute : attributes()) {
         count += attribute.comment().line_count() + attribute.values().size();
     }
-    return count;
+    return count + (ends_with_blank_line() ? 1 : 0);
 }
 
 /// An entry does; the root only where the first entry does not bring a blank line itself.

@@ -60,7 +60,7 @@ class LDIF_Entry {
     virtual std::string str() const;
     void append_to(std::string& out) const;
 
-    /// The lines of its file form.
+    /// The lines of its file form; while it has unread ones, the lines before those.
     size_t line_count() const;
 
     /// Empties everything, children included.

@@ -71,6 +71,16 @@ bool reads_back(std::string_view text, size_t lines) {
     return lines == 0;
 }
 
+/// The same of an entry that was printed so. Lines that were not read since they were loaded need
+/// not be looked at again.
+bool reads_back(const LDIF_Entry& entry, std::string_view printed) {
+    if (entry.has_unread_lines()) {
+        constexpr size_t blank_line = 1;
+        printed.remove_suffix(entry.unread_lines().text().size() + blank_line);
+    }
+    return reads_back(printed, entry.line_count());
+}
+
 /// True when the entry is one that a load takes: the root has two attributes at most, and another's
 /// first line is its DN.
 bool can_be_loaded(const LDIF_Entry& entry) {
@@ -114,8 +124,7 @@ std::string LDIF_File::text() const {
     const auto append = [&](const LDIF_Entry& entry) {
         const size_t begin = out.size();
         entry.append_to(out);
-        if (!can_be_loaded(entry) ||
-            !reads_back(std::string_view(out).substr(begin), entry.line_count())) {
+        if (!can_be_loaded(entry) || !reads_back(entry, std::string_view(out).substr(begin))) {
             raise(not_readable);
         }
     };
