@@ -31,11 +31,11 @@ A terminal gets colours, a pipe does not:
 What takes longer than a second tells a terminal what it is doing, and takes that away again. Here it
 is another program that keeps the file:
 
-    $ held() { flock -x oruslapd.conf sleep 2.5 & sleep 0.2; "$@"; wait; }
-    $ held "$TOOLS/in_terminal" -- cfg32 -f oruslapd.conf get cn=Configuration cn | tr '\r\033' '\n^'
+    $ held() { flock -x oruslapd.conf sleep 3 & sleep 0.2; "$@"; wait; }
+    $ held "$TOOLS/in_terminal" -- cfg32 -f oruslapd.conf get cn=Configuration cn |
+    >     tr '\r\033' '\n^' | sed 's/[1-9] s$/N s/' | uniq
     
-    Reading oruslapd.conf ... 1 s
-    Reading oruslapd.conf ... 2 s
+    Reading oruslapd.conf ... N s
     ^[KConfiguration
     $ held cfg32 -f oruslapd.conf get cn=Configuration cn
     Configuration

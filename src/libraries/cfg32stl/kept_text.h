@@ -15,6 +15,7 @@ namespace cfg32 {
 /// whoever keeps it; of any other text a copy is kept.
 class given_text {
   public:
+    given_text() = default;
     given_text(std::string_view text) : text_(text) {}
     given_text(const std::string& text) : text_(text) {}
     given_text(const char* text) : text_(text) {}

@@ -108,7 +108,7 @@ int logical_line::next(std::ifstream& in, int last) {
 
 template <class Source>
 int logical_line::read(Source& in, int last) {
-    attribute = value = "";
+    attribute = value = {};
     type = LDIF_Line::endOfFile;
     line_number = last + 1;
     has_separator = true;

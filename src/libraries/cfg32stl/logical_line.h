@@ -17,8 +17,8 @@ class logical_line {
     int type = 0;  ///< an LDIF_Line::Type
     int line_number = 0;
     bool has_separator = false;
-    given_text attribute = "";
-    given_text value = "";
+    given_text attribute;
+    given_text value;
 
     logical_line() = default;
     logical_line(const logical_line&) = delete;
@@ -48,7 +48,7 @@ class logical_line {
     int read_continuations(Source& in, int last, std::string_view begin);
     void keep_line(std::string_view line, const char* lasting);
 
-    given_text with_newline_ = "";
+    given_text with_newline_;
     bool is_in_ascii_ = true;
     std::string line_memory_;
     std::string attribute_memory_;

@@ -59,7 +59,10 @@ bool unread_lines::take(const logical_line& line, const char* end) {
     is_open_ = false;  // unless nothing is thrown
     const LDIF_Value value(name.type(), line.value, key_);
     is_canonical_ = is_canonical_ && line.is_canonical();
-    is_open_ = value.text == line.value.view() && follow(name, value.text);
+    const bool is_unchanged = value.text.view().data() == line.value.view().data()
+                                  ? value.text.size() == line.value.size()
+                                  : value.text == line.value.view();
+    is_open_ = is_unchanged && follow(name, value.text);
     last_ = std::move(name);
     is_commented_ = false;
     size_ = is_open_ ? size : size_;
@@ -80,17 +83,20 @@ bool unread_lines::follow(const attribute_name& name, std::string_view value) {
         return false;
     }
     if (is_canonical_) {
-        const LDIF_Value wanted = LDIF_Value::stored(name.type(), value, key_);
-        const auto is_equal = [&](std::string_view own) {
-            return LDIF_Value::stored(name.type(), own, key_).compare(wanted) == 0;
-        };
         // An attribute's comments are printed before its first value, with the name of that.
         const bool is_as_printed =
             order != 0 || (!is_commented_ && last_.get().text() == name.get().text());
-        is_canonical_ = is_as_printed && std::ranges::none_of(last_values_, is_equal);
+        is_canonical_ = is_as_printed && !is_repeated(name.type(), value);
         last_values_.push_back(value);
     }
     return true;
+}
+
+bool unread_lines::is_repeated(const _AttrType* type, std::string_view value) const {
+    return std::ranges::any_of(last_values_, [&](std::string_view own) {
+        return LDIF_Value::stored(type, own, key_)
+                   .compare(LDIF_Value::stored(type, value, key_)) == 0;
+    });
 }
 
 }  // namespace cfg32

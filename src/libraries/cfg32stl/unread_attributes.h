@@ -108,6 +108,7 @@ class unread_lines {
 
   private:
     bool follow(const attribute_name& name, std::string_view value);
+    bool is_repeated(const _AttrType* type, std::string_view value) const;
 
     aes_key_data* key_;
     const char* begin_ = nullptr;
