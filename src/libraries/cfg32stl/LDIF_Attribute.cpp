@@ -125,6 +125,20 @@ auto place_of(Attributes& attributes, const attribute_name& name) {
 
 }  // namespace
 
+LDIF_Attributes::LDIF_Attributes(list&& attributes) {
+    if (attributes.size() > longest_scan) {
+        // Otherwise each would have to move all behind its place.
+        std::ranges::stable_sort(
+            attributes, [](const LDIF_Attribute& l, const LDIF_Attribute& r) { return l < r; });
+    }
+    attributes_.reserve(attributes.size());
+    for (LDIF_Attribute& attribute : attributes) {
+        add(std::move(attribute));
+    }
+    // In no more memory than they need.
+    attributes_ = list(std::make_move_iterator(begin()), std::make_move_iterator(end()));
+}
+
 template <class Attribute>
 void LDIF_Attributes::add(Attribute&& attribute) {
     const iterator place = place_of(attributes_, attribute.values().typed_name());
@@ -182,10 +196,6 @@ LDIF_Attributes::const_iterator LDIF_Attributes::find(const attribute_name& name
     const const_iterator place = size() > longest_scan ? place_of(attributes_, name)
                                                        : std::find_if(begin(), end(), is_reached);
     return place != end() && order(*place) == 0 ? place : end();
-}
-
-void LDIF_Attributes::fit() {
-    attributes_ = list(std::make_move_iterator(begin()), std::make_move_iterator(end()));
 }
 
 std::string LDIF_Attributes::str() const {

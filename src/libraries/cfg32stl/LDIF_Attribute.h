@@ -61,6 +61,10 @@ class LDIF_Attributes {
     using iterator = list::iterator;
     using const_iterator = list::const_iterator;
 
+    LDIF_Attributes() = default;
+    /// Of attributes in any order; several of one name are merged into the first.
+    explicit LDIF_Attributes(list&& attributes);
+
     /// Inserts the attribute in its place, or merges it into the one of its name.
     LDIF_Attributes& operator+=(const LDIF_Attribute& attribute);
     LDIF_Attributes& operator+=(LDIF_Attribute&& attribute);
@@ -79,9 +83,6 @@ class LDIF_Attributes {
     const_iterator end() const { return attributes_.end(); }
     bool empty() const { return attributes_.empty(); }
     size_t size() const { return attributes_.size(); }
-    void reserve(size_t count) { attributes_.reserve(count); }
-    /// Gives back the memory of attributes that are not there.
-    void fit();
 
     std::string str() const;
     void append_to(std::string& out) const;

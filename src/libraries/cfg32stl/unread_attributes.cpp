@@ -14,7 +14,7 @@
 namespace cfg32 {
 
 LDIF_Attributes unread_attributes::read() const {
-    LDIF_Attributes attributes;
+    LDIF_Attributes::list attributes;
     attributes.reserve(usual_attributes);
     LDIF_Comment pending;
     line_source source(given_text::lasting(text()));
@@ -25,12 +25,11 @@ LDIF_Attributes unread_attributes::read() const {
             pending.append(line.with_newline());
             continue;
         }
-        attributes +=
-            LDIF_Attribute(key_, attribute_name(line.attribute), line.value, std::move(pending));
+        attributes.emplace_back(key_, attribute_name(line.attribute), line.value,
+                                std::move(pending));
         pending.clear();
     }
-    attributes.fit();
-    return attributes;
+    return LDIF_Attributes(std::move(attributes));
 }
 
 void unread_lines::start(const char* begin) {
@@ -86,7 +85,8 @@ bool unread_lines::follow(const attribute_name& name, std::string_view value) {
         // An attribute's comments are printed before its first value, with the name of that.
         const bool is_as_printed =
             order != 0 || (!is_commented_ && last_.get().text() == name.get().text());
-        is_canonical_ = is_as_printed && !is_repeated(name.type(), value);
+        is_canonical_ = is_as_printed && last_values_.size() < LDIF_Values::longest_scan &&
+                        !is_repeated(name.type(), value);
         last_values_.push_back(value);
     }
     return true;
@@ -94,8 +94,8 @@ bool unread_lines::follow(const attribute_name& name, std::string_view value) {
 
 bool unread_lines::is_repeated(const _AttrType* type, std::string_view value) const {
     return std::ranges::any_of(last_values_, [&](std::string_view own) {
-        return LDIF_Value::stored(type, own, key_)
-                   .compare(LDIF_Value::stored(type, value, key_)) == 0;
+        return LDIF_Value::stored(type, own, key_).compare(LDIF_Value::stored(type, value, key_)) ==
+               0;
     });
 }
 
