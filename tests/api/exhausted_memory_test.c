@@ -165,10 +165,13 @@ static int search(struct fixture *f, CfgMessage **result) {
 }
 
 static void search_gives_90_and_releases_what_it_built(void **state) {
-    static const unsigned kinds[] = {call_calloc, call_strdup};
+    /* The nodes, and their texts; before those, malloc serves the search itself. */
+    static const unsigned kinds[] = {call_calloc, call_malloc};
     struct fixture *f = *state;
     search_all(f->handle);
+    (void)strerror(ENOMEM);
     for (size_t i = 0; i < LENGTH(kinds); ++i) {
+        int built = 0;
         for (long n = 1;; ++n) {
             CfgMessage *result = (CfgMessage *)f;
             const long before = live_blocks();
@@ -178,13 +181,18 @@ static void search_gives_90_and_releases_what_it_built(void **state) {
                 assert_int_equal(code, CFG_SUCCESS);
                 assert_int_equal(cfg_count_entries(f->handle, result), 4);
                 cfg_msgfree(result);
-                assert_true(n > 20);
+                assert_true(built > 20);
                 break;
             }
-            assert_int_equal(code, CFG_NO_MEMORY);
             assert_null(result);
+            const int has_report = cfg_dump_exception(f->handle) != NULL;
+            if (kinds[i] == call_calloc || built > 0 || !has_report) {
+                assert_int_equal(code, CFG_NO_MEMORY);
+                assert_no_report(f->handle, CFG_NO_MEMORY);
+                ++built;
+            }
+            cfg_reset(f->handle);
             assert_nothing_is_left(before);
-            assert_no_report(f->handle, CFG_NO_MEMORY);
         }
     }
 }
