@@ -82,8 +82,7 @@ class random_lines {
             case 2:
                 return one_of({"objectclass", "objectClass"}) + separator() + "top\n";
             default:
-                return one_of({"cn", "cn", "cn", "CN", "sn", "unknown", "Unknown"}) +
-                       separator() +
+                return one_of({"cn", "cn", "cn", "CN", "sn", "unknown", "Unknown"}) + separator() +
                        one_of({"a", "a", "A", "b", "b c", "", "a\n b", "a \n  b", "\xc3\xa9"}) +
                        one_of({"", "", "", "", " ", "\r"}) + "\n";
         }
@@ -240,4 +239,23 @@ TEST_F(unread, ExhaustedMemoryLeavesTheLinesToBeReadLater) {
         ASSERT_LT(which, 100);
     }
     EXPECT_EQ(entry.attributes().str(), lines);
+}
+
+// Neither many names out of order nor many values cost more than their number.
+TEST_F(unread, WideEntriesAndLongListsAreReadInOrder) {
+    std::string lines;
+    std::string expected;
+    for (int i = 0; i < 3000; ++i) {
+        const std::string line = "a" + std::to_string(100000 + i) + ": v\n";
+        expected += line;
+        lines = line + lines;
+    }
+    for (int i = 0; i < 3000; ++i) {
+        const std::string line = "cn: " + std::to_string(i) + "\n";
+        expected += line;
+        lines += line;
+    }
+    const auto file = store_of(lines + "cn: 2999\n");
+    EXPECT_EQ(entry_of(*file).attributes().str(), expected);
+    EXPECT_EQ(entry_of(*file).attributes().size(), 3001U);
 }
