@@ -217,6 +217,14 @@ TEST_F(unread, AFilterMatchesWhatItMatchesWhenTheAttributesAreRead) {
     EXPECT_GT(matches, 200);
 }
 
+TEST_F(unread, ANameEndsAtItsColonWhateverTheFilterAsksFor) {
+    const auto file = store_of("cn: a: b\n");
+    ASSERT_TRUE(entry_of(*file).has_unread_lines());
+    EXPECT_FALSE(LDIF_Filter("(cn: a=*)").match(entry_of(*file)));
+    EXPECT_FALSE(LDIF_Filter("(cn: a=b)").match(entry_of(*file)));
+    EXPECT_TRUE(LDIF_Filter("(cn=a: b)").match(entry_of(*file)));
+}
+
 TEST_F(unread, ACopyOutlivesTheStore) {
     auto file = store_of("cn: a\nsn: b\n");
     const LDIF_Entry copy(entry_of(*file));

@@ -1,7 +1,5 @@
 #include "logical_line.h"
 
-#include <strings.h>
-
 #include <string_view>
 
 #include "LDIF_Line.h"

@@ -72,6 +72,9 @@ void unread_attributes::for_each_value(Use use) const {
 
 template <class Use>
 void unread_attributes::for_each_value_of(std::string_view name, Use use) const {
+    if (name.find(separator.front()) != name.npos) {
+        return;  // no attribute is called so, though a line may begin so
+    }
     bool is_found = false;
     for (std::string_view rest = text(); !rest.empty(); rest.remove_prefix(rest.find('\n') + 1)) {
         if (rest.front() == '#') {
