@@ -210,6 +210,9 @@ TEST_P(editor, ThatSavesInPlaceLosesNothing) {
 }
 
 TEST_P(editor, ThatSavesInPlaceWhileTheOldContentIsReadIsNoticed) {
+    if (setting.has_backup) {
+        GTEST_SKIP() << "the backup is what would be put back, and nothing is read";
+    }
     const auto is_selected = [&](size_t nth, moment when) { return is_read_before(nth, when); };
     for_each_moment(save_in_place, is_selected, [&](stage& on, size_t, moment, int code) {
         EXPECT_EQ(code, changed_meanwhile);

@@ -271,6 +271,33 @@ TEST_F(disk, MarkIsGoneWhenTheTextIsComplete) {
     }
 }
 
+TEST_F(disk, WhatAnotherFileHoldsIsMadeTheContentInParts) {
+    const std::string mark = "# unfinished\n";
+    for (const size_t size : {size_t{0}, size_t{1}, mark.size() - 1, mark.size(), mark.size() + 1,
+                              65536ul, 65536 + mark.size(), 200'000ul}) {
+        std::string text(size, 'x');
+        for (size_t i = 0; i < size; i += 7) {
+            text[i] = static_cast<char>('a' + i % 26);
+        }
+        const unique_fd other = opened(folder.write("other", text), O_RDONLY);
+        for (const std::string_view marked : {std::string_view(mark), std::string_view()}) {
+            for (const size_t before : {0, 100, 300'000}) {
+                const unique_fd file = opened(folder.write("f", std::string(before, 'b')), O_RDWR);
+                EXPECT_TRUE(replace_content(file.get(), other.get(), marked));
+                EXPECT_TRUE(folder.read("f") == text) << size << " over " << before;
+            }
+        }
+    }
+}
+
+TEST_F(disk, AnotherFileThatCannotBeReadLeavesTheContent) {
+    const unique_fd file = opened(folder.write("f", "before"), O_RDWR);
+    const unique_fd other(open(folder.write("other", "after").c_str(), O_WRONLY));
+    EXPECT_FALSE(replace_content(file.get(), other.get(), "# unfinished\n"));
+    EXPECT_EQ(errno, EBADF);
+    EXPECT_EQ(folder.read("f"), "before");
+}
+
 TEST_F(disk, FailureToWriteIsReportedAndChangesNothing) {
     const unique_fd file(open(folder.write("f", "before").c_str(), O_RDONLY));
     EXPECT_FALSE(replace_content(file.get(), "after"));

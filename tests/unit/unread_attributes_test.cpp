@@ -34,6 +34,9 @@ struct unread : store_test {
     }
 };
 
+/// True while nobody has looked at the attributes, if their lines are printed as they stand.
+bool has_canonical_lines(const LDIF_Entry& entry) { return entry.unread_lines().is_canonical(); }
+
 /// The lines as attributes, read one by one.
 LDIF_Attributes read_at_once(const std::string& lines) {
     LDIF_Attributes attributes;
@@ -104,11 +107,11 @@ TEST_F(unread, LinesThatAreWrittenPlainlyAndInOrderAreLeftUntilSomebodyLooks) {
           "oru-slapdAdminPW: {SSHA}x\n", "objectClass: top\n", "a-b: x: y #\n"}) {
         const auto file = store_of(lines);
         const LDIF_Entry& entry = entry_of(*file);
-        EXPECT_TRUE(entry.has_unread_lines()) << lines;
+        EXPECT_TRUE(has_canonical_lines(entry)) << lines;
         EXPECT_EQ(entry.str(), dn_line + lines + "\n");
-        EXPECT_TRUE(entry.has_unread_lines()) << lines;
+        EXPECT_TRUE(has_canonical_lines(entry)) << lines;
         EXPECT_EQ(entry.attributes().str(), lines);
-        EXPECT_FALSE(entry.has_unread_lines()) << lines;
+        EXPECT_FALSE(has_canonical_lines(entry)) << lines;
         EXPECT_EQ(entry.str(), dn_line + lines + "\n");
     }
 }
@@ -138,8 +141,54 @@ TEST_F(unread, LinesThatAreWrittenOtherwiseAreNotPrintedAsTheyStand) {
     };
     for (const auto& row : rows) {
         const auto file = store_of(row.lines);
-        EXPECT_FALSE(entry_of(*file).has_unread_lines()) << row.lines;
+        EXPECT_FALSE(has_canonical_lines(entry_of(*file))) << row.lines;
         EXPECT_EQ(entry_of(*file).str(), dn_line + row.printed + "\n");
+    }
+}
+
+TEST_F(unread, LinesThatAreWrittenOtherwiseAreWrittenAnewOnce) {
+    const struct {
+        const char* lines;
+        const char* printed;
+    } rows[] = {
+        {"cn:  a\n", "cn: a\n"},
+        {"cn: a\n b\n", "cn: ab\n"},
+        {"cn:\n a\n", "cn: a\n"},
+        {"# c\nsn: a\n# d\ncn: b\n", "# d\ncn: b\n# c\nsn: a\n"},
+        {"cn: a\ncn: A\n", "cn: a\n"},
+        {"# c\ncn: a\n# d\ncn: b\n", "# c\n# d\ncn: a\ncn: b\n"},
+        {"cn: a\nCN: b\n", "cn: a\ncn: b\n"},
+    };
+    for (const auto& row : rows) {
+        const auto file = store_of(row.lines);
+        const LDIF_Entry& entry = entry_of(*file);
+        ASSERT_FALSE(has_canonical_lines(entry)) << row.lines;
+        EXPECT_TRUE(LDIF_Filter("(cn=*)").match(entry)) << row.lines;
+        ASSERT_TRUE(has_canonical_lines(entry)) << row.lines;
+        EXPECT_EQ(entry.unread_lines().text(), row.printed);
+        EXPECT_EQ(entry.str(), dn_line + row.printed + "\n");
+        EXPECT_EQ(entry.attributes().str(), row.printed);
+        EXPECT_EQ(entry.str(), dn_line + row.printed + "\n");
+    }
+}
+
+// A value would lose the blank before it, a text without one would be no line of a value, and
+// whatever is long is found faster in arrays.
+TEST_F(unread, WhatWouldNotBeReadAsItIsWrittenIsNotWrittenAnew) {
+    std::string many_names;
+    std::string many_values;
+    for (int i = 0; i < 100; ++i) {
+        many_names += "a" + std::to_string(200 - i) + ": v\n";
+        many_values += "sn: " + std::to_string(i) + "\n";
+    }
+    for (const std::string& lines :
+         {std::string("cn:\n  a\n"), std::string("cn:\n"), std::string("sn: b\n# c\n cn: a\n"),
+          std::string("sn: a\ncn:\n"), many_names, many_values}) {
+        const auto file = store_of(lines);
+        const LDIF_Entry& entry = entry_of(*file);
+        EXPECT_FALSE(LDIF_Filter("(ou=*)").match(entry)) << lines;
+        EXPECT_TRUE(entry.unread_lines().empty()) << lines;
+        EXPECT_EQ(entry.attributes().str(), read_at_once(lines).str());
     }
 }
 
@@ -178,7 +227,7 @@ TEST_F(unread, WhateverTheLinesTheAttributesAreTheSameAsReadAtOnce) {
             FAIL() << e.msg;
         }
         const LDIF_Entry& entry = entry_of(*file);
-        unread_count += entry.has_unread_lines();
+        unread_count += has_canonical_lines(entry);
         const std::string printed = entry.str();
         EXPECT_EQ(entry.attributes().str(), expected.str());
         EXPECT_EQ(printed, entry.str());
@@ -219,24 +268,49 @@ TEST_F(unread, AFilterMatchesWhatItMatchesWhenTheAttributesAreRead) {
 
 TEST_F(unread, ANameEndsAtItsColonWhateverTheFilterAsksFor) {
     const auto file = store_of("cn: a: b\n");
-    ASSERT_TRUE(entry_of(*file).has_unread_lines());
+    ASSERT_TRUE(has_canonical_lines(entry_of(*file)));
     EXPECT_FALSE(LDIF_Filter("(cn: a=*)").match(entry_of(*file)));
     EXPECT_FALSE(LDIF_Filter("(cn: a=b)").match(entry_of(*file)));
     EXPECT_TRUE(LDIF_Filter("(cn=a: b)").match(entry_of(*file)));
 }
 
+TEST_F(unread, ANumberSignBeginsNoNameWhateverTheFilterAsksFor) {
+    const auto file = store_of("#cn: a\ncn: b\n");
+    EXPECT_FALSE(LDIF_Filter("(#cn=*)").match(entry_of(*file)));
+    EXPECT_TRUE(LDIF_Filter("(cn=b)").match(entry_of(*file)));
+}
+
 TEST_F(unread, ACopyOutlivesTheStore) {
-    auto file = store_of("cn: a\nsn: b\n");
-    const LDIF_Entry copy(entry_of(*file));
-    file.reset();
-    EXPECT_EQ(copy.str(), dn_line + "cn: a\nsn: b\n\n");
+    for (const char* lines : {"cn: a\nsn: b\n", "sn: b\ncn: a\n"}) {
+        auto file = store_of(lines);
+        entry_of(*file).printed_lines();
+        const LDIF_Entry copy(entry_of(*file));
+        file.reset();
+        EXPECT_EQ(copy.str(), dn_line + "cn: a\nsn: b\n\n");
+    }
+}
+
+TEST_F(unread, ExhaustedMemoryLeavesTheLinesToBeWrittenAnewLater) {
+    const auto file = store_of("sn: c\n# c\ncn: a\ncn: b\nunknown: d\n");
+    const LDIF_Entry& entry = entry_of(*file);
+    for (long which = 0; !has_canonical_lines(entry); ++which) {
+        try {
+            failing_allocation failing(which);
+            entry.printed_lines();
+        } catch (const LDIF_Exception& e) {
+            EXPECT_EQ(e.sysErrno, ENOMEM) << which;
+        } catch (const std::bad_alloc&) {
+        }
+        ASSERT_LT(which, 100);
+    }
+    EXPECT_EQ(entry.attributes().str(), "# c\ncn: a\ncn: b\nsn: c\nunknown: d\n");
 }
 
 TEST_F(unread, ExhaustedMemoryLeavesTheLinesToBeReadLater) {
     const std::string lines = "# c\ncn: a\ncn: b\nsn: c\nunknown: d\n";
     const auto file = store_of(lines);
     const LDIF_Entry& entry = entry_of(*file);
-    for (long which = 0; entry.has_unread_lines(); ++which) {
+    for (long which = 0; has_canonical_lines(entry); ++which) {
         try {
             failing_allocation failing(which);
             entry.attributes();

@@ -37,9 +37,9 @@ LDIF_Entry::LDIF_Entry(const LDIF_Line& line, const LDIF_Comment& comment)
     : name_(line.attribute), dn_(dn_of(line)), comment_(comment) {}
 
 LDIF_Entry::LDIF_Entry(const LDIF_Entry& other)
-    : name_(other.name_),
+    : children_(other.children_),
       attributes_(other.attributes()),
-      children_(other.children_),
+      name_(other.name_),
       depth_(other.depth_),
       dn_(other.dn_),
       comment_(other.comment_) {
@@ -191,8 +191,8 @@ void LDIF_Entry::append_to(std::string& out) const {
         dn_.append_to(out.append(name().text()).append(": "));
         out += '\n';
     }
-    if (has_unread_lines()) {
-        out += unread_.text();
+    if (const unread_attributes* lines = printed_lines()) {
+        out += lines->text();
     } else {
         attributes().append_to(out);
     }
@@ -203,7 +203,7 @@ void LDIF_Entry::append_to(std::string& out) const {
 
 size_t LDIF_Entry::line_count() const {
     size_t count = comment_.line_count() + (is_root() ? 0 : 1);
-    if (has_unread_lines()) {
+    if (printed_lines()) {
         return count;
     }
     for (const LDIF_Attribute& attribute : attributes()) {
@@ -222,6 +222,17 @@ LDIF_Attributes& LDIF_Entry::read_unread() const {
     attributes_ = unread_.read();
     unread_ = {};
     return attributes_;
+}
+
+/// Most entries are searched and printed again and again, and never changed: lines are shorter than
+/// what is read of them, and stand together.
+bool LDIF_Entry::print_unread() const {
+    LDIF_Attributes attributes = unread_.read();
+    unread_ = unread_.printed(attributes);
+    if (unread_.empty()) {
+        attributes_ = std::move(attributes);
+    }
+    return !unread_.empty();
 }
 
 LDIF_Entry& LDIF_Entry::clear() { return *this = LDIF_Entry(); }

@@ -90,10 +90,13 @@ class LDIF_Entry {
     const LDIF_Attributes& attributes() const { return read_attributes(); }
     LDIF_Attributes& attributes() { return read_attributes(); }
     /// Makes these the attributes, instead of what there was.
-    void leave_unread(const cfg32::unread_attributes& lines) { unread_ = lines; }
-    /// True until somebody looks at the attributes, if they are printed as they stand.
-    bool has_unread_lines() const { return unread_.is_canonical(); }
+    void leave_unread(cfg32::unread_attributes&& lines) { unread_ = std::move(lines); }
     const cfg32::unread_attributes& unread_lines() const { return unread_; }
+    /// The attribute lines as they are printed, until somebody looks at the attributes; null if
+    /// there are none. Lines that are written otherwise are written anew for it.
+    const cfg32::unread_attributes* printed_lines() const {
+        return unread_.is_canonical() || (!unread_.empty() && print_unread()) ? &unread_ : nullptr;
+    }
     const list& children() const { return children_; }
 
     /// A copy of what names the entry, without comment, attributes and children.
@@ -111,12 +114,13 @@ class LDIF_Entry {
         return unread_.empty() ? attributes_ : read_unread();
     }
     LDIF_Attributes& read_unread() const;
+    bool print_unread() const;
 
     // What a search looks at stands together.
-    cfg32::attribute_name name_{""};
-    mutable LDIF_Attributes attributes_;
-    list children_;
     mutable cfg32::unread_attributes unread_;  // then there are no others
+    list children_;
+    mutable LDIF_Attributes attributes_;
+    cfg32::attribute_name name_{""};
     size_t depth_ = 0;
     cfg32::kept_dn dn_;
     LDIF_Comment comment_;

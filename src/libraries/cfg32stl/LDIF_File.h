@@ -89,11 +89,11 @@ class LDIF_File {
                                const LDIF_Filter& filter, const LDIF_AttrFilter& attributes,
                                bool attributesOnly) const;
 
-    /// The entries themselves, which stay this file's until it is changed or refreshed. Throws the
-    /// same.
-    std::vector<const LDIF_Entry*> matches(const LDIF_DN& base,
-                                           const LDIF_Search_Results::Scope& scope,
-                                           const LDIF_Filter& filter) const;
+    /// The entries themselves, which stay this file's until it is changed or refreshed; the list
+    /// does until the next one. Throws the same.
+    const cfg32::found_entries& matches(const LDIF_DN& base,
+                                        const LDIF_Search_Results::Scope& scope,
+                                        const LDIF_Filter& filter) const;
 
     enum Authentication { not_authenticated, anonymous, administrator };
 
@@ -124,14 +124,26 @@ class LDIF_File {
     void require_finished(std::string_view text);
     int authenticate(const char* dn, const char* password, int method) const;
     std::string text() const;
-    void back_up(bool is_refreshed);
-    void write(const std::string& content, bool is_refreshed);
+    /// An open backup.
+    struct backup {
+        cfg32::unique_fd file;
+        struct stat of {};  ///< the version of the configuration file that it is a copy of
+
+        bool is_of(const struct stat& status) const {
+            return file && cfg32::is_same_version(of, status);
+        }
+    };
+
+    backup back_up(bool is_refreshed);
+    void write(const std::string& content, const backup& copy, bool is_refreshed);
     void replace_content_of(const std::string& expected, const std::string& content);
     std::string locked_content();
     cfg32::unique_fd open_for_writing(struct stat& status);
     void create();
-    void overwrite(cfg32::unique_fd file, struct stat& status, const std::string& content);
-    std::string reserved(int file, const struct stat& status, size_t size);
+    void overwrite(cfg32::unique_fd file, struct stat& status, const std::string& content,
+                   const backup& copy);
+    [[noreturn]] void raise_not_written(int error, bool is_put_back);
+    std::string content_of(int file, const struct stat& status);
     void require_own(const struct stat& status, bool is_refreshed);
 
     // What is filled in of a failure.
@@ -155,6 +167,9 @@ class LDIF_File {
     bool is_whole_ = false;           // the tree is all of a file
     bool is_loaded_ = false;          // the tree is what status_ tells
     bool has_invalid_lines_ = false;  // that the file has not yet as attributes
+
+    // Kept, because to make room for many anew upsets the heap for the results.
+    mutable cfg32::found_entries found_;
 
     bool is_updated_ = false;  // while there is an update
     cfg32::locked_file lock_;

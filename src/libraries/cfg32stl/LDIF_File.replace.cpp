@@ -28,10 +28,8 @@ void LDIF_File::replace_content_of(const std::string& expected, const std::strin
     if (present != expected) {
         raise_changed();
     }
-    if (!backup_file_name_.empty() && !present.starts_with(unfinished_mark)) {
-        back_up(true);
-    }
-    write(content, true);
+    const bool is_finished = !present.starts_with(unfinished_mark);
+    write(content, is_finished ? back_up(true) : backup(), true);
 }
 
 /// What the locked file holds. From here on it counts as refreshed: it must stay what it is.

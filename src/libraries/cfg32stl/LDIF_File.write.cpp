@@ -74,9 +74,9 @@ bool reads_back(std::string_view text, size_t lines) {
 /// The same of an entry that was printed so. Lines that were not read since they were loaded need
 /// not be looked at again.
 bool reads_back(const LDIF_Entry& entry, std::string_view printed) {
-    if (entry.has_unread_lines()) {
+    if (const unread_attributes* lines = entry.printed_lines()) {
         constexpr size_t blank_line = 1;
-        printed.remove_suffix(entry.unread_lines().text().size() + blank_line);
+        printed.remove_suffix(lines->text().size() + blank_line);
     }
     return reads_back(printed, entry.line_count());
 }
@@ -106,10 +106,7 @@ void LDIF_File::flush() {
         const std::string content = with_context([&] { return text(); }, forgetting);
         const bool is_refreshed = is_updated_;
         const update lock(*this);
-        if (!backup_file_name_.empty()) {
-            back_up(is_refreshed);
-        }
-        write(content, is_refreshed);
+        write(content, back_up(is_refreshed), is_refreshed);
     };
     with_system_error([] { return "writing file"; }, body, forgetting);
 }
@@ -136,8 +133,12 @@ std::string LDIF_File::text() const {
     return out;
 }
 
-/// The backup is replaced by nothing but a complete version of the file that is to be changed.
-void LDIF_File::back_up(bool is_refreshed) {
+/// The backup, if there is to be one, is replaced by nothing but a complete version of the file
+/// that is to be changed.
+LDIF_File::backup LDIF_File::back_up(bool is_refreshed) {
+    if (backup_file_name_.empty()) {
+        return {};
+    }
     // Not the remembered status: what was changed meanwhile is still to be noticed.
     struct stat status;
     const char* name = file_name_.c_str();
@@ -154,7 +155,9 @@ void LDIF_File::back_up(bool is_refreshed) {
     const char* group = group_name(status.st_gid, group_buffer);
     errno = lock_error_;
     if (lock_ && copyFile(name, backup_file_name_.c_str(), owner, group, status.st_mode)) {
-        return;
+        struct stat of_copy;
+        unique_fd copy = open_regular(backup_file_name_.c_str(), of_copy);
+        return {copy && of_copy.st_size == status.st_size ? std::move(copy) : unique_fd(), status};
     }
     const int error = errno;
     if (lock_ && stat(name, &status) == 0) {
@@ -165,11 +168,11 @@ void LDIF_File::back_up(bool is_refreshed) {
 }
 
 /// Makes content the file's, in place: links to it, its owner and its mode stay.
-void LDIF_File::write(const std::string& content, bool is_refreshed) {
+void LDIF_File::write(const std::string& content, const backup& copy, bool is_refreshed) {
     struct stat status;
     unique_fd file = open_for_writing(status);
     require_own(status, is_refreshed);
-    overwrite(std::move(file), status, content);
+    overwrite(std::move(file), status, content, copy);
     struct stat named;
     if (stat(file_name_.c_str(), &named) != 0) {
         raise_with(no_status, {}, name_file_and_errno(errno));
@@ -217,11 +220,18 @@ void LDIF_File::create() {
 }
 
 /// Makes content the open file's, or puts back what was there. Takes the new status.
-void LDIF_File::overwrite(unique_fd file, struct stat& status, const std::string& content) {
+void LDIF_File::overwrite(unique_fd file, struct stat& status, const std::string& content,
+                          const backup& copy) {
     // A process that is killed in the middle leaves a file that no load takes for a complete one:
     // it would repair what can't be read, and let the backup be overwritten by it.
     const std::string_view mark = backup_file_name_.empty() ? "" : unfinished_mark;
-    const std::string before = reserved(file.get(), status, std::max(content.size(), mark.size()));
+    // The backup need not be read, nor held in memory, to be there when it is wanted.
+    const bool has_copy = copy.is_of(status);
+    const std::string before = has_copy ? "" : content_of(file.get(), status);
+    const size_t size_before = has_copy ? static_cast<size_t>(status.st_size) : before.size();
+    if (!reserve(file.get(), size_before, std::max(content.size(), mark.size()))) {
+        raise_with(not_written, {}, name_file_and_errno(errno));
+    }
     is_loaded_ = false;  // until it is known what the file has become
     bool is_ours = false;
     const timespec time = status.st_mtim;
@@ -235,9 +245,15 @@ void LDIF_File::overwrite(unique_fd file, struct stat& status, const std::string
         }
     }
     const int error = errno;
-    const int put_back_to = file ? file.get() : lock_.get();
-    const bool is_put_back =
-        replace_content(put_back_to, before, mark) && sync_content(put_back_to);
+    const int damaged = file ? file.get() : lock_.get();
+    const bool is_put_back = (has_copy ? replace_content(damaged, copy.file.get(), mark)
+                                       : replace_content(damaged, before, mark)) &&
+                             sync_content(damaged);
+    raise_not_written(error, is_put_back);
+}
+
+/// errno tells why the old content was not put back.
+void LDIF_File::raise_not_written(int error, bool is_put_back) {
     const int second_error = errno;
     LDIF_Exception e = make_exception(not_written);
     name_file_and_errno(error)(e);
@@ -248,18 +264,15 @@ void LDIF_File::overwrite(unique_fd file, struct stat& status, const std::string
     throw e;
 }
 
-/// Takes room for a text of that size; returns what the file holds.
-std::string LDIF_File::reserved(int file, const struct stat& status, size_t size) {
-    std::string before;
+/// What the open file holds, which has that status.
+std::string LDIF_File::content_of(int file, const struct stat& status) {
+    std::string content;
     struct stat now;
-    if (!read_all(file, static_cast<size_t>(status.st_size), before) || fstat(file, &now) != 0) {
+    if (!read_all(file, static_cast<size_t>(status.st_size), content) || fstat(file, &now) != 0) {
         raise_with(not_written, {}, name_file_and_errno(errno));
     }
     if (!is_same_version(now, status)) {
         raise_changed();
     }
-    if (!reserve(file, before.size(), size)) {
-        raise_with(not_written, {}, name_file_and_errno(errno));
-    }
-    return before;
+    return content;
 }

@@ -59,6 +59,7 @@ LDIF_Filter& LDIF_Filter::operator=(const std::string& text) {
     std::string name = term.substr(0, equals);
     if (!stripTrailing(name).empty() || equals != std::string::npos) {
         attribute_ = attribute_name(name);
+        start_ = line_start(name);
     }
     if (equals == std::string::npos) {
         return *this;
@@ -73,8 +74,8 @@ LDIF_Filter& LDIF_Filter::operator=(const std::string& text) {
 }
 
 bool LDIF_Filter::match(const LDIF_Entry& entry) const {
-    if (entry.has_unread_lines()) {
-        return match(entry.unread_lines());
+    if (const unread_attributes* lines = entry.printed_lines()) {
+        return match(*lines);
     }
     const LDIF_Attributes& attributes = entry.attributes();
     const auto attribute = attributes.find(attribute_);
@@ -96,7 +97,7 @@ bool LDIF_Filter::match(const LDIF_Entry& entry) const {
 /// The same without reading more of the lines than it takes.
 bool LDIF_Filter::match(const unread_attributes& lines) const {
     bool is_found = false;
-    lines.for_each_value_of(attribute().text(), [&](std::string_view, std::string_view value) {
+    lines.for_each_value_of(start_, [&](std::string_view, std::string_view value) {
         return is_found = any_value_ || is_wanted(value, lines.key());
     });
     return is_found;
@@ -123,8 +124,10 @@ LDIF_Search_Results::LDIF_Search_Results(const Scope& scope, const LDIF_Filter& 
 LDIF_Search_Results& LDIF_Search_Results::addEntry(const LDIF_Entry& entry, const bool& isBase) {
     // Below the base one level is the entry alone.
     const Scope scope = !isBase && scope_ == OneLevel ? Base : scope_;
-    for (const LDIF_Entry* found : matches(entry, scope, filter_)) {
-        add_match(*found);
+    found_entries found;
+    find_matches(entry, scope, filter_, found);
+    for (const LDIF_Entry* match : found) {
+        add_match(*match);
     }
     return *this;
 }
@@ -151,11 +154,10 @@ using open_entries = std::vector<std::pair<const LDIF_Entry*, LDIF_Entry::list::
 
 }  // namespace
 
-std::vector<const LDIF_Entry*> cfg32::matches(const LDIF_Entry& base,
-                                              LDIF_Search_Results::Scope scope,
-                                              const LDIF_Filter& filter) {
+void cfg32::find_matches(const LDIF_Entry& base, LDIF_Search_Results::Scope scope,
+                         const LDIF_Filter& filter, found_entries& found) {
     const bool is_one_level = scope == LDIF_Search_Results::OneLevel;
-    std::vector<const LDIF_Entry*> found;
+    found.clear();
     open_entries open;  // from the base down
     const LDIF_Entry* matched = nullptr;
     const auto match = [&](const LDIF_Entry& entry) {
@@ -181,6 +183,7 @@ std::vector<const LDIF_Entry*> cfg32::matches(const LDIF_Entry& base,
             if (next != parent->children().end()) {
                 // Entries and their texts are far apart: the memory has time to answer.
                 __builtin_prefetch(next->unread_lines().text().data());
+                __builtin_prefetch(&*std::next(next));
             }
             if (match(entry)) {
                 found.push_back(&entry);
@@ -198,7 +201,6 @@ std::vector<const LDIF_Entry*> cfg32::matches(const LDIF_Entry& base,
         }
         fail_within(open, 0, std::current_exception());
     }
-    return found;
 }
 
 void LDIF_Search_Results::add_match(const LDIF_Entry& entry) {
@@ -241,12 +243,12 @@ LDIF_Search_Results LDIF_File::search(const LDIF_DN& base, const LDIF_Search_Res
     return with_system_error(in("LDIF_File::search()"), body, no_details);
 }
 
-std::vector<const LDIF_Entry*> LDIF_File::matches(const LDIF_DN& base,
-                                                  const LDIF_Search_Results::Scope& scope,
-                                                  const LDIF_Filter& filter) const {
-    return with_system_error(
-        in("LDIF_File::search()"), [&] { return cfg32::matches(base_entry(base), scope, filter); },
-        no_details);
+const found_entries& LDIF_File::matches(const LDIF_DN& base,
+                                        const LDIF_Search_Results::Scope& scope,
+                                        const LDIF_Filter& filter) const {
+    const auto body = [&] { find_matches(base_entry(base), scope, filter, found_); };
+    with_system_error(in("LDIF_File::search()"), body, no_details);
+    return found_;
 }
 
 const LDIF_Entry& LDIF_File::base_entry(const LDIF_DN& dn) const {

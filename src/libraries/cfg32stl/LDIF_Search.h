@@ -36,6 +36,7 @@ class LDIF_Filter {
     const LDIF_Value& wanted_value(aes_key_data* key) const;
 
     cfg32::attribute_name attribute_{"objectclass"};
+    cfg32::line_start start_{"objectclass"};  // of that attribute's lines
     std::string value_;
     bool any_value_ = true;                        // the attribute's presence is all that counts
     mutable std::optional<LDIF_Value> wanted_;     // the value, once there is one to compare with
@@ -74,9 +75,11 @@ std::ostream& operator<<(std::ostream& out, const LDIF_Search_Results& results);
 
 namespace cfg32 {
 
-/// The entries that the scope reaches from the base on and the filter matches, each before those
-/// below it. They stay the tree's.
-std::vector<const LDIF_Entry*> matches(const LDIF_Entry& base, LDIF_Search_Results::Scope scope,
-                                       const LDIF_Filter& filter);
+using found_entries = std::vector<const LDIF_Entry*>;
+
+/// Finds the entries that the scope reaches from the base on and the filter matches, each before
+/// those below it. They stay the tree's.
+void find_matches(const LDIF_Entry& base, LDIF_Search_Results::Scope scope,
+                  const LDIF_Filter& filter, found_entries& found);
 
 }  // namespace cfg32

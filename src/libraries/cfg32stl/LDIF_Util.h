@@ -122,12 +122,16 @@ character first_character(std::string_view text);
 /// strcasecmp of two texts: each ends at its first NUL, if it has one.
 int compare_without_case(std::string_view left, std::string_view right);
 
-/// True when that is 0. Most texts that are not equal differ in their first letters.
-inline bool equal_without_case(std::string_view left, std::string_view right) {
+/// False for ASCII characters that are not equal without regard to case.
+inline bool may_be_equal_without_case(char left, char right) {
     constexpr int case_bit = 0x20;
-    const bool have_letters =
-        !left.empty() && !right.empty() && is_ascii(left.front()) && is_ascii(right.front());
-    return !(have_letters && ((left.front() ^ right.front()) & ~case_bit) != 0) &&
+    return !is_ascii(left) || !is_ascii(right) || ((left ^ right) & ~case_bit) == 0;
+}
+
+/// True when that comparison gives 0. Most texts that are not equal differ in their first letters.
+inline bool equal_without_case(std::string_view left, std::string_view right) {
+    return (left.empty() || right.empty() ||
+            may_be_equal_without_case(left.front(), right.front())) &&
            compare_without_case(left, right) == 0;
 }
 

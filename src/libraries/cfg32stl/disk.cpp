@@ -9,6 +9,7 @@
 #include <array>
 #include <cerrno>
 #include <chrono>
+#include <span>
 #include <thread>
 
 #include "retry.h"
@@ -20,7 +21,9 @@ namespace {
 using namespace std::chrono_literals;
 
 constexpr size_t read_ahead = 4096;
-constexpr size_t compared_at_once = 65536;
+
+/// For what is read in parts: no memory is asked for, which might not be there.
+using part_buffer = std::array<char, 65536>;
 
 bool write_all(int file, std::string_view text, size_t offset) {
     while (!text.empty()) {
@@ -36,6 +39,40 @@ bool write_all(int file, std::string_view text, size_t offset) {
         text.remove_prefix(static_cast<size_t>(written));
     }
     return true;
+}
+
+/// The part of a file from there on: what the buffer takes, or less at the end. Null data after a
+/// failure.
+std::string_view read_part(int file, size_t offset, std::span<char> buffer) {
+    size_t length = 0;
+    while (length < buffer.size()) {
+        const ssize_t count = retry_interrupted([&] {
+            return pread(file, buffer.data() + length, buffer.size() - length,
+                         static_cast<off_t>(offset + length));
+        });
+        if (count < 0) {
+            return {};
+        }
+        if (count == 0) {
+            break;
+        }
+        length += static_cast<size_t>(count);
+    }
+    return {buffer.data(), length};
+}
+
+bool copy_from(int other, int file, size_t offset) {
+    part_buffer buffer;
+    for (;;) {
+        const std::string_view part = read_part(other, offset, buffer);
+        if (part.empty()) {
+            return part.data() != nullptr;
+        }
+        if (!write_all(file, part, offset)) {
+            return false;
+        }
+        offset += part.size();
+    }
 }
 
 bool resize(int file, size_t size) {
@@ -113,6 +150,17 @@ bool wait_for_another_time(int file, const timespec& before, struct stat& status
     return true;
 }
 
+/// Puts the head in the place of the mark, and cuts the file to its size.
+bool finish_content(int file, std::string_view head, size_t place, size_t size) {
+    // The mark, and what takes its place, is less than the system writes at once: it is there, or
+    // it isn't. Blank lines fill the place when the text is shorter.
+    std::array<char, longest_mark> filled;
+    filled.fill('\n');
+    head.copy(filled.data(), filled.size());
+    return resize(file, std::max(size, place)) && write_all(file, {filled.data(), place}, 0) &&
+           (size >= place || resize(file, size));
+}
+
 }  // namespace
 
 bool read_all(int file, size_t expected, std::string& text) {
@@ -160,31 +208,35 @@ bool reserve(int file, size_t present, size_t wanted) {
 }
 
 bool replace_content(int file, std::string_view text, std::string_view mark) {
-    // The mark, and what takes its place, is less than the system writes at once: it is there, or
-    // it isn't. Blank lines fill the place when the text is shorter.
-    std::array<char, longest_mark> head;
-    head.fill('\n');
-    const size_t place = std::min(mark.size(), head.size());
-    const size_t shared = std::min(text.size(), place);
-    text.copy(head.data(), shared);
-    return write_all(file, mark, 0) && write_all(file, text.substr(shared), place) &&
-           resize(file, std::max(text.size(), place)) && write_all(file, {head.data(), place}, 0) &&
-           (text.size() >= place || resize(file, text.size()));
+    const size_t place = mark.size();
+    const std::string_view head = text.substr(0, place);
+    return write_all(file, mark, 0) && write_all(file, text.substr(head.size()), place) &&
+           finish_content(file, head, place, text.size());
+}
+
+bool replace_content(int file, int other, std::string_view mark) {
+    std::array<char, longest_mark> buffer;
+    const size_t place = mark.size();
+    const std::string_view head = read_part(other, 0, std::span(buffer).first(place));
+    struct stat status;
+    if (head.data() == nullptr || fstat(other, &status) != 0) {
+        return false;
+    }
+    return write_all(file, mark, 0) && copy_from(other, file, place) &&
+           finish_content(file, head, place, static_cast<size_t>(status.st_size));
 }
 
 bool is_content(int file, std::string_view text, bool& is_so) {
-    std::array<char, compared_at_once> part;  // no memory is asked for, which might not be there
+    part_buffer buffer;
     size_t offset = 0;
     for (is_so = true; is_so;) {
-        const ssize_t count = retry_interrupted(
-            [&] { return pread(file, part.data(), part.size(), static_cast<off_t>(offset)); });
-        if (count <= 0) {
+        const std::string_view part = read_part(file, offset, buffer);
+        if (part.empty()) {
             is_so = offset == text.size();
-            return count == 0;
+            return part.data() != nullptr;
         }
-        const std::string_view expected = text.substr(offset, static_cast<size_t>(count));
-        is_so = std::string_view(part.data(), static_cast<size_t>(count)) == expected;
-        offset += static_cast<size_t>(count);
+        is_so = part == text.substr(offset, part.size());
+        offset += part.size();
     }
     return true;
 }

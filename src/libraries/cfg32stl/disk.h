@@ -28,6 +28,9 @@ inline constexpr size_t longest_mark = 128;
 /// there is one.
 bool replace_content(int file, std::string_view text, std::string_view mark = {});
 
+/// The same with what another file holds.
+bool replace_content(int file, int other, std::string_view mark);
+
 /// Tells whether the text is the file's whole content.
 bool is_content(int file, std::string_view text, bool& is_so);
 

@@ -178,8 +178,8 @@ template <class Source>
         if (!next.is_continuation()) {
             in.go_back(before);
             const std::string_view text = value_memory_;
-            value = is_in_ascii_ ? without_trailing_ascii_space(text)
-                                 : without_trailing_space(text);
+            value =
+                is_in_ascii_ ? without_trailing_ascii_space(text) : without_trailing_space(text);
             return last;
         }
         value_memory_ += next.continuation();

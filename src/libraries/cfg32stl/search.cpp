@@ -41,13 +41,14 @@ class wanted_attributes {
         for (; names && *names; ++names) {
             names_.emplace_back(*names);
         }
+        if (names_.size() == 1) {
+            only_.emplace(names_.front());
+        }
     }
 
     bool are_all() const { return names_.empty(); }
-    /// The name, if there is but one.
-    std::optional<std::string_view> only() const {
-        return names_.size() == 1 ? std::optional(names_.front()) : std::nullopt;
-    }
+    /// The lines of the only one, if there is but one.
+    const std::optional<line_start>& only() const { return only_; }
     bool have(std::string_view name) const {
         return std::ranges::any_of(names_, [&](std::string_view own) {
             return own.size() == name.size() && equal_without_case(own, name);
@@ -56,6 +57,7 @@ class wanted_attributes {
 
   private:
     std::vector<std::string_view> names_;
+    std::optional<line_start> only_;
 };
 
 /// Appends nodes to a chain.
@@ -99,11 +101,10 @@ bool is_password(const _AttrType* type) {
 /// attribute is one of the few and was asked for by name.
 bool is_decoded(std::string_view name, const LDIF_File& file, const wanted_attributes& wanted) {
     const auto begins_name = [&](std::string_view prefix) {
-        return compare_without_case(name.substr(0, prefix.size()), prefix) == 0;
+        return equal_without_case(name.substr(0, prefix.size()), prefix);
     };
-    return file.getAuthentication() != 0 && wanted.have(name) &&
-           std::ranges::any_of(decoded_names, begins_name) &&
-           is_password(attribute_name(name).type());
+    return std::ranges::any_of(decoded_names, begins_name) && file.getAuthentication() != 0 &&
+           wanted.have(name) && is_password(attribute_name(name).type());
 }
 
 /// The password in clear, allocated by the password routine with malloc.
@@ -176,8 +177,8 @@ void add_lines(const unread_attributes& lines, const wanted_attributes& wanted,
         builder.add(value);
         return false;
     };
-    if (const std::optional<std::string_view> only = wanted.only()) {
-        lines.for_each_value_of(*only, add);
+    if (wanted.only()) {
+        lines.for_each_value_of(*wanted.only(), add);
     } else {
         lines.for_each_value(add);
     }
@@ -192,16 +193,15 @@ void add_attributes(const LDIF_Entry& entry, attribute_builder builder) {
     }
 }
 
-void add_entries(const std::vector<const LDIF_Entry*>& found, const search_context& context,
-                 CfgMessage** first) {
+void add_entries(const found_entries& found, const search_context& context, CfgMessage** first) {
     message_chain entries(first);
     for (const LDIF_Entry* entry : found) {
         CfgMessage& node = entries.append(entry_message);
         const kept_dn& dn = entry->named_dn();
         node.text = dn.is_simple() ? copy_of(dn.text()) : copy_of(dn.parsed().str());
         const attribute_builder builder(context, node);
-        if (entry->has_unread_lines()) {
-            add_lines(entry->unread_lines(), context.wanted, builder);
+        if (const unread_attributes* lines = entry->printed_lines()) {
+            add_lines(*lines, context.wanted, builder);
         } else {
             add_attributes(*entry, builder);
         }
@@ -220,8 +220,7 @@ LDIF_Search_Results::Scope scope_of(int number) {
 }
 
 /// Builds the result, or releases what was built of it.
-int build(const std::vector<const LDIF_Entry*>& found, const search_context& context,
-          CfgMessage** result) {
+int build(const found_entries& found, const search_context& context, CfgMessage** result) {
     const auto release = [&] {
         cfg_msgfree(*result);
         *result = nullptr;
@@ -252,8 +251,7 @@ int cfg_search_s(CfgHandle* handle, const char* base, int scope, const char* fil
         const LDIF_DN dn{cisString(base)};
         const LDIF_Filter wanted_entries{std::string(filter ? filter : "")};
         const wanted_attributes wanted(attrs);
-        const std::vector<const LDIF_Entry*> found =
-            file.matches(dn, scope_of(scope), wanted_entries);
+        const found_entries& found = file.matches(dn, scope_of(scope), wanted_entries);
         return build(found, {file, wanted, handle->keyData}, result);
     });
 }

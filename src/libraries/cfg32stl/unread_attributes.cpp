@@ -1,7 +1,6 @@
 #include "unread_attributes.h"
 
 #include <algorithm>
-#include <limits>
 #include <utility>
 
 #include "LDIF_Comment.h"
@@ -13,11 +12,23 @@
 
 namespace cfg32 {
 
+line_start::line_start(std::string_view name) {
+    const bool can_stand_there = !name.starts_with('#') && name.find(':') == name.npos;
+    name_size_ = can_stand_there ? name.size() : 0;
+    text_ = can_stand_there ? std::string(name).append(separator) : "\n";  // which begins no line
+}
+
+bool line_start::begins_in_other_case(std::string_view lines) const {
+    return lines.size() > name_size_ && lines.substr(name_size_).starts_with(separator) &&
+           equal_without_case(lines.substr(0, name_size_),
+                              std::string_view(text_).substr(0, name_size_));
+}
+
 LDIF_Attributes unread_attributes::read() const {
     LDIF_Attributes::list attributes;
     attributes.reserve(usual_attributes);
     LDIF_Comment pending;
-    line_source source(given_text::lasting(text()));
+    line_source source(text_.given());
     logical_line line;
     for (int last = line.next(source, 0); line.type != LDIF_Line::endOfFile;
          last = line.next(source, last)) {
@@ -30,6 +41,41 @@ LDIF_Attributes unread_attributes::read() const {
         pending.clear();
     }
     return LDIF_Attributes(std::move(attributes));
+}
+
+namespace {
+
+constexpr size_t longest_search = 64;  // line by line
+
+bool is_short(const LDIF_Attributes& attributes) {
+    return attributes.size() <= longest_search &&
+           std::ranges::all_of(attributes, [](const LDIF_Attribute& attribute) {
+               return attribute.values().size() <= LDIF_Values::longest_scan;
+           });
+}
+
+bool begins_with_space(std::string_view text) {
+    return !text.empty() && is_ascii_space(text.front());
+}
+
+/// True for names and values that are what a line of them is read as. They are in ASCII, in one
+/// line and without blanks at the end; folded lines can bring some to the front of a value, and
+/// comments that of a name, which makes no continuation line of it where it stands.
+bool are_read_as_written(const LDIF_Attribute& attribute) {
+    const auto texts = attribute.values().texts();
+    return !begins_with_space(attribute.name().text()) && !texts.empty() &&
+           std::ranges::all_of(texts, [](const kept_text& text) {
+               return !text.empty() && !begins_with_space(text);
+           });
+}
+
+}  // namespace
+
+unread_attributes unread_attributes::printed(const LDIF_Attributes& attributes) const {
+    if (!is_short(attributes) || !std::ranges::all_of(attributes, are_read_as_written)) {
+        return {};
+    }
+    return {attributes.str(), true, key_};
 }
 
 void unread_lines::start(const char* begin) {
@@ -49,8 +95,7 @@ void unread_lines::take_comment(const logical_line& line) {
 
 bool unread_lines::take(const logical_line& line, const char* end) {
     const auto size = static_cast<size_t>(end - begin_);
-    is_open_ = is_open_ && line.has_separator && line.is_in_ascii() && end[-1] == '\n' &&
-               size <= std::numeric_limits<uint32_t>::max();
+    is_open_ = is_open_ && line.has_separator && line.is_in_ascii() && end[-1] == '\n';
     if (!is_open_) {
         return false;
     }
