@@ -35,7 +35,7 @@ struct unread : store_test {
 };
 
 /// True while nobody has looked at the attributes, if their lines are printed as they stand.
-bool has_canonical_lines(const LDIF_Entry& entry) { return entry.unread_lines().is_canonical(); }
+bool has_canonical_lines(const LDIF_Entry& entry) { return entry.unread().is_canonical(); }
 
 /// The lines as attributes, read one by one.
 LDIF_Attributes read_at_once(const std::string& lines) {
@@ -165,7 +165,7 @@ TEST_F(unread, LinesThatAreWrittenOtherwiseAreWrittenAnewOnce) {
         ASSERT_FALSE(has_canonical_lines(entry)) << row.lines;
         EXPECT_TRUE(LDIF_Filter("(cn=*)").match(entry)) << row.lines;
         ASSERT_TRUE(has_canonical_lines(entry)) << row.lines;
-        EXPECT_EQ(entry.unread_lines().text(), row.printed);
+        EXPECT_EQ(entry.unread().text(), row.printed);
         EXPECT_EQ(entry.str(), dn_line + row.printed + "\n");
         EXPECT_EQ(entry.attributes().str(), row.printed);
         EXPECT_EQ(entry.str(), dn_line + row.printed + "\n");
@@ -187,7 +187,7 @@ TEST_F(unread, WhatWouldNotBeReadAsItIsWrittenIsNotWrittenAnew) {
         const auto file = store_of(lines);
         const LDIF_Entry& entry = entry_of(*file);
         EXPECT_FALSE(LDIF_Filter("(ou=*)").match(entry)) << lines;
-        EXPECT_TRUE(entry.unread_lines().empty()) << lines;
+        EXPECT_TRUE(entry.unread().empty()) << lines;
         EXPECT_EQ(entry.attributes().str(), read_at_once(lines).str());
     }
 }

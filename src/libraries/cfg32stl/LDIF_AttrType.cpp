@@ -202,7 +202,8 @@ namespace {
 
 const name_table& table() {
     // Initialised once, also when many threads make the first look-up together.
-    static const name_table names;
+    // Nor is it released: what is called when the process ends may still look something up.
+    static const name_table& names = *new name_table;
     return names;
 }
 

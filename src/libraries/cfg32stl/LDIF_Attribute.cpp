@@ -43,6 +43,10 @@ LDIF_Attribute::LDIF_Attribute(aes_key_data* key, attribute_name name, const giv
     }
 }
 
+LDIF_Attribute::LDIF_Attribute(LDIF_Values&& values, LDIF_Comment&& comment)
+    : comment_(comment.empty() ? nullptr : std::make_unique<LDIF_Comment>(std::move(comment))),
+      values_(std::move(values)) {}
+
 LDIF_Attribute::LDIF_Attribute(const LDIF_Attribute& other)
     : comment_(other.comment_ ? std::make_unique<LDIF_Comment>(*other.comment_) : nullptr),
       values_(other.values_) {}

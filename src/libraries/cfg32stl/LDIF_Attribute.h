@@ -18,6 +18,7 @@ class LDIF_Attribute {
     /// thrown.
     LDIF_Attribute(aes_key_data* key, cfg32::attribute_name name, const cfg32::given_text& value,
                    LDIF_Comment&& comment);
+    LDIF_Attribute(LDIF_Values&& values, LDIF_Comment&& comment);
     LDIF_Attribute(const LDIF_Attribute& other);
     LDIF_Attribute(LDIF_Attribute&&) noexcept = default;
     LDIF_Attribute& operator=(const LDIF_Attribute& other);

@@ -16,9 +16,7 @@ constexpr failure not_a_child{80, 1000, "["};
 /// The line's DN, if the line is one.
 kept_dn dn_of(const LDIF_Line& line) {
     if (line.type != LDIF_Line::dn) {
-        const bool is_attribute = line.type == LDIF_Line::attr;
-        raise(illegal_line,
-              std::string(is_attribute ? "attribute" : line_type_name(line.type)) + " );");
+        raise(illegal_line, std::string(line_type_name(line.type)) + " );");
     }
     return kept_dn(given_text(line.value));
 }

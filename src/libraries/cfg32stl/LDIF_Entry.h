@@ -91,7 +91,7 @@ class LDIF_Entry {
     LDIF_Attributes& attributes() { return read_attributes(); }
     /// Makes these the attributes, instead of what there was.
     void leave_unread(cfg32::unread_attributes&& lines) { unread_ = std::move(lines); }
-    const cfg32::unread_attributes& unread_lines() const { return unread_; }
+    const cfg32::unread_attributes& unread() const { return unread_; }
     /// The attribute lines as they are printed, until somebody looks at the attributes; null if
     /// there are none. Lines that are written otherwise are written anew for it.
     const cfg32::unread_attributes* printed_lines() const {

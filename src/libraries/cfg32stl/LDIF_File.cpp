@@ -58,7 +58,7 @@ class loader {
     int line_number_ = 0;
     const char* end_of_line_ = nullptr;
     LDIF_Entry::list open_;  // the entry that attribute lines belong to, if there is one
-    unread_lines lines_;     // of that entry
+    unread_checker lines_;   // of that entry
     bool version_seen_ = false;
     bool charset_seen_ = false;
     bool done_ = false;

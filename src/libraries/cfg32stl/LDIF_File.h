@@ -135,6 +135,7 @@ class LDIF_File {
     };
 
     backup back_up(bool is_refreshed);
+    [[noreturn]] void raise_no_backup(int error);
     void write(const std::string& content, const backup& copy, bool is_refreshed);
     void replace_content_of(const std::string& expected, const std::string& content);
     std::string locked_content();

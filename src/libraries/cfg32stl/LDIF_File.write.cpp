@@ -146,7 +146,11 @@ LDIF_File::backup LDIF_File::back_up(bool is_refreshed) {
         raise_with(no_status_for_backup, {}, name_file_and_errno(errno));
     }
     if (lock_) {
-        require_finished(first_bytes(lock_.get(), unfinished_mark.size()));
+        std::string begin;
+        if (!read_first(lock_.get(), unfinished_mark.size(), begin)) {
+            raise_no_backup(errno);
+        }
+        require_finished(begin);
         require_own(status, is_refreshed);
     }
     char owner_buffer[name_buffer_size];
@@ -163,6 +167,10 @@ LDIF_File::backup LDIF_File::back_up(bool is_refreshed) {
     if (lock_ && stat(name, &status) == 0) {
         require_own(status, is_refreshed);  // a copy of what is being written is none
     }
+    raise_no_backup(error);
+}
+
+void LDIF_File::raise_no_backup(int error) {
     raise_with(no_backup, formatted("Unable to backup the configuration file: \"%s\" ", file_name_),
                name_file_and_errno(error));
 }

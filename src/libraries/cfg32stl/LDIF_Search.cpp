@@ -111,7 +111,7 @@ bool LDIF_Filter::is_wanted(std::string_view value, aes_key_data* key) const {
 
 const LDIF_Value& LDIF_Filter::wanted_value(aes_key_data* key) const {
     if (!wanted_ || wanted_->key != key) {
-        wanted_.emplace(attribute_.type(), value_, key);
+        wanted_.emplace(attribute_.type(), value_.c_str(), key);  // a text ends at its NUL
         equal_ = equal_texts_of(*attribute_.type());
     }
     return *wanted_;
@@ -182,7 +182,7 @@ void cfg32::find_matches(const LDIF_Entry& base, LDIF_Search_Results::Scope scop
             const LDIF_Entry& entry = *next++;
             if (next != parent->children().end()) {
                 // Entries and their texts are far apart: the memory has time to answer.
-                __builtin_prefetch(next->unread_lines().text().data());
+                __builtin_prefetch(next->unread().text().data());
                 __builtin_prefetch(&*std::next(next));
             }
             if (match(entry)) {

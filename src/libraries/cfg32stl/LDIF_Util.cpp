@@ -3,6 +3,7 @@
 #include <strings.h>
 
 #include <algorithm>
+#include <array>
 #include <cctype>
 #include <cstdlib>
 #include <cwchar>
@@ -196,15 +197,30 @@ int compare_without_case(std::string_view left, std::string_view right) {
     return left.size() > common ? 1 : -1;
 }
 
+namespace {
+
+/// For each byte one of those that strcasecmp() takes for equal in some locale. Hashes are kept
+/// while the process may change its locale: they must fit the equality of each. Turkish has an I
+/// with and one without a dot, and the character sets of one byte have letters beyond ASCII.
+constexpr std::array<unsigned char, 256> case_classes = [] {
+    constexpr unsigned char any_letter = 0x80;
+    std::array<unsigned char, 256> classes{};
+    for (size_t c = 0; c < classes.size(); ++c) {
+        const bool is_upper = c >= 'A' && c <= 'Z';
+        const size_t lower = is_upper ? c - 'A' + 'a' : c;
+        classes[c] = lower == 'i' || c > 0x7f ? any_letter : static_cast<unsigned char>(lower);
+    }
+    return classes;
+}();
+
+}  // namespace
+
 size_t hash_without_case(std::string_view text, size_t seed) {
-    // FNV-1a. The case is folded by the locale, as strcasecmp does; this is the table of tolower().
-    const int32_t* const lower_case = *__ctype_tolower_loc();
-    for (const char c : text) {
+    for (const char c : text) {  // FNV-1a
         if (c == '\0') {
             break;
         }
-        const int folded = lower_case[static_cast<unsigned char>(c)];
-        seed = (seed ^ static_cast<size_t>(folded)) * 0x100000001b3;
+        seed = (seed ^ case_classes[static_cast<unsigned char>(c)]) * 0x100000001b3;
     }
     return seed;
 }

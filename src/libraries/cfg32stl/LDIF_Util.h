@@ -135,8 +135,8 @@ inline bool equal_without_case(std::string_view left, std::string_view right) {
            compare_without_case(left, right) == 0;
 }
 
-/// A hash that is the same for texts that are equal without regard to case; seed continues another
-/// hash.
+/// A hash that is the same for texts that are equal without regard to case in whichever locale;
+/// seed continues another hash.
 size_t hash_without_case(std::string_view text, size_t seed = 0xcbf29ce484222325);
 
 /// The value of a hexadecimal digit, or -1.

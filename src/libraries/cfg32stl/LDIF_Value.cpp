@@ -219,8 +219,7 @@ LDIF_Values& LDIF_Values::merge(const LDIF_Values& other, bool takes_over) {
             const given_text given = other.texts()[i].given();
             text = given;
             // A text that was kept as it was given has passed the syntax already.
-            takes_over&& given.lasts() ? append(LDIF_Value::stored(type(), text, key_))
-                                       : add(given_text(text));
+            takes_over&& given.lasts() ? add_stored(given) : add(given_text(text));
         }
     };
     const auto in_context = [&] {
@@ -281,6 +280,16 @@ LDIF_Values::several& LDIF_Values::more_than_a_text() {
         several_ = std::move(all);
     }
     return *several_;
+}
+
+void LDIF_Values::add_stored(const given_text& text) {
+    if (empty() && !several_) {
+        first_ = text;
+        return;
+    }
+    LDIF_Value value = LDIF_Value::stored(type(), text, key_);
+    value.text = text;
+    append(std::move(value));
 }
 
 /// Adds the text as a value, unless there is an equal one.

@@ -113,6 +113,8 @@ class LDIF_Values {
     LDIF_Values& operator=(LDIF_Values&&) noexcept = default;
     ~LDIF_Values() = default;
 
+    /// Adds a text that its syntax has stored before, unless there is an equal value.
+    void add_stored(const cfg32::given_text& text);
     // A value is added as text and checked by this list's syntax; an equal one is dropped.
     LDIF_Values& operator+=(const cfg32::given_text& text);
     LDIF_Values& operator+=(const LDIF_Value& value);

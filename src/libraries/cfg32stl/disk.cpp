@@ -186,12 +186,11 @@ bool read_all(int file, size_t expected, std::string& text) {
     }
 }
 
-std::string first_bytes(int file, size_t count) {
-    std::string bytes(count, '\0');
-    const ssize_t got =
-        retry_interrupted([&] { return pread(file, bytes.data(), bytes.size(), 0); });
-    bytes.resize(got < 0 ? 0 : static_cast<size_t>(got));
-    return bytes;
+bool read_first(int file, size_t count, std::string& bytes) {
+    bytes.resize(count);
+    const std::string_view part = read_part(file, 0, bytes);
+    bytes.resize(part.size());
+    return part.data() != nullptr;
 }
 
 bool reserve(int file, size_t present, size_t wanted) {

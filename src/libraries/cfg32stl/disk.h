@@ -14,8 +14,8 @@ namespace cfg32 {
 /// Reads the whole file. expected is a hint of how much there is.
 bool read_all(int file, size_t expected, std::string& text);
 
-/// What the file begins with: so many bytes, or fewer where there are no more.
-std::string first_bytes(int file, size_t count);
+/// Reads what the file begins with: so many bytes, or fewer where there are no more.
+bool read_first(int file, size_t count, std::string& bytes);
 
 /// Takes the room that a text of `wanted` bytes needs in the place of the file's present content.
 /// After a failure the file is what it was.

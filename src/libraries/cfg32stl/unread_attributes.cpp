@@ -36,8 +36,10 @@ LDIF_Attributes unread_attributes::read() const {
             pending.append(line.with_newline());
             continue;
         }
-        attributes.emplace_back(key_, attribute_name(line.attribute), line.value,
-                                std::move(pending));
+        // Not checked again: in another locale it might be refused.
+        LDIF_Values values(attribute_name(line.attribute), key_);
+        values.add_stored(line.value);
+        attributes.emplace_back(std::move(values), std::move(pending));
         pending.clear();
     }
     return LDIF_Attributes(std::move(attributes));
@@ -78,7 +80,7 @@ unread_attributes unread_attributes::printed(const LDIF_Attributes& attributes) 
     return {attributes.str(), true, key_};
 }
 
-void unread_lines::start(const char* begin) {
+void unread_checker::start(const char* begin) {
     begin_ = begin;
     size_ = 0;
     is_open_ = is_sorted_ = is_canonical_ = true;
@@ -87,13 +89,13 @@ void unread_lines::start(const char* begin) {
     last_values_.clear();
 }
 
-void unread_lines::take_comment(const logical_line& line) {
+void unread_checker::take_comment(const logical_line& line) {
     // One that is converted depends on the locale of the moment.
     is_open_ = is_open_ && line.with_newline().lasts();
     is_commented_ = true;
 }
 
-bool unread_lines::take(const logical_line& line, const char* end) {
+bool unread_checker::take(const logical_line& line, const char* end) {
     const auto size = static_cast<size_t>(end - begin_);
     is_open_ = is_open_ && line.has_separator && line.is_in_ascii() && end[-1] == '\n';
     if (!is_open_) {
@@ -114,7 +116,7 @@ bool unread_lines::take(const logical_line& line, const char* end) {
 }
 
 /// Takes the next line's name and value. False for one that must be read at once.
-bool unread_lines::follow(const attribute_name& name, std::string_view value) {
+bool unread_checker::follow(const attribute_name& name, std::string_view value) {
     const int order = last_.compare(name);
     is_sorted_ = is_sorted_ && order <= 0;
     is_canonical_ = is_canonical_ && is_sorted_;
@@ -137,7 +139,7 @@ bool unread_lines::follow(const attribute_name& name, std::string_view value) {
     return true;
 }
 
-bool unread_lines::is_repeated(const _AttrType* type, std::string_view value) const {
+bool unread_checker::is_repeated(const _AttrType* type, std::string_view value) const {
     return std::ranges::any_of(last_values_, [&](std::string_view own) {
         return LDIF_Value::stored(type, own, key_).compare(LDIF_Value::stored(type, value, key_)) ==
                0;

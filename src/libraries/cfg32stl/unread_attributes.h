@@ -118,9 +118,9 @@ void unread_attributes::for_each_value_of(const line_start& start, Use use) cons
 }
 
 /// Checks the attribute lines of an entry that are to be left unread.
-class unread_lines {
+class unread_checker {
   public:
-    explicit unread_lines(aes_key_data* key) : key_(key) {}
+    explicit unread_checker(aes_key_data* key) : key_(key) {}
 
     /// Begins an entry, whose attribute lines start there.
     void start(const char* begin);

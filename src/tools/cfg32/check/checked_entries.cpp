@@ -43,7 +43,8 @@ void checked_entries::add(entry_section& section, LDIF_Attribute&& attribute, in
             report_second_value(*known, line, section.written);
         }
     } else if (is_told) {
-        const LDIF_Value first = *known->values().find(*attribute.values().begin());
+        // Read again, as the load does it: the text of a DN may be that of another one.
+        const LDIF_Value first = *known->values().find(attribute.values().begin()->str());
         problem& found = found_.add(kind::duplicate_value, file_.value_place(line),
                                     "value stands twice, the first one" + on_line(line_of(first)) +
                                         "; the next rewrite drops this one");
