@@ -239,8 +239,9 @@ LDIF_Entry* LDIF_Entry::find(const LDIF_DN& dn) {
     return const_cast<LDIF_Entry*>(std::as_const(*this).find(dn));
 }
 
-const LDIF_Entry* LDIF_Entry::find(const LDIF_DN& dn) const {
-    const dn_path path(dn);
+const LDIF_Entry* LDIF_Entry::find(const LDIF_DN& dn) const { return find(dn_path(dn)); }
+
+const LDIF_Entry* LDIF_Entry::find(const dn_path& path) const {
     if (!leads_to(path, 0)) {
         return nullptr;
     }

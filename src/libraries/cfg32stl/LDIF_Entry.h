@@ -70,6 +70,7 @@ class LDIF_Entry {
     /// null.
     virtual LDIF_Entry* find(const LDIF_DN& dn);
     const LDIF_Entry* find(const LDIF_DN& dn) const;
+    const LDIF_Entry* find(const cfg32::dn_path& path) const;
 
     /// The child whose relative DN that is, or null.
     LDIF_Entry* child(const LDIF_DN& relative_dn);

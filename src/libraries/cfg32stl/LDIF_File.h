@@ -91,7 +91,7 @@ class LDIF_File {
 
     /// The entries themselves, which stay this file's until it is changed or refreshed; the list
     /// does until the next one. Throws the same.
-    const cfg32::found_entries& matches(const LDIF_DN& base,
+    const cfg32::found_entries& matches(const cfg32::dn_path& base,
                                         const LDIF_Search_Results::Scope& scope,
                                         const LDIF_Filter& filter) const;
 
@@ -115,7 +115,7 @@ class LDIF_File {
     LDIF_File(const std::string& fileName, const std::string& backupFileName, not_loaded)
         : file_name_(fileName), backup_file_name_(backupFileName), key_(nullptr) {}
 
-    const LDIF_Entry& base_entry(const LDIF_DN& dn) const;
+    const LDIF_Entry& base_entry(const cfg32::dn_path& dn) const;
     bool is_current(const struct stat& status) const;
     bool load_if_changed();
     cfg32::locked_file locked(int flags, int operation) const;

@@ -88,8 +88,8 @@ bool LDIF_Filter::match(const LDIF_Entry& entry) const {
     }
     const LDIF_Value& wanted = wanted_value(values.key());
     if (equal_ && values.size() <= LDIF_Values::longest_scan) {
-        return std::ranges::any_of(
-            values.texts(), [&](const kept_text& text) { return is_wanted(text, values.key()); });
+        return std::ranges::any_of(values.texts(),
+                                   [&](const kept_text& text) { return is_equal(text, wanted); });
     }
     return values.find(wanted) != values.end();
 }
@@ -97,23 +97,27 @@ bool LDIF_Filter::match(const LDIF_Entry& entry) const {
 /// The same without reading more of the lines than it takes.
 bool LDIF_Filter::match(const unread_attributes& lines) const {
     bool is_found = false;
-    lines.for_each_value_of(start_, [&](std::string_view, std::string_view value) {
-        return is_found = any_value_ || is_wanted(value, lines.key());
+    if (any_value_) {
+        lines.for_each_value_of(start_, [&](auto, auto) { return is_found = true; });
+        return is_found;
+    }
+    lines.for_each_value_of(start_, [&](auto, std::string_view value) {
+        const LDIF_Value& wanted = wanted_value(lines.key());
+        // A line has no NUL, behind which anything may stand in texts that are equal.
+        const bool may_be_equal = !equal_ || value.size() == wanted.text.size();
+        return is_found = may_be_equal && is_equal(value, wanted);
     });
     return is_found;
 }
 
-bool LDIF_Filter::is_wanted(std::string_view value, aes_key_data* key) const {
-    const LDIF_Value& wanted = wanted_value(key);
+bool LDIF_Filter::is_equal(std::string_view value, const LDIF_Value& wanted) const {
     return equal_ ? equal_(value, wanted.text)
-                  : LDIF_Value::stored(wanted.attrType, value, key).compare(wanted) == 0;
+                  : LDIF_Value::stored(wanted.attrType, value, wanted.key).compare(wanted) == 0;
 }
 
-const LDIF_Value& LDIF_Filter::wanted_value(aes_key_data* key) const {
-    if (!wanted_ || wanted_->key != key) {
-        wanted_.emplace(attribute_.type(), value_.c_str(), key);  // a text ends at its NUL
-        equal_ = equal_texts_of(*attribute_.type());
-    }
+const LDIF_Value& LDIF_Filter::make_wanted_value(aes_key_data* key) const {
+    wanted_.emplace(attribute_.type(), value_.c_str(), key);  // a text ends at its NUL
+    equal_ = equal_texts_of(*attribute_.type());
     return *wanted_;
 }
 
@@ -183,7 +187,6 @@ void cfg32::find_matches(const LDIF_Entry& base, LDIF_Search_Results::Scope scop
             if (next != parent->children().end()) {
                 // Entries and their texts are far apart: the memory has time to answer.
                 __builtin_prefetch(next->unread().text().data());
-                __builtin_prefetch(&*std::next(next));
             }
             if (match(entry)) {
                 found.push_back(&entry);
@@ -237,13 +240,13 @@ LDIF_Search_Results LDIF_File::search(const LDIF_DN& base, const LDIF_Search_Res
                                       bool attributesOnly) const {
     const auto body = [&] {
         LDIF_Search_Results results(scope, filter, attributes, attributesOnly);
-        results += base_entry(base);
+        results += base_entry(dn_path(base));
         return results;
     };
     return with_system_error(in("LDIF_File::search()"), body, no_details);
 }
 
-const found_entries& LDIF_File::matches(const LDIF_DN& base,
+const found_entries& LDIF_File::matches(const dn_path& base,
                                         const LDIF_Search_Results::Scope& scope,
                                         const LDIF_Filter& filter) const {
     const auto body = [&] { find_matches(base_entry(base), scope, filter, found_); };
@@ -251,7 +254,7 @@ const found_entries& LDIF_File::matches(const LDIF_DN& base,
     return found_;
 }
 
-const LDIF_Entry& LDIF_File::base_entry(const LDIF_DN& dn) const {
+const LDIF_Entry& LDIF_File::base_entry(const dn_path& dn) const {
     const LDIF_Entry* entry = root_.find(dn);
     if (!entry) {
         raise(no_base);

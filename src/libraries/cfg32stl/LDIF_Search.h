@@ -32,15 +32,19 @@ class LDIF_Filter {
 
   private:
     bool match(const cfg32::unread_attributes& lines) const;
-    bool is_wanted(std::string_view value, aes_key_data* key) const;
-    const LDIF_Value& wanted_value(aes_key_data* key) const;
+    bool is_equal(std::string_view value, const LDIF_Value& wanted) const;
+    const LDIF_Value& wanted_value(aes_key_data* key) const {
+        return wanted_ && wanted_->key == key ? *wanted_ : make_wanted_value(key);
+    }
+    const LDIF_Value& make_wanted_value(aes_key_data* key) const;
 
     cfg32::attribute_name attribute_{"objectclass"};
     cfg32::line_start start_{"objectclass"};  // of that attribute's lines
     std::string value_;
-    bool any_value_ = true;                        // the attribute's presence is all that counts
-    mutable std::optional<LDIF_Value> wanted_;     // the value, once there is one to compare with
-    mutable cfg32::equal_texts* equal_ = nullptr;  // then
+    bool any_value_ = true;  // the attribute's presence is all that counts
+    // Made once there is a value to compare with.
+    mutable std::optional<LDIF_Value> wanted_;
+    mutable cfg32::equal_texts* equal_ = nullptr;
 };
 
 /// The names of the wanted attributes; empty means all.

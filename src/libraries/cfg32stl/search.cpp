@@ -103,8 +103,9 @@ bool is_decoded(std::string_view name, const LDIF_File& file, const wanted_attri
     const auto begins_name = [&](std::string_view prefix) {
         return equal_without_case(name.substr(0, prefix.size()), prefix);
     };
-    return std::ranges::any_of(decoded_names, begins_name) && file.getAuthentication() != 0 &&
-           wanted.have(name) && is_password(attribute_name(name).type());
+    return !wanted.are_all() && std::ranges::any_of(decoded_names, begins_name) &&
+           file.getAuthentication() != 0 && wanted.have(name) &&
+           is_password(attribute_name(name).type());
 }
 
 /// The password in clear, allocated by the password routine with malloc.
@@ -248,7 +249,7 @@ int cfg_search_s(CfgHandle* handle, const char* base, int scope, const char* fil
         }
         *result = nullptr;
         file.refresh();
-        const LDIF_DN dn{cisString(base)};
+        const dn_path dn{std::string_view(base)};
         const LDIF_Filter wanted_entries{std::string(filter ? filter : "")};
         const wanted_attributes wanted(attrs);
         const found_entries& found = file.matches(dn, scope_of(scope), wanted_entries);
