@@ -105,7 +105,7 @@ dn_path::dn_path(const LDIF_DN& dn) : size_(dn.rdns().size()), dn_(&dn) {
 dn_path::dn_path(const kept_dn& dn) : size_(dn.size()) {
     if (dn.is_simple()) {
         text_ = dn.text();
-        read_simple(text_, begins_);
+        find_rdns();
     } else {
         dn_ = &dn.parsed();
     }
@@ -146,6 +146,16 @@ std::optional<size_t> dn_path::read_simple(std::string_view text, places& begins
         begin += separator.size();
     }
     return std::nullopt;
+}
+
+/// The same of a text that is known to be simple: there a comma is that of a separator.
+void dn_path::find_rdns() {
+    size_t begin = 0;
+    begins_[0] = 0;
+    for (size_t count = 1; count <= size_; ++count) {
+        begin = std::min(text_.find(separator.front(), begin), text_.size()) + separator.size();
+        begins_[count] = static_cast<uint32_t>(begin);
+    }
 }
 
 /// The text of the RDNs from `from` up to `to`, of a simple DN.

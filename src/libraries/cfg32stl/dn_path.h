@@ -86,6 +86,7 @@ class dn_path {
     using places = std::array<uint32_t, most_rdns + 1>;
 
     static std::optional<size_t> read_simple(std::string_view text, places& begins);
+    void find_rdns();
     std::string_view part(size_t from, size_t to) const;
     int compare_rdn(size_t i, const dn_path& other) const;
     bool is_simple() const { return text_.data(); }
