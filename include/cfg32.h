@@ -54,7 +54,9 @@
  *     CFG_OPT_SHOW_STACK.
  *  9. Locale. cfg_init() calls setlocale(LC_ALL, "") under the server's locale lock: the text of
  *     the file is read in the character set of the environment. As setlocale() changes the whole
- *     process, make handles while no other thread is in a call of this library.
+ *     process, make handles while no other thread is in a call of this library. In a process that
+ *     chooses another locale later, names and values are compared as in that; what is read already
+ *     is not read again for it.
  * 10. No C++ exception leaves a call.
  */
 #ifndef CFG32_H

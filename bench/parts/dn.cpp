@@ -3,6 +3,7 @@
 #include <benchmark/benchmark.h>
 
 #include "LDIF_DN.h"
+#include "dn_path.h"
 #include "generated_text.h"
 
 namespace {
@@ -43,5 +44,25 @@ void hash_dn(benchmark::State& state) {
     }
 }
 BENCHMARK(hash_dn);
+
+void keep_plain_dn(benchmark::State& state) {
+    for (auto each : state) {
+        benchmark::DoNotOptimize(cfg32::kept_dn(cfg32::given_text::lasting(text.text())));
+    }
+}
+BENCHMARK(keep_plain_dn);
+
+void hash_plain_dn(benchmark::State& state) {
+    const cfg32::kept_dn dn(cfg32::given_text::lasting(text.text()));
+    for (auto each : state) {
+        const cfg32::dn_path path(dn);
+        size_t hash = 0;
+        for (size_t i = 0; i < path.size(); ++i) {
+            hash = path.hash(i, hash);
+        }
+        benchmark::DoNotOptimize(hash);
+    }
+}
+BENCHMARK(hash_plain_dn);
 
 }  // namespace

@@ -1,41 +1,16 @@
-// The file in memory: load, search, serialise, update.
+// The file in memory: load, search, serialise.
 
 #include <benchmark/benchmark.h>
-#include <unistd.h>
-
-#include <filesystem>
-#include <fstream>
 
 #include "LDIF_File.h"
-#include "cfg32.h"
 #include "generated_text.h"
+#include "scratch_file.h"
 
 namespace {
 
 using cfg32::bench::configuration_text;
-using cfg32::bench::dn_of;
+using cfg32::bench::scratch_file;
 using cfg32::bench::shape;
-
-/// A file in a folder of its own, removed at the end.
-class scratch_file {
-  public:
-    explicit scratch_file(const std::string& text) {
-        std::string folder = std::filesystem::temp_directory_path() / "cfg32-bench-XXXXXX";
-        if (!mkdtemp(folder.data())) {
-            throw std::filesystem::filesystem_error("mkdtemp", {});
-        }
-        folder_ = folder;
-        std::ofstream(name(), std::ios::binary) << text;
-    }
-    scratch_file(const scratch_file&) = delete;
-    scratch_file& operator=(const scratch_file&) = delete;
-    ~scratch_file() { std::filesystem::remove_all(folder_); }
-
-    std::string name() const { return folder_ / "conf"; }
-
-  private:
-    std::filesystem::path folder_;
-};
 
 void load_file(benchmark::State& state, shape how) {
     const std::string text = configuration_text(static_cast<size_t>(state.range(0)), how);
@@ -75,27 +50,5 @@ void serialise(benchmark::State& state) {
     state.SetBytesProcessed(static_cast<int64_t>(size));
 }
 BENCHMARK(serialise)->Unit(benchmark::kMicrosecond);
-
-void update_file(benchmark::State& state) {
-    const scratch_file file(configuration_text(static_cast<size_t>(state.range(0)), shape::flat));
-    LDIF_File loaded(file.name(), file.name() + ".bak", nullptr);
-    const LDIF_DN dn = cisString(dn_of(100, shape::flat));
-    std::string name = "oru-slapdPort";
-    std::string ports[] = {"1", "2"};
-    size_t number = 0;
-    for (auto each : state) {
-        char* values[] = {ports[number++ % 2].data(), nullptr};
-        LDAPMod change{};
-        change.mod_op = LDAP_MOD_REPLACE;
-        change.mod_type = name.data();
-        change.mod_values = values;
-        LDAPMod* changes[] = {&change, nullptr};
-        const LDIF_File::update lock(loaded);
-        loaded.refresh();
-        loaded.modify(dn, changes);
-        loaded.flush();
-    }
-}
-BENCHMARK(update_file)->Arg(300)->Arg(10000)->Unit(benchmark::kMicrosecond);
 
 }  // namespace

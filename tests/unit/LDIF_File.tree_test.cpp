@@ -391,7 +391,7 @@ TEST_F(LDIF_File_treeView, ChainThatIsDeeperThanTheStackIsDrawn) {
         LDIF_Entry* last = &top;
         for (size_t level = 1; level < depth; ++level) {
             *last += LDIF_Entry(dn_of("cn=x,cn=x"));
-            last = last->child(dn_of("cn=x"));
+            last = last->find(dn_of("cn=x,cn=x"));
             ASSERT_TRUE(last);
         }
         std::set<LDIF_DN> undefined;

@@ -88,6 +88,26 @@ TEST(kept_dn, EveryOtherDnIsKeptParsedOrBecomesSimple) {
               "34/1014 Invalid escape sequence: \\q");
 }
 
+TEST(kept_dn, EndsWithADnThatIsPlainlyWrittenThere) {
+    const struct {
+        const char* dn;
+        const char* end;
+        bool is_there;
+    } rows[] = {
+        {"cn=a, o=b", "o=b", true},       {"cn=1, cn=a, o=b", "cn=a, o=b", true},
+        {"cn=1, cn=a, o=b", "o=b", true}, {"o=b", "o=b", false},
+        {"cn=a, o=b", "", false},         {"", "", false},
+        {"cn=a, xo=b", "o=b", false},     {"cn=a, o=b", "o=B", false},
+        {"cn=a + o=b", "o=b", false},     {"o=b", "cn=a, o=b", false},
+        {"cn=\\20, o=b", "o=b", false},   {"cn=a, o=\\20", "o=\\20", false},
+        {"cn=a\\, o\\=b", "o=b", false},  {"cn=a, o=bb", "o=b", false},
+    };
+    for (const auto& row : rows) {
+        EXPECT_EQ(kept_dn(given_text(row.dn)).ends_with(kept_dn(given_text(row.end))), row.is_there)
+            << row.dn << " and " << row.end;
+    }
+}
+
 TEST(kept_dn, PrintsWhatTheDnPrints) {
     random_texts texts(1);
     for (int i = 0; i < 500; ++i) {

@@ -106,6 +106,11 @@ LDIF_Entry& LDIF_Entry::place(list& node) {
                : hang(node, dn, child.depth_ + relative_size());
 }
 
+LDIF_Entry* LDIF_Entry::place_below(list& node) {
+    const kept_dn& dn = node.front().dn_;
+    return dn.ends_with(dn_) ? &hang(node, dn_path(dn), dn_.size()) : nullptr;
+}
+
 /// True when the relative DN stands in the other DN from that RDN on.
 bool LDIF_Entry::leads_to(const dn_path& dn, size_t from) const {
     return relative_size() == 0 || dn_path(dn_).has_equal_part(depth_, dn, from, relative_size());
@@ -252,11 +257,6 @@ const LDIF_Entry* LDIF_Entry::find(const dn_path& path) const {
         depth += entry ? entry->relative_size() : 0;
     }
     return entry;
-}
-
-LDIF_Entry* LDIF_Entry::child(const LDIF_DN& relative_dn) {
-    LDIF_Entry* found = index_ ? index_->equal_or_ancestor(dn_path(relative_dn), 0) : nullptr;
-    return found && found->relative_size() == relative_dn.rdns().size() ? found : nullptr;
 }
 
 void LDIF_Entry::erase(LDIF_Entry& child) {

@@ -55,6 +55,9 @@ class LDIF_Entry {
 
     /// The same of the one entry of node, which is taken out of it unless it was merged.
     LDIF_Entry& place(list& node);
+    /// The same of an entry whose DN is a full one, if that is plainly written as this entry's with
+    /// something before it; null if not. It goes where place() of the tree's root would put it.
+    LDIF_Entry* place_below(list& node);
 
     /// The entry in file form, without its children.
     virtual std::string str() const;
@@ -72,8 +75,6 @@ class LDIF_Entry {
     const LDIF_Entry* find(const LDIF_DN& dn) const;
     const LDIF_Entry* find(const cfg32::dn_path& path) const;
 
-    /// The child whose relative DN that is, or null.
-    LDIF_Entry* child(const LDIF_DN& relative_dn);
     /// Removes a child with everything below it.
     void erase(LDIF_Entry& child);
 
@@ -90,7 +91,7 @@ class LDIF_Entry {
     const LDIF_Comment& comment() const { return comment_; }
     const LDIF_Attributes& attributes() const { return read_attributes(); }
     LDIF_Attributes& attributes() { return read_attributes(); }
-    /// Makes these the attributes, instead of what there was.
+    /// Makes these the attributes of an entry that has none.
     void leave_unread(cfg32::unread_attributes&& lines) { unread_ = std::move(lines); }
     const cfg32::unread_attributes& unread() const { return unread_; }
     /// The attribute lines as they are printed, until somebody looks at the attributes; null if

@@ -58,7 +58,8 @@ class loader {
     int line_number_ = 0;
     const char* end_of_line_ = nullptr;
     LDIF_Entry::list open_;  // the entry that attribute lines belong to, if there is one
-    unread_checker lines_;   // of that entry
+    LDIF_Entry* last_parent_ = nullptr;  // where the entry before went, and the next may go
+    unread_checker lines_;               // of that entry
     bool version_seen_ = false;
     bool charset_seen_ = false;
     bool done_ = false;
@@ -203,10 +204,12 @@ void loader::add_root_attribute(LDIF_Attribute&& attribute) {
 }
 
 void loader::close_entry() {
-    if (!open_.empty()) {
-        root_.place(open_);
-        open_.clear();
+    if (open_.empty()) {
+        return;
     }
+    LDIF_Entry* parent = last_parent_ ? last_parent_->place_below(open_) : nullptr;
+    last_parent_ = parent ? parent : &root_.place(open_);
+    open_.clear();
 }
 
 }  // namespace

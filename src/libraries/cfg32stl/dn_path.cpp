@@ -88,6 +88,15 @@ kept_dn::kept_dn(const kept_dn& other)
 
 LDIF_DN kept_dn::dn() const { return parsed_ ? *parsed_ : LDIF_DN(cisString(text_.str())); }
 
+bool kept_dn::ends_with(const kept_dn& other) const {
+    if (!is_simple() || !other.is_simple() || other.text_.empty() ||
+        text_.size() < other.text_.size()) {
+        return false;
+    }
+    const std::string_view before = text().substr(0, text_.size() - other.text_.size());
+    return before.ends_with(separator) && text().ends_with(other.text());
+}
+
 void kept_dn::append_to(std::string& out) const {
     parsed_ ? parsed_->append_to(out) : static_cast<void>(out += text_.view());
 }

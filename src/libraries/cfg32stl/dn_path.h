@@ -45,6 +45,9 @@ class kept_dn {
     std::string_view text() const { return text_; }
     /// Of another.
     const LDIF_DN& parsed() const { return *parsed_; }
+    /// True when both are simple and the other stands at the end of this one, with an RDN before
+    /// it.
+    bool ends_with(const kept_dn& other) const;
     /// Appends the canonical form; throws what LDIF_DN::str() throws.
     void append_to(std::string& out) const;
 
