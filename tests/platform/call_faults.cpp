@@ -114,11 +114,6 @@ ssize_t __wrap_getrandom(void* buffer, size_t size, unsigned flags) {
     return fails(watched_call::random) ? -1 : __real_getrandom(buffer, size, flags);
 }
 
-int __real_RAND_bytes(unsigned char*, int);
-int __wrap_RAND_bytes(unsigned char* buffer, int size) {
-    return fails(watched_call::random_bytes) ? 0 : __real_RAND_bytes(buffer, size);
-}
-
 int __real_renameat(int, const char*, int, const char*);
 int __wrap_renameat(int from, const char* from_name, int to, const char* to_name) {
     return fails(watched_call::rename) ? -1 : __real_renameat(from, from_name, to, to_name);

@@ -14,7 +14,6 @@ enum class watched_call {
     close,
     copy_range,
     random,
-    random_bytes,
     rename,
     sync,
     write,

@@ -36,7 +36,7 @@ void* allocate_block(void*, uInt count, uInt size) {
 
 void wipe_and_free_block(void*, void* address) {
     auto* block = static_cast<unsigned char*>(address) - block_header;
-    OPENSSL_cleanse(block, *reinterpret_cast<std::size_t*>(block));
+    explicit_bzero(block, *reinterpret_cast<std::size_t*>(block));
     std::free(block);
 }
 

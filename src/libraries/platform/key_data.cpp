@@ -87,6 +87,6 @@ void aes_key_data_free(aes_key_data* key) noexcept {
     if (key == nullptr) {
         return;
     }
-    OPENSSL_cleanse(key, sizeof *key);
+    explicit_bzero(key, sizeof *key);
     std::free(key);
 }

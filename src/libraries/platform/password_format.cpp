@@ -27,7 +27,7 @@ int format_password(int selector, int flag, aes_key_data* key, const char* clear
             room)) {
         return 1;
     }
-    OPENSSL_cleanse(room.data(), room.size());
+    explicit_bzero(room.data(), room.size());
     return 0;
 }
 
@@ -53,7 +53,7 @@ void _slapd_utils_decode_buffer_free(char** clear) noexcept {
     if (clear == nullptr || *clear == nullptr) {
         return;
     }
-    OPENSSL_cleanse(*clear, std::strlen(*clear));
+    explicit_bzero(*clear, std::strlen(*clear));
     std::free(*clear);
     *clear = nullptr;
 }

@@ -1,6 +1,6 @@
 #pragma once
 
-#include <openssl/crypto.h>
+#include <string.h>
 
 #include <algorithm>
 #include <cstddef>
@@ -19,7 +19,7 @@ class wiped_buffer {
     wiped_buffer() = default;
     wiped_buffer(const wiped_buffer&) = delete;
     wiped_buffer& operator=(const wiped_buffer&) = delete;
-    ~wiped_buffer() { OPENSSL_cleanse(bytes_, Capacity); }
+    ~wiped_buffer() { explicit_bzero(bytes_, Capacity); }
 
     static constexpr std::size_t capacity() { return Capacity; }
     std::size_t size() const { return size_; }
