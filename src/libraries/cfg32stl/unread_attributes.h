@@ -1,9 +1,9 @@
 #pragma once
 
-// A load checks every line, but most entries are never asked for, and fewer are changed. So it builds
-// no attributes where it can tell what they will be: the entry keeps the place of their lines.
-// Canonical lines, which are what is printed of the attributes, are searched and printed as they
-// stand; others are read and written anew in that form at their first use.
+// A load checks every line, but most entries are never asked for, and fewer are changed. So it
+// builds no attributes where it can tell what they will be: the entry keeps the place of their
+// lines. Canonical lines, which are what is printed of the attributes, are searched and printed as
+// they stand; others are read and written anew in that form at their first use.
 
 #include <algorithm>
 #include <string>
