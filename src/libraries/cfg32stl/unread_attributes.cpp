@@ -39,8 +39,7 @@ LDIF_Attributes unread_attributes::read() const {
         // Not checked again: in another locale it might be refused.
         LDIF_Values values(attribute_name(line.attribute), key_);
         values.add_stored(line.value);
-        attributes.emplace_back(std::move(values), std::move(pending));
-        pending.clear();
+        attributes.emplace_back(std::move(values), std::exchange(pending, {}));
     }
     return LDIF_Attributes(std::move(attributes));
 }
