@@ -405,6 +405,12 @@ TEST(FindProblems, TellsTheCodesOfAValue) {
 TEST(FindProblems, TellsTheLineOfTheFirst) {
     EXPECT_THAT(only(begun + "cn: configuration\n", kind::duplicate_value).text,
                 HasSubstr("the first one on line 5"));
+    // Such a name reads back as another.
+    EXPECT_THAT(only(begun + "oru-slapdSuffix: o=x\noru-slapdSuffix: cn=a b+ou=z\n"
+                             "oru-slapdSuffix: cn=a b+ou=z\n",
+                     kind::duplicate_value)
+                    .text,
+                HasSubstr("the first one on line 7"));
     EXPECT_THAT(only(begun + "\ndn: cn=Configuration\ncn: x\n", kind::second_value).text,
                 HasSubstr("on line 5"));
     EXPECT_THAT(only(begun + "\ndn: cn=Configuration\n", kind::duplicate_entry).text,
