@@ -178,6 +178,7 @@ void LDIF_Entry::index_children() {
         index_ = std::make_unique<child_index>();
     }
     for (auto child = children_.begin(); child != children_.end(); ++child) {
+        // cppcheck-suppress iterators1  ; the index is one of that list
         index_->insert(child, dn_path(child->dn_));
     }
 }

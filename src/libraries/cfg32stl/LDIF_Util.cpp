@@ -202,10 +202,10 @@ namespace {
 /// For each byte one of those that strcasecmp() takes for equal in some locale. Hashes are kept
 /// while the process may change its locale: they must fit the equality of each. Turkish has an I
 /// with and one without a dot, and the character sets of one byte have letters beyond ASCII.
-constexpr std::array<unsigned char, 256> case_classes = [] {
+constexpr auto case_classes = [] {
     constexpr unsigned char any_letter = 0x80;
     std::array<unsigned char, 256> classes{};
-    for (size_t c = 0; c < classes.size(); ++c) {
+    for (size_t c = 0; c < 256; ++c) {
         const bool is_upper = c >= 'A' && c <= 'Z';
         const size_t lower = is_upper ? c - 'A' + 'a' : c;
         classes[c] = lower == 'i' || c > 0x7f ? any_letter : static_cast<unsigned char>(lower);

@@ -358,10 +358,7 @@ size_t LDIF_Values::position_of(const LDIF_Value& value) const {
 }
 
 size_t LDIF_Values::indexed_position_of(const LDIF_Value& value) const {
-    if (!several_->index) {
-        index_values();
-    }
-    const auto [first, last] = several_->index->equal_range(hash_of(value));
+    const auto [first, last] = index().equal_range(hash_of(value));
     const auto is_equal = [&](const auto& entry) {
         return value_of(entry.second).compare(value) == 0;
     };
@@ -375,12 +372,17 @@ size_t LDIF_Values::indexed_position_of(const LDIF_Value& value) const {
     return static_cast<size_t>(std::ranges::find_if(texts(), is_it) - texts().begin());
 }
 
-void LDIF_Values::index_values() const {
-    auto index = std::make_unique<hash_index>();
-    for (const kept_text& text : texts()) {
-        index->emplace(hash_of(value_of(text)), text);
+/// The index, which is made when it is first asked for.
+const LDIF_Values::hash_index& LDIF_Values::index() const {
+    std::unique_ptr<hash_index>& made = several_->index;
+    if (!made) {
+        auto index = std::make_unique<hash_index>();
+        for (const kept_text& text : texts()) {
+            index->emplace(hash_of(value_of(text)), text);
+        }
+        made = std::move(index);
     }
-    several_->index = std::move(index);
+    return *made;
 }
 
 /// Takes a value out of the index.

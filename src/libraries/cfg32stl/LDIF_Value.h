@@ -169,7 +169,7 @@ class LDIF_Values {
     LDIF_Value value_of(std::string_view text) const;
     size_t position_of(const LDIF_Value& value) const;
     size_t indexed_position_of(const LDIF_Value& value) const;
-    void index_values() const;
+    const hash_index& index() const;
     void forget(std::string_view text);
 
     cfg32::attribute_name name_;
