@@ -37,6 +37,21 @@ struct unread : store_test {
 /// True while nobody has looked at the attributes, if their lines are printed as they stand.
 bool has_canonical_lines(const LDIF_Entry& entry) { return entry.unread().is_canonical(); }
 
+/// Looks again and again, the first, second, ... allocation failing each time, until it is done.
+template <class Look, class IsDone>
+void with_failing_allocations(Look look, IsDone is_done) {
+    for (long which = 0; !is_done(); ++which) {
+        try {
+            failing_allocation failing(which);
+            look();
+        } catch (const LDIF_Exception& e) {
+            EXPECT_EQ(e.sysErrno, ENOMEM) << which;
+        } catch (const std::bad_alloc&) {
+        }
+        ASSERT_LT(which, 100);
+    }
+}
+
 /// The lines as attributes, read one by one.
 LDIF_Attributes read_at_once(const std::string& lines) {
     LDIF_Attributes attributes;
@@ -293,16 +308,8 @@ TEST_F(unread, ACopyOutlivesTheStore) {
 TEST_F(unread, ExhaustedMemoryLeavesTheLinesToBeWrittenAnewLater) {
     const auto file = store_of("sn: c\n# c\ncn: a\ncn: b\nunknown: d\n");
     const LDIF_Entry& entry = entry_of(*file);
-    for (long which = 0; !has_canonical_lines(entry); ++which) {
-        try {
-            failing_allocation failing(which);
-            entry.printed_lines();
-        } catch (const LDIF_Exception& e) {
-            EXPECT_EQ(e.sysErrno, ENOMEM) << which;
-        } catch (const std::bad_alloc&) {
-        }
-        ASSERT_LT(which, 100);
-    }
+    with_failing_allocations([&] { entry.printed_lines(); },
+                             [&] { return has_canonical_lines(entry); });
     EXPECT_EQ(entry.attributes().str(), "# c\ncn: a\ncn: b\nsn: c\nunknown: d\n");
 }
 
@@ -310,16 +317,8 @@ TEST_F(unread, ExhaustedMemoryLeavesTheLinesToBeReadLater) {
     const std::string lines = "# c\ncn: a\ncn: b\nsn: c\nunknown: d\n";
     const auto file = store_of(lines);
     const LDIF_Entry& entry = entry_of(*file);
-    for (long which = 0; has_canonical_lines(entry); ++which) {
-        try {
-            failing_allocation failing(which);
-            entry.attributes();
-        } catch (const LDIF_Exception& e) {
-            EXPECT_EQ(e.sysErrno, ENOMEM) << which;
-        } catch (const std::bad_alloc&) {
-        }
-        ASSERT_LT(which, 100);
-    }
+    with_failing_allocations([&] { entry.attributes(); },
+                             [&] { return !has_canonical_lines(entry); });
     EXPECT_EQ(entry.attributes().str(), lines);
 }
 

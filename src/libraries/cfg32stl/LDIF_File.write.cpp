@@ -30,6 +30,8 @@ constexpr failure not_put_back{80, 1000, "The old content could not be put back"
 
 constexpr size_t name_buffer_size = 2048;
 
+static_assert(unfinished_mark.size() <= longest_mark);
+
 /// By so much a file usually grows, at most, when it is written.
 constexpr size_t usual_growth = 65536;
 
