@@ -61,7 +61,7 @@ class watched_calls {
 /// The calls as a numbered list, those with a fault marked.
 std::string listed(const std::vector<seen_call>& calls);
 
-/// The names that the test program defines.
+/// The names by which the libraries take them.
 const std::vector<std::string>& wrapped_names();
 
 }  // namespace cfg32::tests

@@ -102,18 +102,18 @@ void recorded_disk::record_names(const std::map<std::string, ino_t>& names) {
             change.names[name] = std::nullopt;
         }
     }
-    for (const auto& [name, number] : names) {
-        const auto known = names_.find(name);
-        if (known != names_.end() && known->second == number) {
+    for (const auto& now : names) {
+        const auto known = names_.find(now.first);
+        if (known != names_.end() && known->second == now.second) {
             continue;
         }
         const bool is_renamed = std::any_of(names_.begin(), names_.end(), [&](const auto& before) {
-            return before.second == number;
+            return before.second == now.second;
         });
         if (!is_renamed) {
-            numbers_[number] = next_number_++;
+            numbers_[now.second] = next_number_++;
         }
-        change.names[name] = numbers_[number];
+        change.names[now.first] = numbers_[now.second];
     }
     names_ = names;
     if (!change.names.empty()) {
