@@ -64,7 +64,7 @@ struct command_faults : testing::TestWithParam<command_row> {
     /// All of them, or as many by chance as an ordinary run has time for.
     std::vector<fault> chosen(std::vector<fault> all) {
         const unsigned long most =
-            number_from_environment("CFG32_FAULTS_COMMAND", is_sanitized() ? 10 : 50);
+            number_from_environment("CFG32_FAULTS_COMMAND", is_sanitized() ? 10 : 20);
         std::shuffle(all.begin(), all.end(), random);
         all.resize(std::min<size_t>(all.size(), most));
         return all;
