@@ -104,11 +104,6 @@ std::string as_written_after(const std::string& text, const attribute_change& wh
     return folder.text();
 }
 
-unsigned long number_from_environment(const char* name, unsigned long usual) {
-    const char* text = getenv(name);
-    return text && *text ? strtoul(text, nullptr, 10) : usual;
-}
-
 void work_in_memory() {
     const char* const place = "/dev/shm";
     if (access(place, W_OK | X_OK) == 0) {

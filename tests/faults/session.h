@@ -5,6 +5,7 @@
 #include <vector>
 
 #include "cfg32.h"
+#include "environment.h"
 #include "temporary_folder.h"
 
 namespace cfg32::tests {
@@ -70,9 +71,6 @@ std::string as_written(const std::string& text);
 
 /// The text as the library writes it after a change.
 std::string as_written_after(const std::string& text, const attribute_change& what);
-
-/// The number of a variable of the environment, or what is usual.
-unsigned long number_from_environment(const char* name, unsigned long usual);
 
 /// Has the folders of this process made in memory, where there is such a place. What a process has
 /// written when it ends does not depend on the disk, and thousands of updates wait for none.

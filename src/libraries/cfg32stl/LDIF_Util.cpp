@@ -185,7 +185,7 @@ character first_character(std::string_view text) {
 
 int compare_without_case(std::string_view left, std::string_view right) {
     const size_t common = std::min(left.size(), right.size());
-    const int order = strncasecmp(left.data(), right.data(), common);
+    const int order = common == 0 ? 0 : strncasecmp(left.data(), right.data(), common);
     if (order != 0 || left.size() == right.size()) {
         return order;
     }

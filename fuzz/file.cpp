@@ -1,0 +1,101 @@
+#include <algorithm>
+
+#include "LDIF_Exception.h"
+#include "LDIF_File.h"
+#include "LDIF_Util.h"
+#include "exempt_dn.h"
+#include "memory_file.h"
+#include "property.h"
+#include "tree_description.h"
+
+namespace cfg32::fuzz {
+
+namespace {
+
+/// The text of each entry, of lines that were not read unless somebody asked.
+std::string text_of(const LDIF_File& file) {
+    std::string text;
+    for_each_in_preorder(file.root(), [&](const LDIF_Entry& entry) { entry.append_to(text); });
+    file.trailing_comment().append_to(text);
+    return text;
+}
+
+/// KEPT: whitespace that only a continuation line brought to the front of a value is not read again
+/// where the value is printed, and neither is what a kept line without a colon got at its end.
+bool has_blank_around_value(const LDIF_File& file) {
+    bool has_one = false;
+    for_each_in_preorder(file.root(), [&](const LDIF_Entry& entry) {
+        for (const LDIF_Attribute& attribute : entry.attributes()) {
+            for (const kept_text& text : attribute.values().texts()) {
+                std::string stripped(std::string_view{text});
+                has_one |= stripLeading(stripTrailing(stripped)).size() < text.size();
+            }
+        }
+    });
+    return has_one;
+}
+
+bool has_exempt_dn(const LDIF_File& file) {
+    bool has_one = false;
+    for_each_in_preorder(file.root(), [&](const LDIF_Entry& entry) {
+        has_one |= is_read_differently(entry.dn());
+        for (const LDIF_Attribute& attribute : entry.attributes()) {
+            for (const LDIF_Value& value : attribute.values()) {
+                has_one |= is_exempt(value);
+            }
+        }
+    });
+    return has_one;
+}
+
+/// Writes the file. False when it can't be written, which must leave it as it is.
+bool is_written(LDIF_File& file, const tool::memory_file& on_disk) {
+    const std::string before = on_disk.text();
+    try {
+        file.flush();
+        return true;
+    } catch (const LDIF_Exception& e) {
+        require_equal(on_disk.text(), before, "a refused write leaves the file alone");
+        return false;
+    }
+}
+
+void require_round_trip(LDIF_File& file, const tool::memory_file& on_disk) {
+    const std::string text = text_of(file);
+    if (!is_written(file, on_disk)) {
+        return;
+    }
+    const std::string written = on_disk.text();
+    require_equal(written, text, "a file is written as its entries are printed");
+    const bool is_exempt = has_exempt_dn(file);
+    const bool has_blank = has_blank_around_value(file);
+    const std::string tree = tests::description(file);
+    LDIF_File again(on_disk.name(), "", nullptr);
+    if (is_exempt) {
+        return;
+    }
+    require_equal(on_disk.text(), written, "a written file needs no repair");
+    if (has_blank) {
+        return require_round_trip(again, on_disk);
+    }
+    require_equal(text_of(again), written, "a tree is printed as it was written");
+    require_equal(tests::description(again), tree, "what was written is loaded as the same tree");
+    require(is_written(again, on_disk), "what was written can be written again");
+    require_equal(on_disk.text(), written, "a file is written as the same bytes again");
+}
+
+}  // namespace
+
+void file_property(std::string_view input) {
+    const tool::memory_file on_disk(input);
+    try {
+        LDIF_File file(on_disk.name(), "", nullptr);
+        require_round_trip(file, on_disk);
+        file.treeView(false);
+        file.treeView(true);
+    } catch (const LDIF_Exception& e) {
+        require_equal(on_disk.text(), input, "a refused load leaves the file alone");
+    }
+}
+
+}  // namespace cfg32::fuzz

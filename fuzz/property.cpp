@@ -1,0 +1,26 @@
+#include "property.h"
+
+namespace cfg32::fuzz {
+
+void require(bool holds, std::string_view promise) {
+    if (!holds) {
+        throw broken_promise(std::string(promise));
+    }
+}
+
+std::vector<std::string> parts_of(std::string_view input, size_t most) {
+    constexpr std::string_view separator = "\n%\n";
+    std::vector<std::string> parts;
+    while (parts.size() + 1 < most) {
+        const size_t end = input.find(separator);
+        if (end == std::string_view::npos) {
+            break;
+        }
+        parts.emplace_back(input.substr(0, end));
+        input.remove_prefix(end + separator.size());
+    }
+    parts.emplace_back(input);
+    return parts;
+}
+
+}  // namespace cfg32::fuzz
