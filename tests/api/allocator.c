@@ -1,6 +1,7 @@
 #include "allocator.h"
 
 #include <errno.h>
+#include <malloc.h>
 #include <stdlib.h>
 #include <string.h>
 
@@ -27,6 +28,8 @@ static struct {
     size_t watched_size;
     int watched_was_freed;
     unsigned char bytes[2048];
+    const char *text;
+    long freed_with_text;
 } allocator;
 
 static int fails(unsigned kind) {
@@ -104,6 +107,10 @@ void free(void *block) {
         allocator.watched_was_freed = 1;
         allocator.watched = NULL;
     }
+    if (allocator.text && malloc_usable_size(block) > strlen(allocator.text) &&
+        memcmp(block, allocator.text, strlen(allocator.text)) == 0) {
+        ++allocator.freed_with_text;
+    }
     --allocator.live;
     BELOW(free)(block);
 }
@@ -137,3 +144,10 @@ void watch_block(const void *block, size_t size) {
 const unsigned char *freed_bytes(void) {
     return allocator.watched_was_freed ? allocator.bytes : NULL;
 }
+
+void watch_text(const char *text) {
+    allocator.text = text;
+    allocator.freed_with_text = 0;
+}
+
+long freed_with_text(void) { return allocator.freed_with_text; }

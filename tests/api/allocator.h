@@ -27,4 +27,8 @@ void watch_block(const void *block, size_t size);
 /** Those bytes, null when the block was not freed yet. */
 const unsigned char *freed_bytes(void);
 
+/** Counts the blocks that are freed while they hold this text; null ends that. */
+void watch_text(const char *text);
+long freed_with_text(void);
+
 #endif

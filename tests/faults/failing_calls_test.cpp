@@ -206,6 +206,21 @@ TEST_P(failing_calls, ThatKeepTheOldContentFromBeingPutBackAreToldAndTheBackupIs
     EXPECT_GE(rows, 6) << listed(calls);
 }
 
+// For the lock it is opened twice, the second time for reading only. To read it then works again.
+TEST_P(failing_calls, ThatKeepTheFileFromBeingLockedKeepItFromBeingRead) {
+    const auto is_open = [](const seen_call& call) { return call.name.starts_with("open"); };
+    const auto first = std::find_if(calls.begin(), calls.end(), is_open);
+    const size_t nth = static_cast<size_t>(first - calls.begin()) + 1;
+    stage on(setting);
+    const int code = on.play({{nth, effect::fails, EMFILE}, {nth + 1, effect::fails, EMFILE}});
+    const std::string description = told("two faults", EMFILE, on);
+    EXPECT_EQ(code, CFG_CONNECT_ERROR) << description;
+    EXPECT_THAT(on.report(), HasSubstr("errno " + std::to_string(EMFILE) + ":"));
+    EXPECT_EQ(on.folder().text(), before) << description;
+    EXPECT_EQ(on.repeat(), CFG_SUCCESS) << on.report();
+    EXPECT_EQ(on.folder().text(), after) << description;
+}
+
 TEST_P(failing_calls, OfWhatFileSystemsNeedNotHaveAreNoFailures) {
     const struct {
         const char* name;

@@ -306,3 +306,9 @@ TEST(child_index, TellsChildrenOfTheSameNameApart) {
     EXPECT_EQ(children.index.position_of(*second), second);
     EXPECT_EQ(children.nearest("cn=1,o=a"), "CN=1, O=A");
 }
+
+TEST(child_index, WithoutChildrenHasNothingToFind) {
+    const indexed_entries children;
+    EXPECT_EQ(children.nearest("o=a"), "none");
+    EXPECT_THAT(children.below("o=a"), IsEmpty());
+}

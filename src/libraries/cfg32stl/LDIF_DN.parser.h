@@ -22,7 +22,6 @@ inline constexpr failure missing_value{34, 1013, "Missing RDN value: "};
 inline constexpr failure empty_value{34, 1013, "Missing RDN attribute value"};
 inline constexpr failure invalid_escape{34, 1014, "Invalid escape sequence: "};
 inline constexpr failure invalid_after_value{34, 1014, "Invalid character in RDN value: "};
-inline constexpr failure bad_separator{80, 1000, "Unexpected syntax error"};
 }  // namespace dn_failure
 
 /// Char is char for plain ASCII and wchar_t for every other text.
@@ -96,10 +95,7 @@ void dn_parser<Char>::dn(std::vector<LDIF_RDN>& rdns) {
         if (at_end()) {
             return;
         }
-        if (!at_separator()) {
-            raise(dn_failure::bad_separator);
-        }
-        skip(1);
+        skip(1);  // the separator
         skip_space();
     }
 }

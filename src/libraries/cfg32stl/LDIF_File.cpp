@@ -22,7 +22,6 @@ constexpr failure not_read{80, 1000, "System error reading file"};
 constexpr failure second_version{19, 1006, "More than 1 \"version\" attribute not allowed"};
 constexpr failure second_charset{19, 1006, "More than 1 \"charset\" attribute not allowed"};
 constexpr failure not_of_root{65, 1007, "\""};
-constexpr failure unknown_line{80, 1000, "Unknown LDIF_Line::Type!"};
 
 constexpr int object_class_violation = 65;
 
@@ -100,10 +99,8 @@ void loader::dispatch() {
             return;
         case LDIF_Line::dn:
             return dn_line();
-        case LDIF_Line::attr:
-            return attribute_line();
         default:
-            raise(unknown_line);
+            return attribute_line();
     }
 }
 
