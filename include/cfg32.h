@@ -31,8 +31,8 @@
  *     overwritten in place; links to it, its owner and its mode stay. If CFG_OPT_BACKUP_FILE names
  *     a backup, the file of before is on the disk as well, complete before the first byte of the
  *     file changes: at every moment one of the two is a complete version. A process that is killed
- *     in the middle then leaves a file that no call loads (80/1002): copy the backup over it.
- *     Without a backup it may leave a mixture of both versions.
+ *     in the middle, or a power cut, then leaves a file that no call loads (80/1002): copy the
+ *     backup over it. Without a backup they may leave a mixture of both versions.
  *     When a call returns a failure, the file holds what it held, save for unusable lines that it
  *     found and kept in their own way (see cfg_bind_s()) and for what is said of codes 80 and 91
  *     at cfg_modify_s(). This handle's copy in memory is not rolled back: what was carried out

@@ -15,6 +15,7 @@
 
 namespace {
 
+using cfg32::unfinished_mark;
 using cfg32::unique_fd;
 using cfg32::bench::configuration_text;
 using cfg32::bench::dn_of;
@@ -53,11 +54,29 @@ void require(bool is_done) {
     }
 }
 
+void write_part(int file, std::string_view text, size_t place) {
+    require(pwrite(file, text.data(), text.size(), static_cast<off_t>(place)) ==
+            static_cast<ssize_t>(text.size()));
+}
+
 void write_over(const std::string& name, const std::string& text) {
     const unique_fd file(open(name.c_str(), O_RDWR | O_CLOEXEC));
-    require(pwrite(file.get(), text.data(), text.size(), 0) == static_cast<ssize_t>(text.size()) &&
-            ftruncate(file.get(), static_cast<off_t>(text.size())) == 0 &&
+    write_part(file.get(), text, 0);
+    require(ftruncate(file.get(), static_cast<off_t>(text.size())) == 0 &&
             fdatasync(file.get()) == 0);
+}
+
+/// With a mark over the head until the rest is on the disk.
+void write_over_marked(const std::string& name, const std::string& text) {
+    const unique_fd file(open(name.c_str(), O_RDWR | O_CLOEXEC));
+    const std::string_view head = std::string_view(text).substr(0, unfinished_mark.size());
+    write_part(file.get(), unfinished_mark, 0);
+    require(fdatasync(file.get()) == 0);
+    write_part(file.get(), std::string_view(text).substr(head.size()), head.size());
+    require(ftruncate(file.get(), static_cast<off_t>(text.size())) == 0 &&
+            fdatasync(file.get()) == 0);
+    write_part(file.get(), head, 0);
+    require(fdatasync(file.get()) == 0);
 }
 
 /// A copy of the file that takes the name of the backup when it is complete.
@@ -80,7 +99,7 @@ void update_by_system_calls(benchmark::State& state) {
     const scratch_file file(text);
     for (auto each : state) {
         make_backup(file);
-        write_over(file.name(), text);
+        write_over_marked(file.name(), text);
     }
 }
 BENCHMARK(update_by_system_calls)->Arg(300)->Arg(10000)->Unit(benchmark::kMicrosecond);

@@ -130,7 +130,8 @@ struct editor : testing::TestWithParam<scenario> {
                 stage on(setting);
                 const bool is_before = when == moment::before;
                 const effect comes = is_before ? effect::comes_before : effect::comes_after;
-                const int code = on.play({{nth, comes, 0, "", [&] { saves(on.folder(), saved); }}});
+                const auto event = [&](const seen_call&) { saves(on.folder(), saved); };
+                const int code = on.play({{nth, comes, 0, "", event}});
                 SCOPED_TRACE(std::string("saved ") + (is_before ? "before " : "after ") +
                              std::to_string(nth) + " of:\n" + listed(on.seen()) + on.report());
                 check(on, nth, when, code);

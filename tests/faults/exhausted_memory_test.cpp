@@ -30,7 +30,7 @@ struct exhausted_memory : testing::TestWithParam<scenario> {
     bool expect_put_back(size_t nth, long which, failing_allocation::extent how_long) const {
         stage on(setting);
         std::optional<failing_allocation> shortage;
-        const auto begin = [&] { shortage.emplace(which, how_long); };
+        const auto begin = [&](const seen_call&) { shortage.emplace(which, how_long); };
         const int code = on.play({{nth, effect::fails, EIO, "", begin}});
         const bool has_failed = shortage && shortage->happened();
         shortage.reset();

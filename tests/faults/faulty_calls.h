@@ -22,6 +22,13 @@ enum class effect {
     comes_after,    ///< the call, and then the event
 };
 
+struct seen_call {
+    std::string name;
+    std::string about;  ///< its path or descriptor, and its size
+    bool is_transfer;   ///< it can be short
+    bool has_fault;
+};
+
 struct fault {
     size_t nth;          ///< which call of all that are seen, from 1; 0 for every one
     effect what;         ///< what happens to it
@@ -29,14 +36,7 @@ struct fault {
     std::string name{};  ///< if not empty, only calls of this name
     /// What happens at the call, after it for comes_after and else before it. Its own calls are not
     /// seen.
-    std::function<void()> event{};
-};
-
-struct seen_call {
-    std::string name;
-    std::string about;  ///< its path or descriptor, and its size
-    bool is_transfer;   ///< it can be short
-    bool has_fault;
+    std::function<void(const seen_call&)> event{};
 };
 
 /// Watches the calls of this thread for as long as it lives. There is one at a time.
@@ -61,7 +61,7 @@ class watched_calls {
 /// The calls as a numbered list, those with a fault marked.
 std::string listed(const std::vector<seen_call>& calls);
 
-/// The names that the test program defines.
+/// The names by which the libraries take them.
 const std::vector<std::string>& wrapped_names();
 
 }  // namespace cfg32::tests

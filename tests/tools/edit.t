@@ -193,6 +193,17 @@ A signal at the question ends it, and says where the draft is:
     [130]
     $ rm -r private/*
 
+Whichever it is that ends a program:
+
+    $ for signal in HUP ALRM PIPE USR1 XCPU; do EDITOR="kill -$signal \$PPID; true" cfg32 -f oruslapd.conf edit 2>&1 | tail -1 | sed "s|$TMPDIR/cfg32-[^/]*|PRIVATE|"; done 2>/dev/null
+    what you edited is kept in PRIVATE/oruslapd.conf
+    what you edited is kept in PRIVATE/oruslapd.conf
+    what you edited is kept in PRIVATE/oruslapd.conf
+    what you edited is kept in PRIVATE/oruslapd.conf
+    what you edited is kept in PRIVATE/oruslapd.conf
+    [152]
+    $ rm -r private/*
+
 An entry that its edit makes the same as another is a problem elsewhere in the file:
 
     $ replace 's/^dn: .*/dn: cn=Referrals, cn=Network, cn=Configuration/'

@@ -170,3 +170,10 @@ Where a symbolic link means the file that is gone, it is made there:
     $ cmp backup real/conf && readlink oruslapd.conf real/link
     real/link
     conf
+
+A name of which it can't be told whether there is such a file is none of a missing one:
+
+    $ ln -s loop loop
+    $ cfg32 -f loop restore --yes backup
+    cfg32: loop: Too many levels of symbolic links
+    [3]

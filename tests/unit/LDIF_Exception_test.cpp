@@ -13,6 +13,7 @@
 
 #include "LDIF_AttrType.h"
 #include "failures.h"
+#include "small_stack.h"
 
 namespace {
 
@@ -498,3 +499,17 @@ TEST(LDIF_Exception, DumpDoesNotDependOnShowSource) {
 }
 
 }  // namespace
+
+TEST(LDIF_Exception, AChainThatIsDeeperThanTheStackIsReportedCopiedAndDeleted) {
+    cfg32::tests::on_a_small_stack([] {
+        constexpr int depth = 10000;
+        auto last = std::make_unique<LDIF_Exception>(plain());
+        for (int i = 0; i < depth; ++i) {
+            last = std::make_unique<LDIF_Exception>("file.cpp", i, std::move(*last));
+        }
+        const LDIF_Exception copy(*last);
+        EXPECT_EQ(copy.dump(), last->dump());
+        EXPECT_EQ(copy.str(), last->str());
+        EXPECT_THAT(copy.dump(), testing::HasSubstr("[file.cpp:7]"));
+    });
+}

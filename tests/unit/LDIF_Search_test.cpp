@@ -11,6 +11,7 @@
 #include "changed_row.h"
 #include "dn_of.h"
 #include "failures.h"
+#include "small_stack.h"
 #include "temporary_folder.h"
 
 using namespace cfg32::tests;
@@ -343,6 +344,29 @@ TEST_F(LDIF_Search, UnexpectedFailureIsASystemErrorWithTheEntry) {
     EXPECT_EQ(e.entryDn, "dn: o=x\no: x\n\n");
     EXPECT_EQ(e.srcFile, "src/libraries/cfg32stl/LDIF_Search");
     EXPECT_TRUE(results.entries().empty());
+}
+
+TEST(LDIF_Search_failure, IsToldFromWithinATreeThatIsDeeperThanTheStack) {
+    on_a_small_stack([] {
+        constexpr int depth = 1000;
+        LDIF_Entry root;
+        std::string dn = "o=x";
+        for (int i = 0; i < depth; ++i, dn.insert(0, "o=x, ")) {
+            LDIF_Entry entry(dn_of(dn));
+            if (i == depth - 1) {
+                entry += LDIF_Attribute(nullptr, "oru-slapdMasterPW", "{iMASK}>undecodable");
+            }
+            root += std::move(entry);
+        }
+        Results results(Results::Subtree, LDIF_Filter("oru-slapdMasterPW=x"), {}, false);
+        const LDIF_Exception e = failure_of([&] { results += root; });
+        EXPECT_EQ(e.ldapErr, 84);
+        int layers = 0;
+        for (const LDIF_Exception* at = &e; at; at = at->cause.get()) {
+            ++layers;
+        }
+        EXPECT_GT(layers, depth);
+    });
 }
 
 TEST_F(LDIF_Search, ResultsAreCopiesOfTheirOwn) {

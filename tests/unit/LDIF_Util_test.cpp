@@ -384,6 +384,13 @@ TEST(LDIF_Util, HashDoesNotSeeCase) {
               cfg32::hash_without_case("Ab"));
 }
 
+// Else all names of one length would have one hash where no name is ASCII.
+TEST(LDIF_Util, NamesBeyondAsciiHaveHashesOfTheirOwn) {
+    REQUIRE_UTF8();
+    EXPECT_NE(cfg32::hash_without_case("名前"), cfg32::hash_without_case("場所"));
+    EXPECT_NE(cfg32::hash_without_case("ä"), cfg32::hash_without_case("ö"));
+}
+
 TEST(LDIF_Util, HexDigitHasItsValue) {
     std::set<int> found;
     for (wchar_t c = 0; c < 256; ++c) {

@@ -544,3 +544,28 @@ TEST(LDIF_Values, ExhaustedMemoryLeavesTheListAsItWasAndWithoutDuplicatesLater) 
         }
     }
 }
+
+TEST(LDIF_Values, ErasedValuesAreGoneBeforeTheirGapsAreClosed) {
+    for (const int count : {2, 5, 40}) {
+        LDIF_Values values("cn", nullptr);
+        for (int i = 0; i < count; ++i) {
+            values += std::to_string(i);
+        }
+        values -= "0";
+        EXPECT_EQ(values.size(), static_cast<size_t>(count - 1));
+        EXPECT_EQ(values.find("0"), values.end());
+        EXPECT_EQ(values.begin()->str(), "1");
+        values += "0";
+        values -= "1";
+        values += "0";
+        const LDIF_Values copy(values);
+        EXPECT_EQ(texts(copy), texts(values));
+        EXPECT_EQ(texts(values).back(), "0");
+        EXPECT_EQ(std::distance(values.begin(), values.end()), count - 1);
+        for (auto value = values.begin(); value != values.end();) {
+            value = values.erase(value);
+        }
+        EXPECT_TRUE(values.empty());
+        EXPECT_EQ(values.str(), "");
+    }
+}

@@ -306,3 +306,21 @@ TEST(child_index, TellsChildrenOfTheSameNameApart) {
     EXPECT_EQ(children.index.position_of(*second), second);
     EXPECT_EQ(children.nearest("cn=1,o=a"), "CN=1, O=A");
 }
+
+TEST(child_index, AncestorsThatTurnUpInReverseTakeTheirDescendantsOver) {
+    LDIF_Entry root;
+    for (int i = 0; i < 50; ++i) {
+        root += LDIF_Entry(dn_of("cn=a, cn=" + std::to_string(i) + ", cn=missing, o=x"));
+    }
+    for (int i = 50; i-- > 0;) {
+        root += LDIF_Entry(dn_of("cn=" + std::to_string(i) + ", cn=missing, o=x"));
+    }
+    ASSERT_EQ(root.children().size(), 50U);
+    for (const LDIF_Entry& entry : root.children()) {
+        EXPECT_EQ(entry.children().size(), 1U) << entry.str();
+    }
+    root += LDIF_Entry(dn_of("cn=missing, o=x"));
+    ASSERT_EQ(root.children().size(), 1U);
+    EXPECT_EQ(root.children().front().children().size(), 50U);
+    EXPECT_EQ(root.children().front().children().front().dn().str(), "cn=49, cn=missing, o=x");
+}

@@ -120,8 +120,8 @@ bool LDIF_Entry::leads_to(const dn_path& dn, size_t from) const {
 LDIF_Entry& LDIF_Entry::hang(list& node, const dn_path& dn, size_t depth) {
     LDIF_Entry& child = node.front();
     LDIF_Entry* parent = this;
-    while (parent->index_) {
-        LDIF_Entry* next = parent->index_->equal_or_ancestor(dn, depth);
+    while (const child_index* index = parent->index()) {
+        LDIF_Entry* next = index->equal_or_ancestor(dn, depth);
         if (!next) {
             break;
         }
@@ -153,12 +153,13 @@ LDIF_Entry& LDIF_Entry::absorb(LDIF_Entry& again) {
 
 /// Takes over the parent's children that belong below this entry, which is to be their sibling.
 void LDIF_Entry::take_descendants_from(LDIF_Entry& parent, const dn_path& dn) {
-    if (!parent.index_) {
+    child_index* index = parent.index();
+    if (!index) {
         return;
     }
-    for (const list::iterator descendant : parent.index_->descendants(*this, dn)) {
+    for (const list::iterator descendant : index->descendants(*this, dn)) {
         list node;
-        parent.index_->erase(descendant);
+        index->erase(descendant);
         node.splice(node.end(), parent.children_, descendant);
         hang(node, dn_path(descendant->dn_), descendant->depth_ + relative_size());
     }
@@ -166,7 +167,7 @@ void LDIF_Entry::take_descendants_from(LDIF_Entry& parent, const dn_path& dn) {
 
 /// Appends the entry of node to the children.
 void LDIF_Entry::append(list& node, const dn_path& dn) {
-    if (!index_) {
+    if (!index()) {
         index_ = std::make_unique<child_index>();
     }
     index_->insert(node.begin(), dn);
@@ -174,13 +175,20 @@ void LDIF_Entry::append(list& node, const dn_path& dn) {
 }
 
 void LDIF_Entry::index_children() {
-    if (!children_.empty()) {
-        index_ = std::make_unique<child_index>();
-    }
+    auto index = children_.empty() ? nullptr : std::make_unique<child_index>();
     for (auto child = children_.begin(); child != children_.end(); ++child) {
         // cppcheck-suppress iterators1  ; the index is one of that list
-        index_->insert(child, dn_path(child->dn_));
+        index->insert(child, dn_path(child->dn_));
     }
+    index_ = std::move(index);
+}
+
+/// The index of the children, made anew where the locale asks for it.
+child_index* LDIF_Entry::index() const {
+    if (index_ && !index_->is_good()) {
+        const_cast<LDIF_Entry*>(this)->index_children();
+    }
+    return index_.get();
 }
 
 std::string LDIF_Entry::str() const {
@@ -254,26 +262,24 @@ const LDIF_Entry* LDIF_Entry::find(const dn_path& path) const {
     const LDIF_Entry* entry = this;
     size_t depth = relative_size();
     while (entry && depth < path.size()) {
-        entry = entry->index_ ? entry->index_->equal_or_ancestor(path, depth) : nullptr;
+        const child_index* index = entry->index();
+        entry = index ? index->equal_or_ancestor(path, depth) : nullptr;
         depth += entry ? entry->relative_size() : 0;
     }
     return entry;
 }
 
 void LDIF_Entry::erase(LDIF_Entry& child) {
-    const list::iterator position = index_->position_of(child);
-    index_->erase(position);
+    child_index& index = *this->index();
+    const list::iterator position = index.position_of(child);
+    index.erase(position);
     children_.erase(position);
     if (children_.empty()) {
         index_.reset();
     }
 }
 
-LDIF_DN LDIF_Entry::relative_dn() const {
-    LDIF_DN relative = dn();
-    relative.remove_root_side(depth_);
-    return relative;
-}
+LDIF_DN LDIF_Entry::relative_dn() const { return dn_.without_root_side(depth_); }
 
 LDIF_Entry LDIF_Entry::header() const {
     LDIF_Entry copy;

@@ -111,6 +111,7 @@ class LDIF_Entry {
     void take_descendants_from(LDIF_Entry& parent, const cfg32::dn_path& dn);
     void append(list& node, const cfg32::dn_path& dn);
     void index_children();
+    cfg32::child_index* index() const;
     bool ends_with_blank_line() const;
     LDIF_Attributes& read_attributes() const {
         return unread_.empty() ? attributes_ : read_unread();

@@ -2,6 +2,7 @@
 
 #include <cstring>
 #include <ostream>
+#include <typeinfo>
 #include <utility>
 
 #include "LDIF_AttrType.h"
@@ -32,8 +33,19 @@ LDIF_Exception::LDIF_Exception(const LDIF_Exception& e, std::unique_ptr<LDIF_Exc
       attrType(e.attrType),
       cause(std::move(cause)) {}
 
-LDIF_Exception::LDIF_Exception(const LDIF_Exception& e)
-    : LDIF_Exception(e, e.cause ? std::make_unique<LDIF_Exception>(*e.cause) : nullptr) {}
+LDIF_Exception::LDIF_Exception(const LDIF_Exception& e) : LDIF_Exception(e, nullptr) {
+    LDIF_Exception* last = this;
+    for (const LDIF_Exception* next = e.cause.get(); next; next = next->cause.get()) {
+        last->cause.reset(new LDIF_Exception(*next, nullptr));
+        last = last->cause.get();
+    }
+}
+
+LDIF_Exception::~LDIF_Exception() {
+    while (cause) {
+        cause = std::move(cause->cause);
+    }
+}
 
 LDIF_Exception::LDIF_Exception(const char* file, int line, const LDIF_Exception& e)
     : LDIF_Exception(file, line, LDIF_Exception(e)) {}
@@ -103,8 +115,21 @@ std::string place_in_file(const std::string& file, int line) {
 
 }  // namespace
 
-std::string LDIF_Exception::dump() const {
-    std::string report = "[" + srcFile + ":" + decimal(srcLine);
+/// Calls own(cause) for each cause that is shown, and whole(cause) for one of another class, which
+/// reports its causes itself. It does not recurse: a chain may be
+/// deeper than a stack.
+template <class Own, class Whole>
+void LDIF_Exception::for_each_cause(Own own, Whole whole) const {
+    for (const LDIF_Exception* e = cause.get(); e && showStack; e = e->cause.get()) {
+        if (typeid(*e) != typeid(LDIF_Exception)) {
+            return whole(*e);
+        }
+        own(*e);
+    }
+}
+
+void LDIF_Exception::append_dump(std::string& report) const {
+    report += "[" + srcFile + ":" + decimal(srcLine);
     // KEPT: without a message the bracket stays open; tools that read the reports expect it so.
     append_line(report += msg.empty() ? "" : "]", "msg     ", msg);
     if (sysErrno != 0 && sysErrnoKind == 0) {
@@ -122,14 +147,17 @@ std::string LDIF_Exception::dump() const {
         report += constraints(*attrType);
     }
     report += "\n";
-    if (showStack && cause) {
-        report += "\n" + cause->dump();
-    }
+}
+
+std::string LDIF_Exception::dump() const {
+    std::string report;
+    append_dump(report);
+    for_each_cause([&](const LDIF_Exception& e) { e.append_dump(report += "\n"); },
+                   [&](const LDIF_Exception& e) { report.append("\n").append(e.dump()); });
     return report;
 }
 
-std::string LDIF_Exception::str() const {
-    std::string report;
+void LDIF_Exception::append_str(std::string& report) const {
     if (showSource) {
         report += "[" + fileStr() + "] ";
     }
@@ -139,9 +167,13 @@ std::string LDIF_Exception::str() const {
     if (!msg.empty()) {
         report += msgStr() + "\n";
     }
-    if (showStack && cause) {
-        report += cause->str();
-    }
+}
+
+std::string LDIF_Exception::str() const {
+    std::string report;
+    append_str(report);
+    for_each_cause([&](const LDIF_Exception& e) { e.append_str(report); },
+                   [&](const LDIF_Exception& e) { report += e.str(); });
     return report;
 }
 

@@ -40,7 +40,7 @@ class LDIF_Exception : public std::exception {
     LDIF_Exception(const char* file, int line, LDIF_Exception&& e);
     LDIF_Exception(LDIF_Exception&& e) = default;
     LDIF_Exception& operator=(const LDIF_Exception&) = delete;
-    ~LDIF_Exception() override = default;
+    ~LDIF_Exception() override;
 
     /// Report of several lines, causes included when showStack is set.
     virtual std::string dump() const;
@@ -59,6 +59,11 @@ class LDIF_Exception : public std::exception {
   private:
     /// e with another cause.
     LDIF_Exception(const LDIF_Exception& e, std::unique_ptr<LDIF_Exception> cause);
+
+    template <class Own, class Whole>
+    void for_each_cause(Own own, Whole whole) const;
+    void append_dump(std::string& report) const;
+    void append_str(std::string& report) const;
 };
 
 std::ostream& operator<<(std::ostream& out, const LDIF_Exception& e);

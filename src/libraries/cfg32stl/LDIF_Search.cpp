@@ -1,7 +1,6 @@
 #include "LDIF_Search.h"
 
 #include <algorithm>
-#include <cstdlib>
 #include <exception>
 #include <ostream>
 #include <utility>
@@ -140,20 +139,21 @@ namespace {
 
 using open_entries = std::vector<std::pair<const LDIF_Entry*, LDIF_Entry::list::const_iterator>>;
 
-/// Throws the failure again, from within each of the entries that were entered.
-[[noreturn]] void fail_within(const open_entries& open, size_t depth,
-                              const std::exception_ptr& failure) {
-    const LDIF_Entry& entry = *open[depth].first;
-    const auto body = [&] {
-        if (depth + 1 == open.size()) {
-            std::rethrow_exception(failure);
+/// Throws the failure again, from within each of the entries that were entered. It does not
+/// recurse: a tree may be deeper than a stack.
+[[noreturn]] void fail_within(open_entries open, std::exception_ptr failure) {
+    for (; !open.empty(); open.pop_back()) {
+        const LDIF_Entry& entry = *open.back().first;
+        try {
+            // KEPT: the entry is told by its whole text, not by its DN.
+            with_boundary(
+                in("LDIF_Search_Results::addEntry()"), [&] { std::rethrow_exception(failure); },
+                [&](LDIF_Exception& e) { e.entryDn = shown(entry); });
+        } catch (...) {
+            failure = std::current_exception();
         }
-        fail_within(open, depth + 1, failure);
-    };
-    // KEPT: the entry is told by its whole text, not by its DN.
-    with_boundary(in("LDIF_Search_Results::addEntry()"), body,
-                  [&](LDIF_Exception& e) { e.entryDn = shown(entry); });
-    std::abort();  // the body has thrown
+    }
+    std::rethrow_exception(failure);
 }
 
 }  // namespace
@@ -202,7 +202,7 @@ void cfg32::find_matches(const LDIF_Entry& base, LDIF_Search_Results::Scope scop
         if (open.empty()) {
             throw;
         }
-        fail_within(open, 0, std::current_exception());
+        fail_within(std::move(open), std::current_exception());
     }
 }
 

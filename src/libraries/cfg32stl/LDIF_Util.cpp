@@ -199,28 +199,40 @@ int compare_without_case(std::string_view left, std::string_view right) {
 
 namespace {
 
-/// For each byte one of those that strcasecmp() takes for equal in some locale. Hashes are kept
-/// while the process may change its locale: they must fit the equality of each. Turkish has an I
-/// with and one without a dot, and the character sets of one byte have letters beyond ASCII.
-constexpr auto case_classes = [] {
+using byte_classes = std::array<unsigned char, 256>;
+
+/// For each byte one of those that strcasecmp() takes for equal in some locale of the kind. Hashes
+/// are kept while the process may change its locale: they must fit the equality of each. Turkish
+/// has an I with and one without a dot, and the character sets of one byte have letters beyond
+/// ASCII.
+constexpr byte_classes classes_of(hash_kind kind) {
     constexpr unsigned char any_letter = 0x80;
-    std::array<unsigned char, 256> classes{};
+    byte_classes classes{};
     for (size_t c = 0; c < 256; ++c) {
         const bool is_upper = c >= 'A' && c <= 'Z';
         const size_t lower = is_upper ? c - 'A' + 'a' : c;
-        classes[c] = lower == 'i' || c > 0x7f ? any_letter : static_cast<unsigned char>(lower);
+        const bool may_be_any = kind == hash_kind::of_every_byte && (lower == 'i' || c > 0x7f);
+        classes[c] = may_be_any ? any_letter : static_cast<unsigned char>(lower);
     }
     return classes;
-}();
+}
+
+constexpr byte_classes classes_by_kind[] = {classes_of(hash_kind::of_ascii_letters),
+                                            classes_of(hash_kind::of_every_byte)};
 
 }  // namespace
 
+hash_kind present_hash_kind() {
+    return MB_CUR_MAX > 1 ? hash_kind::of_ascii_letters : hash_kind::of_every_byte;
+}
+
 size_t hash_without_case(std::string_view text, size_t seed) {
+    const byte_classes& classes = classes_by_kind[static_cast<size_t>(present_hash_kind())];
     for (const char c : text) {  // FNV-1a
         if (c == '\0') {
             break;
         }
-        seed = (seed ^ case_classes[static_cast<unsigned char>(c)]) * 0x100000001b3;
+        seed = (seed ^ classes[static_cast<unsigned char>(c)]) * 0x100000001b3;
     }
     return seed;
 }

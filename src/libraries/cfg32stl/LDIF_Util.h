@@ -135,8 +135,14 @@ inline bool equal_without_case(std::string_view left, std::string_view right) {
            compare_without_case(left, right) == 0;
 }
 
-/// A hash that is the same for texts that are equal without regard to case in whichever locale;
-/// seed continues another hash.
+/// What the locale of the moment leaves of a text in its hash. In a character set of several bytes
+/// only ASCII letters have a case that strcasecmp() sees; in one of single bytes any byte beyond
+/// ASCII may be a letter.
+enum class hash_kind { of_ascii_letters, of_every_byte };
+hash_kind present_hash_kind();
+
+/// A hash that is the same for texts that are equal without regard to case in whichever locale of
+/// the present kind; seed continues another hash.
 size_t hash_without_case(std::string_view text, size_t seed = 0xcbf29ce484222325);
 
 /// The value of a hexadecimal digit, or -1.

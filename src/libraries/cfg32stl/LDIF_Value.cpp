@@ -162,7 +162,7 @@ LDIF_Values::LDIF_Values(const LDIF_Values& other)
         return;
     }
     several_ = std::make_unique<several>();
-    several_->texts = other.several_->texts;
+    several_->texts.assign(other.texts().begin(), other.texts().end());
     if (!other.several_->dns) {
         return;
     }
@@ -296,7 +296,7 @@ void LDIF_Values::add_stored(const given_text& text) {
 void LDIF_Values::add(const given_text& text) { append(LDIF_Value(type(), text, key_)); }
 
 void LDIF_Values::append(LDIF_Value&& value) {
-    if (!empty() && position_of(value) != size()) {
+    if (!empty() && position_of(value) != texts_and_gaps().size()) {
         return;
     }
     if (empty() && !several_ && !value.dn) {
@@ -313,8 +313,8 @@ void LDIF_Values::append(LDIF_Value&& value) {
         dn.emplace(value.text.view().data(), *value.dn);
         all.dns = all.dns ? std::move(all.dns) : std::make_unique<dn_map>();
     }
-    if (all.index) {
-        all.index->emplace(hash_of(value), value.text);
+    if (hash_index* index = all.good_index()) {
+        index->positions.emplace(hash_of(value), all.texts.size());
     }
     if (value.dn) {
         all.dns->merge(dn);
@@ -335,17 +335,32 @@ LDIF_Values::const_iterator LDIF_Values::erase(const const_iterator& value) {
         first_ = {};
         return end();
     }
-    std::vector<kept_text>& texts = several_->texts;
-    const auto erased = texts.begin() + static_cast<ptrdiff_t>(value.position_);
-    forget(*erased);
+    kept_text& erased = several_->texts[value.position_];
+    forget(value.position_);
     if (several_->dns) {
-        several_->dns->erase(erased->view().data());
+        several_->dns->erase(erased.view().data());
     }
-    texts.erase(erased);
-    return value;
+    // To close the gap at once would make it slow to erase many.
+    erased = {};
+    ++several_->gaps;
+    return std::next(value);
 }
 
-/// Where the first value stands that is equal by the syntax; the size for none.
+void LDIF_Values::several::close_gaps() {
+    std::erase_if(texts, [](const kept_text& text) { return !text.has_value(); });
+    gaps = 0;
+    index.reset();
+}
+
+/// The index, if there is one that fits the locale.
+LDIF_Values::hash_index* LDIF_Values::several::good_index() {
+    if (index && index->kind != present_hash_kind()) {
+        index.reset();
+    }
+    return index.get();
+}
+
+/// Where the first value stands that is equal by the syntax; the end for none.
 size_t LDIF_Values::position_of(const LDIF_Value& value) const {
     if (size() > longest_scan) {
         return indexed_position_of(value);
@@ -358,41 +373,36 @@ size_t LDIF_Values::position_of(const LDIF_Value& value) const {
 }
 
 size_t LDIF_Values::indexed_position_of(const LDIF_Value& value) const {
-    const auto [first, last] = index().equal_range(hash_of(value));
+    const auto [first, last] = index().positions.equal_range(hash_of(value));
     const auto is_equal = [&](const auto& entry) {
-        return value_of(entry.second).compare(value) == 0;
+        return value_of(several_->texts[entry.second]).compare(value) == 0;
     };
     const auto entry = std::find_if(first, last, is_equal);
-    if (entry == last) {
-        return size();
-    }
-    const auto is_it = [&](const kept_text& own) {
-        return own.view().data() == entry->second.data();
-    };
-    return static_cast<size_t>(std::ranges::find_if(texts(), is_it) - texts().begin());
+    return entry == last ? several_->texts.size() : entry->second;
 }
 
 /// The index, which is made when it is first asked for.
 const LDIF_Values::hash_index& LDIF_Values::index() const {
-    std::unique_ptr<hash_index>& made = several_->index;
-    if (!made) {
+    if (!several_->good_index()) {
         auto index = std::make_unique<hash_index>();
-        for (const kept_text& text : texts()) {
-            index->emplace(hash_of(value_of(text)), text);
+        for (size_t position = 0; const kept_text& text : texts()) {
+            index->positions.emplace(hash_of(value_of(text)), position++);
         }
-        made = std::move(index);
+        several_->index = std::move(index);
     }
-    return *made;
+    return *several_->index;
 }
 
 /// Takes a value out of the index.
-void LDIF_Values::forget(std::string_view text) {
-    if (!several_->index) {
+void LDIF_Values::forget(size_t position) {
+    hash_index* const index = several_->good_index();
+    if (!index) {
         return;
     }
-    const auto [first, last] = several_->index->equal_range(hash_of(value_of(text)));
-    const auto is_it = [&](const auto& entry) { return entry.second.data() == text.data(); };
-    several_->index->erase(std::find_if(first, last, is_it));
+    const auto [first, last] =
+        index->positions.equal_range(hash_of(value_of(several_->texts[position])));
+    const auto is_it = [&](const auto& entry) { return entry.second == position; };
+    index->positions.erase(std::find_if(first, last, is_it));
 }
 
 std::string LDIF_Values::str() const {

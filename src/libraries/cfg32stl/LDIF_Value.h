@@ -12,10 +12,12 @@
 #include <string>
 #include <string_view>
 #include <unordered_map>
+#include <utility>
 #include <vector>
 
 #include "LDIF_AttrType.h"
 #include "LDIF_DN.h"
+#include "LDIF_Util.h"
 #include "cisString.h"
 #include "kept_text.h"
 
@@ -128,12 +130,12 @@ class LDIF_Values {
     const_iterator find(const std::string& text) const;
     /// The value that is equal by the syntax.
     const_iterator find(const LDIF_Value& value) const;
-    /// Returns the value that followed.
+    /// Returns the value that followed. It leaves a gap until somebody asks for texts().
     const_iterator erase(const const_iterator& value);
     const_iterator begin() const;
     const_iterator end() const;
-    bool empty() const { return texts().empty(); }
-    size_t size() const { return texts().size(); }
+    bool empty() const { return size() == 0; }
+    size_t size() const;
 
     /// What is kept of the values. None of them moves in memory before it is removed.
     std::span<const cfg32::kept_text> texts() const;
@@ -148,14 +150,21 @@ class LDIF_Values {
     void append_to(std::string& out) const;
 
   private:
-    // By the values' hashes; the texts are the same as in the list.
-    using hash_index = std::unordered_multimap<size_t, std::string_view>;
+    // By the values' hashes, where they stand in the list.
+    struct hash_index {
+        cfg32::hash_kind kind = cfg32::present_hash_kind();
+        std::unordered_multimap<size_t, size_t> positions;
+    };
 
     // By where the text stands.
     using dn_map = std::map<const char*, LDIF_DN>;
 
     struct several {
+        void close_gaps();
+        hash_index* good_index();
+
         std::vector<cfg32::kept_text> texts;
+        size_t gaps = 0;                    // texts without value, of what was erased
         std::unique_ptr<hash_index> index;  // of many only
         std::unique_ptr<dn_map> dns;        // of values whose text does not tell all of the DN
     };
@@ -167,10 +176,11 @@ class LDIF_Values {
     void complete(LDIF_Exception& e) const;
     void complete(LDIF_Exception& e, std::string_view text) const;
     LDIF_Value value_of(std::string_view text) const;
+    std::span<const cfg32::kept_text> texts_and_gaps() const;
     size_t position_of(const LDIF_Value& value) const;
     size_t indexed_position_of(const LDIF_Value& value) const;
     const hash_index& index() const;
-    void forget(std::string_view text);
+    void forget(size_t position);
 
     cfg32::attribute_name name_;
     aes_key_data* key_;
@@ -195,27 +205,48 @@ class LDIF_Values::const_iterator {
         LDIF_Value value_;
     };
 
-    LDIF_Value operator*() const { return list_->value_of(list_->texts()[position_]); }
+    LDIF_Value operator*() const { return list_->value_of(list_->texts_and_gaps()[position_]); }
     pointer operator->() const { return pointer(**this); }
-    const_iterator& operator++() {
-        ++position_;
-        return *this;
-    }
-    const_iterator operator++(int) { return {list_, position_++}; }
+    const_iterator& operator++() { return *this = const_iterator(list_, position_ + 1); }
+    const_iterator operator++(int) { return std::exchange(*this, {list_, position_ + 1}); }
     bool operator==(const const_iterator&) const = default;
 
   private:
     friend class LDIF_Values;
-    const_iterator(const LDIF_Values* list, size_t position) : list_(list), position_(position) {}
+    static constexpr size_t behind_all = ~size_t{};  // whether gaps are closed or not
+
+    /// The first value from that position on.
+    const_iterator(const LDIF_Values* list, size_t position) : list_(list), position_(position) {
+        const auto texts = list->texts_and_gaps();
+        while (position_ < texts.size() && !texts[position_].has_value()) {
+            ++position_;
+        }
+        if (position_ >= texts.size()) {
+            position_ = behind_all;
+        }
+    }
 
     const LDIF_Values* list_;
     size_t position_;
 };
 
 inline LDIF_Values::const_iterator LDIF_Values::begin() const { return {this, 0}; }
-inline LDIF_Values::const_iterator LDIF_Values::end() const { return {this, size()}; }
+inline LDIF_Values::const_iterator LDIF_Values::end() const {
+    return {this, const_iterator::behind_all};
+}
+
+inline size_t LDIF_Values::size() const {
+    return texts_and_gaps().size() - (several_ ? several_->gaps : 0);
+}
 
 inline std::span<const cfg32::kept_text> LDIF_Values::texts() const {
+    if (several_ && several_->gaps > 0) {
+        several_->close_gaps();
+    }
+    return texts_and_gaps();
+}
+
+inline std::span<const cfg32::kept_text> LDIF_Values::texts_and_gaps() const {
     if (several_) {
         return several_->texts;
     }

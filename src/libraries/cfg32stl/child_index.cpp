@@ -74,19 +74,25 @@ void hashed_children::erase(size_t hash, const LDIF_Entry& child) {
 }
 
 void child_index::insert(position child, const dn_path& path) {
-    const size_t hash = for_each_ancestor(
-        *child, path, [&](size_t ancestor) { by_ancestor_.emplace(ancestor, child); });
+    const size_t hash = for_each_ancestor(*child, path, [&](size_t ancestor) {
+        by_ancestor_.emplace(ancestor_place(ancestor, next_ordinal_), child);
+    });
     by_dn_.insert(hash, child);
+    if (child->relative_size() > 1) {
+        ordinals_.emplace(&*child, next_ordinal_++);
+    }
 }
 
 void child_index::erase(position child) {
     const dn_path path(child->named_dn());
+    const auto ordinal = ordinals_.find(&*child);
     const size_t hash = for_each_ancestor(*child, path, [&](size_t ancestor) {
-        const auto [first, last] = by_ancestor_.equal_range(ancestor);
-        by_ancestor_.erase(
-            std::find_if(first, last, [&](const auto& entry) { return entry.second == child; }));
+        by_ancestor_.erase(ancestor_place(ancestor, ordinal->second));
     });
     by_dn_.erase(hash, *child);
+    if (ordinal != ordinals_.end()) {
+        ordinals_.erase(ordinal);
+    }
 }
 
 child_index::position child_index::position_of(const LDIF_Entry& child) const {
@@ -114,8 +120,9 @@ std::vector<child_index::position> child_index::descendants(const LDIF_Entry& si
     if (by_ancestor_.empty()) {
         return found;
     }
-    const auto [first, last] = by_ancestor_.equal_range(hash_of(sibling, path));
-    for (auto entry = first; entry != last; ++entry) {
+    const size_t hash = hash_of(sibling, path);
+    for (auto entry = by_ancestor_.lower_bound({hash, 0});
+         entry != by_ancestor_.end() && entry->first.first == hash; ++entry) {
         const LDIF_Entry& child = *entry->second;
         if (dn_path(child.named_dn())
                 .has_equal_part(child.depth(), path, sibling.depth(), sibling.relative_size())) {

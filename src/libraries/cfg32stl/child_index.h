@@ -2,9 +2,12 @@
 
 #include <cstddef>
 #include <map>
+#include <unordered_map>
+#include <utility>
 #include <vector>
 
 #include "LDIF_Entry.h"
+#include "LDIF_Util.h"
 
 namespace cfg32 {
 
@@ -47,6 +50,9 @@ class child_index {
   public:
     using position = LDIF_Entry::list::iterator;
 
+    /// False when the process has chosen a locale of another kind: then it must be made anew.
+    bool is_good() const { return kind_ == present_hash_kind(); }
+
     /// Enters a child under its relative DN, as the last in order. path is its DN.
     void insert(position child, const dn_path& path);
     void erase(position child);
@@ -63,8 +69,14 @@ class child_index {
     std::vector<position> descendants(const LDIF_Entry& sibling, const dn_path& path) const;
 
   private:
+    // The hash of an ancestor, and the ordinal of the child.
+    using ancestor_place = std::pair<size_t, size_t>;
+
+    hash_kind kind_ = present_hash_kind();
     hashed_children by_dn_;
-    std::multimap<size_t, position> by_ancestor_;  // in order, of each ancestor
+    std::map<ancestor_place, position> by_ancestor_;
+    std::unordered_map<const LDIF_Entry*, size_t> ordinals_;  // of the children there, in order
+    size_t next_ordinal_ = 0;
 };
 
 template <class Predicate>

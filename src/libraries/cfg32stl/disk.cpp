@@ -79,6 +79,14 @@ bool resize(int file, size_t size) {
     return retry_interrupted([=] { return ftruncate(file, static_cast<off_t>(size)); }) == 0;
 }
 
+/// Cuts off what was to be had in vain; always false, with the errno of before.
+bool give_back(int file, size_t size) {
+    const int error = errno;
+    resize(file, size);
+    errno = error;
+    return false;
+}
+
 /// The process may be limited in how large its files get (setrlimit, POSIX); a reservation that
 /// keeps the size does not look at that.
 bool is_within_limit(size_t size) {
@@ -94,7 +102,16 @@ bool is_within_limit(size_t size) {
 /// Takes room by writing, for file systems that can't reserve: line feeds, of which no file gets
 /// another meaning at its end.
 bool write_blank_lines(int file, size_t from, size_t to) {
-    return write_all(file, std::string(to - from, '\n'), from) && sync_content(file);
+    part_buffer lines;
+    lines.fill('\n');
+    while (from < to) {
+        const size_t part = std::min(to - from, lines.size());
+        if (!write_all(file, {lines.data(), part}, from)) {
+            return false;
+        }
+        from += part;
+    }
+    return sync_content(file);
 }
 
 /// Asks the file system for room from one place to another.
@@ -113,9 +130,9 @@ bool unshare(int file, size_t size) {
     return size == 0 || allocate(file, FALLOC_FL_UNSHARE_RANGE, 0, size) || is_unsupported(errno);
 }
 
-bool extend(int file, size_t from, size_t to) {
+bool extend(int file, size_t from, size_t to, bool is_marked) {
     return from >= to || allocate(file, 0, from, to) ||
-           (is_unsupported(errno) && write_blank_lines(file, from, to));
+           (is_unsupported(errno) && (is_marked || write_blank_lines(file, from, to)));
 }
 
 bool is_equal(const timespec& left, const timespec& right) {
@@ -150,15 +167,38 @@ bool wait_for_another_time(int file, const timespec& before, struct stat& status
     return true;
 }
 
+/// What is written and not synced may be on the disk after a power cut, or not, in any order. So
+/// the mark is there before anything else is written, and goes when everything else is there.
+bool is_in_order(int file, std::string_view mark) { return mark.empty() || sync_content(file); }
+
+bool write_mark(int file, std::string_view mark) {
+    if (mark.empty()) {
+        return true;
+    }
+    struct stat status;
+    if (fstat(file, &status) != 0) {
+        return false;
+    }
+    // A size may come to the disk later than what is written beyond the old one: a file that is
+    // shorter than the mark grows before, so that the mark has no part missing.
+    const auto size = static_cast<size_t>(status.st_size);
+    if (size < mark.size() && !write_blank_lines(file, size, mark.size())) {
+        return give_back(file, size);
+    }
+    return write_all(file, mark, 0) && is_in_order(file, mark);
+}
+
 /// Puts the head in the place of the mark, and cuts the file to its size.
-bool finish_content(int file, std::string_view head, size_t place, size_t size) {
+bool finish_content(int file, std::string_view head, std::string_view mark, size_t size) {
     // The mark, and what takes its place, is less than the system writes at once: it is there, or
     // it isn't. Blank lines fill the place when the text is shorter.
+    const size_t place = mark.size();
     std::array<char, longest_mark> filled;
     filled.fill('\n');
     head.copy(filled.data(), filled.size());
-    return resize(file, std::max(size, place)) && write_all(file, {filled.data(), place}, 0) &&
-           (size >= place || resize(file, size));
+    return resize(file, std::max(size, place)) && is_in_order(file, mark) &&
+           write_all(file, {filled.data(), place}, 0) &&
+           (size >= place || (is_in_order(file, mark) && resize(file, size)));
 }
 
 }  // namespace
@@ -193,24 +233,19 @@ bool read_first(int file, size_t count, std::string& bytes) {
     return part.data() != nullptr;
 }
 
-bool reserve(int file, size_t present, size_t wanted) {
+bool reserve(int file, size_t present, size_t wanted, bool is_marked) {
     if (!is_within_limit(wanted)) {
         return false;
     }
-    if (unshare(file, std::min(present, wanted)) && extend(file, present, wanted)) {
-        return true;
-    }
-    const int error = errno;
-    resize(file, present);  // gives back what was got
-    errno = error;
-    return false;
+    return (unshare(file, std::min(present, wanted)) && extend(file, present, wanted, is_marked)) ||
+           give_back(file, present);
 }
 
 bool replace_content(int file, std::string_view text, std::string_view mark) {
     const size_t place = mark.size();
     const std::string_view head = text.substr(0, place);
-    return write_all(file, mark, 0) && write_all(file, text.substr(head.size()), place) &&
-           finish_content(file, head, place, text.size());
+    return write_mark(file, mark) && write_all(file, text.substr(head.size()), place) &&
+           finish_content(file, head, mark, text.size());
 }
 
 bool replace_content(int file, int other, std::string_view mark) {
@@ -221,8 +256,8 @@ bool replace_content(int file, int other, std::string_view mark) {
     if (head.data() == nullptr || fstat(other, &status) != 0) {
         return false;
     }
-    return write_all(file, mark, 0) && copy_from(other, file, place) &&
-           finish_content(file, head, place, static_cast<size_t>(status.st_size));
+    return write_mark(file, mark) && copy_from(other, file, place) &&
+           finish_content(file, head, mark, static_cast<size_t>(status.st_size));
 }
 
 bool is_content(int file, std::string_view text, bool& is_so) {

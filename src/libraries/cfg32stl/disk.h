@@ -18,14 +18,16 @@ bool read_all(int file, size_t expected, std::string& text);
 bool read_first(int file, size_t count, std::string& bytes);
 
 /// Takes the room that a text of `wanted` bytes needs in the place of the file's present content.
-/// After a failure the file is what it was.
-bool reserve(int file, size_t present, size_t wanted);
+/// After a failure the file is what it was. Where the file system can't reserve, room is taken by
+/// blank lines at the end; but what will be marked waits for that until it is written: no power cut
+/// shall leave half of such lines without the mark.
+bool reserve(int file, size_t present, size_t wanted, bool is_marked = false);
 
 /// Marks are not longer than this.
 inline constexpr size_t longest_mark = 128;
 
 /// Makes the text the file's whole content. Until it is complete the file begins with the mark, if
-/// there is one.
+/// there is one, on the disk as well. The last step is not synced.
 bool replace_content(int file, std::string_view text, std::string_view mark = {});
 
 /// The same with what another file holds.

@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <limits>
+#include <optional>
 
 #include "LDIF_Entry.h"
 #include "LDIF_Exception.h"
@@ -53,11 +54,31 @@ size_t simple_rdn_length(std::string_view text) {
     return is_plain ? at : 0;
 }
 
+/// Calls use(place) for the place of each RDN in a DN that is written in the simplest way, but not
+/// for the first, and for the one behind them where another would begin. Their number; nothing for
+/// another text.
+template <class Use>
+std::optional<size_t> read_rdns(std::string_view text, Use use) {
+    constexpr size_t last_place = std::numeric_limits<uint32_t>::max();
+    size_t count = 0;
+    for (size_t begin = 0; begin < text.size(); ++count) {
+        const size_t length = simple_rdn_length(text.substr(begin));
+        const std::string_view rest = text.substr(begin + length);
+        begin += length + separator.size();
+        const bool is_last = rest.empty();
+        const bool is_followed = rest.size() > separator.size() && rest.starts_with(separator);
+        if (length == 0 || begin > last_place || !(is_last || is_followed)) {
+            return std::nullopt;
+        }
+        use(begin);
+    }
+    return count;
+}
+
 }  // namespace
 
 kept_dn::kept_dn(const given_text& text) {
-    dn_path::places begins;
-    if (const std::optional<size_t> count = dn_path::read_simple(text, begins)) {
+    if (const std::optional<size_t> count = read_rdns(text, [](size_t) {})) {
         text_ = text;
         size_ = *count;
     } else {
@@ -66,10 +87,8 @@ kept_dn::kept_dn(const given_text& text) {
 }
 
 kept_dn::kept_dn(LDIF_DN dn) : size_(dn.rdns().size()) {
-    const std::optional<std::string> text =
-        size_ <= dn_path::most_rdns ? printed(dn) : std::nullopt;
-    dn_path::places begins;
-    if (text && dn_path::read_simple(*text, begins)) {
+    const std::optional<std::string> text = printed(dn);
+    if (text && is_simple(*text)) {
         text_ = given_text(*text);
     } else {
         parsed_ = std::make_unique<LDIF_DN>(std::move(dn));
@@ -77,8 +96,7 @@ kept_dn::kept_dn(LDIF_DN dn) : size_(dn.rdns().size()) {
 }
 
 bool kept_dn::is_simple(std::string_view text) {
-    dn_path::places begins;
-    return dn_path::read_simple(text, begins).has_value();
+    return read_rdns(text, [](size_t) {}).has_value();
 }
 
 kept_dn::kept_dn(const kept_dn& other)
@@ -97,17 +115,40 @@ bool kept_dn::ends_with(const kept_dn& other) const {
     return before.ends_with(separator) && text().ends_with(other.text());
 }
 
+/// The text of the RDNs but the first `from`, counted from the root, of a simple DN.
+std::string_view kept_dn::leaf_side(size_t from) const {
+    size_t end = 0;
+    for (size_t count = from; count < size_; ++count) {
+        end = std::min(text().find(separator.front(), end), text_.size()) + separator.size();
+    }
+    return text().substr(0, end - std::min(end, separator.size()));
+}
+
+LDIF_DN kept_dn::without_root_side(size_t count) const {
+    if (!parsed_) {
+        return LDIF_DN(cisString(std::string(leaf_side(count))));
+    }
+    LDIF_DN dn = *parsed_;
+    dn.remove_root_side(count);
+    return dn;
+}
+
+std::span<const LDIF_RDN> kept_dn::rdns_from(size_t from, LDIF_DN& memory) const {
+    if (parsed_) {
+        return std::span(parsed_->rdns()).subspan(from);
+    }
+    memory = without_root_side(from);
+    return memory.rdns();
+}
+
 void kept_dn::append_to(std::string& out) const {
     parsed_ ? parsed_->append_to(out) : static_cast<void>(out += text_.view());
 }
 
 dn_path::dn_path(const LDIF_DN& dn) : size_(dn.rdns().size()), dn_(&dn) {
-    if (size_ > most_rdns) {
-        return;
-    }
     if (std::optional<std::string> text = printed(dn)) {
         own_text_ = std::move(*text);
-        text_ = read_simple(own_text_, begins_) ? own_text_ : std::string_view();
+        read_simple(own_text_);
     }
 }
 
@@ -121,49 +162,31 @@ dn_path::dn_path(const kept_dn& dn) : size_(dn.size()) {
 }
 
 dn_path::dn_path(std::string_view text) {
-    if (const std::optional<size_t> count = read_simple(text, begins_)) {
-        text_ = text;
-        size_ = *count;
-    } else {
+    if (!read_simple(text)) {
         own_dn_ = std::make_unique<LDIF_DN>(cisString(std::string(text)));
         dn_ = own_dn_.get();
         size_ = dn_->rdns().size();
     }
 }
 
-/// The number of RDNs of a DN that is written in the simplest way, and where each begins. Behind
-/// them stands where another would begin.
-std::optional<size_t> dn_path::read_simple(std::string_view text, places& begins) {
-    size_t begin = 0;
-    begins[0] = 0;
-    if (text.empty()) {
-        return 0;
+/// Takes the text if it is a DN written in the simplest way.
+bool dn_path::read_simple(std::string_view text) {
+    begins_.add(0);
+    const std::optional<size_t> count = read_rdns(text, [&](size_t begin) { begins_.add(begin); });
+    if (count) {
+        text_ = text;
+        size_ = *count;
     }
-    for (size_t count = 1; count <= most_rdns; ++count) {
-        begin += simple_rdn_length(text.substr(begin));
-        const bool is_rdn = begin > begins[count - 1];
-        if (!is_rdn || begin > std::numeric_limits<uint32_t>::max() - separator.size()) {
-            return std::nullopt;
-        }
-        begins[count] = static_cast<uint32_t>(begin + separator.size());
-        if (begin == text.size()) {
-            return count;
-        }
-        if (!text.substr(begin).starts_with(separator)) {
-            return std::nullopt;
-        }
-        begin += separator.size();
-    }
-    return std::nullopt;
+    return count.has_value();
 }
 
-/// The same of a text that is known to be simple: there a comma is that of a separator.
+/// Takes one that is known to be so: there a comma is that of a separator.
 void dn_path::find_rdns() {
     size_t begin = 0;
-    begins_[0] = 0;
+    begins_.add(0);
     for (size_t count = 1; count <= size_; ++count) {
         begin = std::min(text_.find(separator.front(), begin), text_.size()) + separator.size();
-        begins_[count] = static_cast<uint32_t>(begin);
+        begins_.add(begin);
     }
 }
 
@@ -171,6 +194,15 @@ void dn_path::find_rdns() {
 std::string_view dn_path::part(size_t from, size_t to) const {
     const size_t begin = begins_[size_ - to];
     return text_.substr(begin, begins_[size_ - from] - separator.size() - begin);
+}
+
+/// The RDNs from `from` up to `to`. Those of a simple DN are read into memory.
+std::span<const LDIF_RDN> dn_path::rdns(size_t from, size_t to, LDIF_DN& memory) const {
+    if (!is_simple()) {
+        return std::span(dn_->rdns()).subspan(from, to - from);
+    }
+    memory = LDIF_DN(cisString(std::string(part(from, to))));
+    return memory.rdns();
 }
 
 const LDIF_DN& dn_path::dn() const {
@@ -221,7 +253,11 @@ bool dn_path::is_relative_dn(size_t from, size_t to, const LDIF_Entry& entry) co
     }
     const kept_dn& other = entry.named_dn();
     if (!is_simple() || !other.is_simple()) {
-        return has_equal_part(from, dn_path(other), entry.depth(), to - from);
+        // Only so much of a long DN is read as there is to be compared.
+        LDIF_DN own_memory;
+        LDIF_DN other_memory;
+        return std::ranges::equal(rdns(from, to, own_memory),
+                                  other.rdns_from(entry.depth(), other_memory));
     }
     const std::string_view own = part(from, to);
     const std::string_view text = other.text();
@@ -242,10 +278,10 @@ bool dn_path::has_equal_part(size_t from, const dn_path& other, size_t other_fro
         return compare_without_case(part(from, from + count),
                                     other.part(other_from, other_from + count)) == 0;
     }
-    const auto own_rdns = dn().rdns().begin() + static_cast<ptrdiff_t>(from);
-    const auto other_rdns = other.dn().rdns().begin() + static_cast<ptrdiff_t>(other_from);
-    const auto equal = [](const LDIF_RDN& l, const LDIF_RDN& r) { return l == r; };
-    return std::equal(own_rdns, own_rdns + static_cast<ptrdiff_t>(count), other_rdns, equal);
+    LDIF_DN own_memory;
+    LDIF_DN other_memory;
+    return std::ranges::equal(rdns(from, from + count, own_memory),
+                              other.rdns(other_from, other_from + count, other_memory));
 }
 
 }  // namespace cfg32

@@ -10,9 +10,10 @@
 #include <array>
 #include <cstdint>
 #include <memory>
-#include <optional>
+#include <span>
 #include <string>
 #include <string_view>
+#include <vector>
 
 #include "LDIF_DN.h"
 #include "kept_text.h"
@@ -48,13 +49,41 @@ class kept_dn {
     /// True when both are simple and the other stands at the end of this one, with an RDN before
     /// it.
     bool ends_with(const kept_dn& other) const;
+    /// What is left of the DN without so many RDNs on the root side.
+    LDIF_DN without_root_side(size_t count) const;
+    /// The RDNs of that. Those of a simple DN are read into memory.
+    std::span<const LDIF_RDN> rdns_from(size_t count, LDIF_DN& memory) const;
     /// Appends the canonical form; throws what LDIF_DN::str() throws.
     void append_to(std::string& out) const;
 
   private:
+    std::string_view leaf_side(size_t from) const;
+
     kept_text text_;
     std::unique_ptr<LDIF_DN> parsed_;  // of a DN that is not simple
     size_t size_ = 0;
+};
+
+/// Where the RDNs of a simple DN stand in its text, from the leaf on, and behind them where another
+/// would. Only a long DN has them on the heap.
+class rdn_places {
+  public:
+    void add(size_t place) {
+        const auto narrow = static_cast<uint32_t>(place);
+        if (count_ < first_.size()) {
+            first_[count_++] = narrow;
+        } else {
+            others_.push_back(narrow);
+        }
+    }
+    size_t operator[](size_t i) const {
+        return i < first_.size() ? first_[i] : others_[i - first_.size()];
+    }
+
+  private:
+    std::array<uint32_t, 25> first_;  // as far as they are there
+    size_t count_ = 0;
+    std::vector<uint32_t> others_;
 };
 
 /// A DN as a tree is searched for it. What it is made of must outlive it.
@@ -83,21 +112,17 @@ class dn_path {
     bool has_equal_part(size_t from, const dn_path& other, size_t other_from, size_t count) const;
 
   private:
-    friend class kept_dn;
-
-    static constexpr size_t most_rdns = 24;  // of a simple DN
-    using places = std::array<uint32_t, most_rdns + 1>;
-
-    static std::optional<size_t> read_simple(std::string_view text, places& begins);
+    bool read_simple(std::string_view text);
     void find_rdns();
     std::string_view part(size_t from, size_t to) const;
     int compare_rdn(size_t i, const dn_path& other) const;
+    std::span<const LDIF_RDN> rdns(size_t from, size_t to, LDIF_DN& memory) const;
     bool is_simple() const { return text_.data(); }
     const LDIF_DN& dn() const;
 
     std::string own_text_;
     std::string_view text_;  // of a simple DN
-    places begins_;          // where its RDNs stand in the text, from the leaf on
+    rdn_places begins_;
     size_t size_ = 0;
     struct hashed_rdn {
         size_t i;

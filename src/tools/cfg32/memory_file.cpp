@@ -17,6 +17,8 @@ namespace cfg32::tool {
 
 namespace {
 
+constexpr const char* name_in_messages = "a private copy in memory";
+
 [[noreturn]] void fail_with_errno(const std::string& name, int code) {
     const int error = errno;
     fail(code, name + ": " + strerror(error));
@@ -57,11 +59,11 @@ memory_file::memory_file(std::string_view text)
     : file_(memfd_create("configuration", MFD_CLOEXEC)),
       name_(fmt::format("/proc/self/fd/{}", file_.get())) {
     if (!file_ || !replace_content(file_.get(), text)) {
-        fail_with_errno("a private copy in memory", CFG_OTHER);
+        fail_with_errno(name_in_messages, CFG_OTHER);
     }
 }
 
-std::string memory_file::text() const { return content_of(file_.get(), 0, name_); }
+std::string memory_file::text() const { return content_of(file_.get(), 0, name_in_messages); }
 
 std::string read_configuration(const std::string& name) {
     const progress reading("Reading " + name);

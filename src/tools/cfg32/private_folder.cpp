@@ -10,12 +10,18 @@
 
 #include "disk.h"
 #include "outcome.h"
+#include "terminal.h"
 #include "unique_fd.h"
 
 namespace cfg32::tool {
 
 private_folder::private_folder() {
-    std::string name = (std::filesystem::temp_directory_path() / "cfg32-XXXXXX").string();
+    std::error_code error;
+    const std::filesystem::path place = std::filesystem::temp_directory_path(error);
+    if (error) {
+        fail_for_system("the folder for temporary files (TMPDIR)", error.value());
+    }
+    std::string name = (place / "cfg32-XXXXXX").string();
     if (!mkdtemp(name.data())) {
         fail_for_system(name, errno);
     }
@@ -24,8 +30,11 @@ private_folder::private_folder() {
 
 private_folder::~private_folder() {
     if (!is_kept_) {
-        std::error_code ignored;
-        std::filesystem::remove_all(path_, ignored);
+        std::error_code error;
+        std::filesystem::remove_all(path_, error);
+        if (error) {
+            complain(path_.string() + " can't be removed: " + error.message());
+        }
     }
 }
 

@@ -17,25 +17,41 @@
 
 namespace cfg32::tool {
 
+namespace {
+
+/// Takes the status of a file; false when there is no such file. What can't be told is no such
+/// answer: a file that is taken for missing would be overwritten.
+bool has_status(const std::string& name, struct stat& status) {
+    if (stat(name.c_str(), &status) == 0) {
+        return true;
+    }
+    if (errno != ENOENT && errno != ENOTDIR) {
+        fail_for_system(name, errno);
+    }
+    return false;
+}
+
+}  // namespace
+
 bool is_there(const std::string& name) {
     struct stat status;
-    return stat(name.c_str(), &status) == 0;
+    return has_status(name, status);
 }
 
 bool is_same(const std::string& left, const std::string& right) {
     struct stat left_status;
     struct stat right_status;
-    return stat(left.c_str(), &left_status) == 0 && stat(right.c_str(), &right_status) == 0 &&
+    return has_status(left, left_status) && has_status(right, right_status) &&
            is_same_file(left_status, right_status);
 }
 
 bool is_newer(const std::string& one, const std::string& other) {
     struct stat status;
     struct stat other_status;
-    if (stat(one.c_str(), &status) != 0) {
+    if (!has_status(one, status)) {
         return false;
     }
-    return stat(other.c_str(), &other_status) != 0 ||
+    return !has_status(other, other_status) ||
            std::pair(status.st_ctim.tv_sec, status.st_ctim.tv_nsec) >
                std::pair(other_status.st_ctim.tv_sec, other_status.st_ctim.tv_nsec);
 }

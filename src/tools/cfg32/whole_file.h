@@ -4,17 +4,19 @@
 
 namespace cfg32::tool {
 
+// The first ones end the command when the system can't tell.
+
 /// True when a file has that name.
 bool is_there(const std::string& name);
 
 /// True when both names are there and mean the same file.
 bool is_same(const std::string& left, const std::string& right);
 
-/// The name that a name means, if it is of a symbolic link, also of one to nothing.
-std::string target_of(const std::string& name);
-
 /// True when the one is there and was made after the other, or the other is not there.
 bool is_newer(const std::string& one, const std::string& other);
+
+/// The name that a name means, if it is of a symbolic link, also of one to nothing.
+std::string target_of(const std::string& name);
 
 /// Copies a file, complete and durable, with its owner, group and mode. Ends the command when that
 /// can't be done.

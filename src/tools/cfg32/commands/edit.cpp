@@ -44,7 +44,8 @@ class draft_keeper {
         struct sigaction action {};
         action.sa_handler = tell_and_end;
         action.sa_flags = SA_RESETHAND;
-        for (const int signal : {SIGHUP, SIGINT, SIGTERM}) {
+        for (const int signal :
+             {SIGHUP, SIGINT, SIGQUIT, SIGPIPE, SIGALRM, SIGTERM, SIGUSR1, SIGUSR2, SIGXCPU}) {
             struct sigaction before {};
             sigaction(signal, &action, &before);
             if (before.sa_handler == SIG_IGN) {
@@ -149,8 +150,10 @@ int session::run() {
 void session::keep_draft() {
     if (!is_unedited()) {
         folder_.keep();
-        tell(fmt::format("what you edited is kept in {}\n",
-                         is_there(path_) ? path_ : path_.substr(0, path_.rfind('/'))));
+        std::error_code ignored;
+        tell(fmt::format(
+            "what you edited is kept in {}\n",
+            std::filesystem::exists(path_, ignored) ? path_ : path_.substr(0, path_.rfind('/'))));
     }
 }
 

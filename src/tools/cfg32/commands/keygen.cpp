@@ -44,18 +44,19 @@ bool is_name_synced(const std::string& name) {
 int keygen(const arguments& given) {
     const held_back_signals until_done;
     const char* name = given.file.c_str();
-    unique_fd file(open(name, O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, of_owner_only));
-    if (!file) {
-        fail_for_system(given.file, errno);
-    }
     std::array<char, largest_key> key{};
+    // Before there is a file: where there are no random numbers, this ends the program.
     randombytes_buf(key.data(), given.bytes);
-    const bool is_done = is_written(file.get(), {key.data(), given.bytes}) && file.close() &&
-                         is_name_synced(given.file);
+    unique_fd file(open(name, O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, of_owner_only));
+    const bool is_made = static_cast<bool>(file);
+    const bool is_done = is_made && is_written(file.get(), {key.data(), given.bytes}) &&
+                         file.close() && is_name_synced(given.file);
     const int error = errno;
     sodium_memzero(key.data(), key.size());
     if (!is_done) {
-        unlink(name);
+        if (is_made) {
+            unlink(name);
+        }
         fail_for_system(given.file, error);
     }
     return done;
