@@ -236,7 +236,7 @@ TEST_P(failing_calls, NeedNoBackupToPutTheOldContentBack) {
     size_t writing = 0;
     for (const bool fails : {false, true}) {
         stage on(setting);
-        std::vector<fault> faults = {{opening, effect::comes_before, 0, "", [&] {
+        std::vector<fault> faults = {{opening, effect::comes_before, 0, "", [&](const seen_call&) {
                                           EXPECT_EQ(truncate(on.folder().backup().c_str(), 1), 0);
                                       }}};
         if (fails) {

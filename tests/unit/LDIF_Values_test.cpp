@@ -570,6 +570,19 @@ TEST(LDIF_Values, ErasedValuesAreGoneBeforeTheirGapsAreClosed) {
     }
 }
 
+TEST(LDIF_Values, APlaceIsTheSameAfterAnotherWasLookedFor) {
+    for (const int count : {5, 40}) {
+        LDIF_Values values("cn", nullptr);
+        for (int i = 0; i < count; ++i) {
+            values += std::to_string(i);
+        }
+        values -= "0";
+        const auto first = values.begin();
+        EXPECT_EQ(std::distance(first, values.find("3")), 2);
+        EXPECT_EQ(first->str(), "1");
+    }
+}
+
 TEST(LDIF_Values, AreTheSameAfterTheyWereAssignedToThemselves) {
     LDIF_Values values = list_of("cn", {"a", "b"});
     const LDIF_Values& self = values;

@@ -367,9 +367,12 @@ size_t LDIF_Values::position_of(const LDIF_Value& value) const {
     }
     equal_texts* const equal = value.attrType == type() ? equal_texts_of(*type()) : nullptr;
     const auto is_equal = [&](const kept_text& own) {
-        return equal ? equal(own, value.text) : value_of(own).compare(value) == 0;
+        return own.has_value() &&
+               (equal ? equal(own, value.text) : value_of(own).compare(value) == 0);
     };
-    return static_cast<size_t>(std::ranges::find_if(texts(), is_equal) - texts().begin());
+    // Gaps stay: who holds a place of the list may look for another.
+    const std::span<const kept_text> all = texts_and_gaps();
+    return static_cast<size_t>(std::ranges::find_if(all, is_equal) - all.begin());
 }
 
 size_t LDIF_Values::indexed_position_of(const LDIF_Value& value) const {
@@ -385,8 +388,11 @@ size_t LDIF_Values::indexed_position_of(const LDIF_Value& value) const {
 const LDIF_Values::hash_index& LDIF_Values::index() const {
     if (!several_->good_index()) {
         auto index = std::make_unique<hash_index>();
-        for (size_t position = 0; const kept_text& text : texts()) {
-            index->positions.emplace(hash_of(value_of(text)), position++);
+        const std::span<const kept_text> all = texts_and_gaps();
+        for (size_t position = 0; position < all.size(); ++position) {
+            if (all[position].has_value()) {
+                index->positions.emplace(hash_of(value_of(all[position])), position);
+            }
         }
         several_->index = std::move(index);
     }
