@@ -32,19 +32,20 @@ void checked_entries::add(entry_section& section, LDIF_Attribute&& attribute, in
     const auto known = section.attributes.find(attribute.name());
     if (known == section.attributes.end()) {
         value_lines_[attribute.values().texts().front().view().data()] = line;
-        section.attributes += std::move(attribute);
+        section.attributes.emplace(attribute.name(), std::move(attribute));
         return;
     }
-    const size_t before = known->values().size();
-    *known += attribute;
-    if (known->values().size() > before) {
-        value_lines_[known->values().texts().back().view().data()] = line;
+    LDIF_Attribute& present = known->second;
+    const size_t before = present.values().size();
+    present += attribute;
+    if (present.values().size() > before) {
+        value_lines_[present.values().texts().back().view().data()] = line;
         if (is_told) {
-            report_second_value(*known, line, section.written);
+            report_second_value(present, line, section.written);
         }
     } else if (is_told) {
         // Read again, as the load does it: the text of a DN may be that of another one.
-        const LDIF_Value first = *known->values().find(attribute.values().begin()->str());
+        const LDIF_Value first = *present.values().find(attribute.values().begin()->str());
         problem& found = found_.add(kind::duplicate_value, file_.value_place(line),
                                     "value stands twice, the first one" + on_line(line_of(first)) +
                                         "; the next rewrite drops this one");
@@ -85,7 +86,7 @@ checked_entries::checked_entry* checked_entries::find(const LDIF_DN& dn) {
 void checked_entries::add_header(LDIF_Attribute&& attribute, int line) {
     entry_section header;
     value_lines_[attribute.values().texts().front().view().data()] = line;
-    header.attributes += std::move(attribute);
+    header.attributes.emplace(attribute.name(), std::move(attribute));
     close(std::move(header));
 }
 
@@ -112,12 +113,12 @@ void checked_entries::close(entry_section&& section) {
 void checked_entries::merge(checked_entry& known, entry_section& section) {
     const bool is_entry = !section.dn.empty();
     try {
-        for (LDIF_Attribute& attribute : section.attributes) {
-            const auto same = known.attributes.find(attribute.name());
+        for (auto& [name, attribute] : section.attributes) {
+            const auto same = known.attributes.find(name);
             if (same == known.attributes.end()) {
-                known.attributes += std::move(attribute);
+                known.attributes.emplace(name, std::move(attribute));
             } else {
-                merge(*same, attribute, section);
+                merge(same->second, attribute, section);
             }
         }
     } catch (const LDIF_Exception& e) {
@@ -236,7 +237,7 @@ std::string checked_entries::why_unwritable(const checked_entry& entry) const {
     if (is_unprintable(entry.dn)) {
         return "a value of its DN is empty, or has a line break or NUL";
     }
-    for (const LDIF_Attribute& attribute : entry.attributes) {
+    for (const auto& [name, attribute] : entry.attributes) {
         const bool is_header = is_of_root(attribute) && attribute.values().size() <= 1;
         if (entry.dn.empty() && !is_header) {
             return fmt::format("it has no DN, but the attribute {}", attribute.name().text());
