@@ -34,7 +34,7 @@ constexpr bool is_memory_measured() {
 
 bool is_full_size() { return number_from_environment("CFG32_HOSTILE_SCALE", 0) > 0; }
 
-/// A file and its backup, in memory unless they are too large for that.
+/// A file and its backup.
 class large_folder {
   public:
     large_folder(const large_file& one, size_t count) {
@@ -70,7 +70,7 @@ bool is_same_file(const std::string& left, const std::string& right) {
 class large_session {
   public:
     large_session(const large_folder& folder, std::string subject)
-        : folder_(folder), handle_(cfg_init()), subject_(std::move(subject)) {
+        : handle_(cfg_init()), subject_(std::move(subject)) {
         cfg_set_option(handle_, CFG_OPT_CONFIG_FILE, folder.config().c_str());
         cfg_set_option(handle_, CFG_OPT_BACKUP_FILE, folder.backup().c_str());
     }
@@ -138,7 +138,6 @@ class large_session {
         EXPECT_EQ(code, CFG_SUCCESS) << std::string(report ? report : "").substr(0, 2000);
     }
 
-    const large_folder& folder_;
     CfgHandle* handle_;
     std::string subject_;
 };
@@ -156,6 +155,9 @@ void use(const large_folder& folder, const large_file& one, size_t count) {
     session.draw();
     session.change_and_change_back();
     EXPECT_TRUE(is_same_file(folder.config(), canonical));
+    session.flush();
+    EXPECT_TRUE(is_same_file(folder.config(), canonical));
+    EXPECT_TRUE(is_same_file(folder.backup(), canonical));
     std::filesystem::remove(canonical);
 
     large_session again(folder, one.subject(count));
