@@ -79,7 +79,7 @@ int checked_entries::line_of(const LDIF_Value& value) const {
 checked_entries::checked_entry* checked_entries::find(const LDIF_DN& dn) {
     const auto [first, last] = by_dn_.equal_range(dn.hash());
     const auto same =
-        std::find_if(first, last, [&](const auto& row) { return row.second->dn == dn; });
+        std::find_if(first, last, [&](const auto& row) { return row.second->dn() == dn; });
     return same == last ? nullptr : same->second;
 }
 
@@ -95,8 +95,7 @@ void checked_entries::close(entry_section&& section) {
         if (checked_entry* known = find(section.dn)) {
             merge(*known, section);
         } else {
-            entries_.push_back({section.dn,
-                                section.written,
+            entries_.push_back({section.written,
                                 section.where,
                                 std::move(section.attributes),
                                 {{section.where, section.first, section.last}}});
@@ -166,8 +165,9 @@ void checked_entries::merge(LDIF_Attribute& known, const LDIF_Attribute& again,
 
 void checked_entries::finish() {
     for (const checked_entry& entry : entries_) {
-        check_ancestors(entry);
-        check_writing(entry);
+        const LDIF_DN dn = entry.dn();
+        check_ancestors(entry, dn);
+        check_writing(entry, dn);
     }
     if (!find(LDIF_DN(configuration_dn))) {
         const int last = std::max(file_.line_count(), 1);
@@ -178,11 +178,11 @@ void checked_entries::finish() {
 
 /// Below the nearest ancestor that is there, the others are missing. Where none is there, the entry
 /// is the topmost of its tree.
-void checked_entries::check_ancestors(const checked_entry& entry) {
+void checked_entries::check_ancestors(const checked_entry& entry, const LDIF_DN& dn) {
     constexpr int named = 3;
     std::string missing;
     int count = 0;
-    LDIF_DN ancestor = entry.dn;
+    LDIF_DN ancestor = dn;
     while (ancestor.rdns().size() > 1) {
         ancestor.remove_leaf();
         if (find(ancestor)) {
@@ -205,8 +205,8 @@ void checked_entries::check_ancestors(const checked_entry& entry) {
 }
 
 /// A rewrite fails for the whole file when one entry would not read back.
-void checked_entries::check_writing(const checked_entry& entry) {
-    const std::string reason = why_unwritable(entry);
+void checked_entries::check_writing(const checked_entry& entry, const LDIF_DN& dn) {
+    const std::string reason = why_unwritable(entry, dn);
     if (reason.empty()) {
         return;
     }
@@ -214,7 +214,7 @@ void checked_entries::check_writing(const checked_entry& entry) {
         if (first == 0) {
             continue;  // version and charset
         }
-        if (!is_rewritten_ && entry.dn.empty()) {
+        if (!is_rewritten_ && dn.empty()) {
             return;  // said of its DN line
         }
         problem& found =
@@ -233,13 +233,13 @@ void checked_entries::check_writing(const checked_entry& entry) {
     }
 }
 
-std::string checked_entries::why_unwritable(const checked_entry& entry) const {
-    if (is_unprintable(entry.dn)) {
+std::string checked_entries::why_unwritable(const checked_entry& entry, const LDIF_DN& dn) const {
+    if (is_unprintable(dn)) {
         return "a value of its DN is empty, or has a line break or NUL";
     }
     for (const auto& [name, attribute] : entry.attributes) {
         const bool is_header = is_of_root(attribute) && attribute.values().size() <= 1;
-        if (entry.dn.empty() && !is_header) {
+        if (dn.empty() && !is_header) {
             return fmt::format("it has no DN, but the attribute {}", attribute.name().text());
         }
         std::string reason = why_unwritable(attribute);

@@ -49,8 +49,11 @@ class checked_entries {
     void finish();
 
   private:
+    /// Taken apart, a DN takes many times the room of its text, so it is read again where it is
+    /// asked for.
     struct checked_entry {
-        LDIF_DN dn;
+        LDIF_DN dn() const { return LDIF_DN(cisString(written)); }
+
         std::string written;
         place where;
         checked_attributes attributes;
@@ -66,9 +69,9 @@ class checked_entries {
     void merge(checked_entry& known, entry_section& section);
     void merge(LDIF_Attribute& known, const LDIF_Attribute& again, const entry_section& section);
     void report_second_value(const LDIF_Attribute& attribute, int line, const std::string& entry);
-    void check_ancestors(const checked_entry& entry);
-    void check_writing(const checked_entry& entry);
-    std::string why_unwritable(const checked_entry& entry) const;
+    void check_ancestors(const checked_entry& entry, const LDIF_DN& dn);
+    void check_writing(const checked_entry& entry, const LDIF_DN& dn);
+    std::string why_unwritable(const checked_entry& entry, const LDIF_DN& dn) const;
     std::string why_unwritable(const LDIF_Attribute& attribute) const;
     int line_of(const LDIF_Value& value) const;
 
