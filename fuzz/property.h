@@ -44,6 +44,10 @@ struct named_property {
     property* check;
 };
 
+inline std::ostream& operator<<(std::ostream& out, const named_property& one) {
+    return out << one.name;
+}
+
 inline constexpr named_property properties[] = {
 #define PROPERTY(name, promise) {#name, promise, name##_property},
 #include "properties.def"

@@ -1,3 +1,5 @@
+#include <cstdint>
+#include <cstring>
 #include <optional>
 #include <utility>
 
@@ -32,10 +34,15 @@ std::optional<LDIF_Value> accepted(const _AttrType* type, const std::string& tex
 }
 
 std::optional<LDIF_Value> accepted_bytes(const _AttrType* type, const std::string& bytes) {
-    if (bytes.size() != sizeof(int64_t)) {
+    int64_t number = 0;
+    if (bytes.size() != sizeof number) {
         return {};  // an integer's bytes are so many
     }
-    return comparable([&] { return LDIF_Value(type, bytes.data(), sizeof(int64_t), nullptr); });
+    memcpy(&number, bytes.data(), sizeof number);
+    if (number != static_cast<int32_t>(number)) {
+        return {};  // KEPT: of a text only 32 bits are accepted, of bytes 64
+    }
+    return comparable([&] { return LDIF_Value(type, bytes.data(), sizeof number, nullptr); });
 }
 
 void require_print(const LDIF_Value& value) {

@@ -62,6 +62,29 @@ static void a_decoded_password_is_wiped_when_the_search_fails(void **state) {
     assert_freed_and_zero(sizeof "open sesame");
 }
 
+/* The second copy finds no memory: nobody else will see the first. */
+static void the_copy_of_a_password_is_wiped_when_there_is_none_of_the_next(void **state) {
+    char name[] = "oru-slapdMasterPW";
+    char *attrs[] = {name, NULL};
+    struct fixture *f = *state;
+    reset_host();
+    load(f, CONFIGURATION_HEAD
+         "oru-slapdMasterPW: {HOST}open sesame\noru-slapdMasterPW: {HOST}other\n");
+    CfgMessage *result = found(f->handle, BASE, CFG_SCOPE_BASE, NULL, attrs);
+    watch_text("open sesame");
+    fail_call(call_strdup, 2);
+    char **values = cfg_get_values(f->handle, result, name);
+    assert_int_equal(stop_failing(), 1);
+    assert_null(values);
+    assert_int_equal(cfg_get_errno(f->handle), CFG_NO_MEMORY);
+    assert_int_equal(freed_with_text(), 0);
+    values = cfg_get_values(f->handle, result, name);
+    cfg_value_free(values);
+    assert_int_equal(freed_with_text(), 1); /* copies that were given are the caller's to wipe */
+    watch_text(NULL);
+    cfg_msgfree(result);
+}
+
 static void use(const struct fixture *f, CfgHandle *handle) {
     CfgMessage *result = NULL;
     for (int i = 0; i < 2; ++i) {
@@ -93,6 +116,7 @@ int main(void) {
         CREATED(a_released_handle_leaves_nothing_behind),
         CREATED(a_decoded_password_is_wiped_when_its_result_is_freed),
         CREATED(a_decoded_password_is_wiped_when_the_search_fails),
+        CREATED(the_copy_of_a_password_is_wiped_when_there_is_none_of_the_next),
     };
     reset_host();
     return cmocka_run_group_tests_name("wiped_memory", tests, NULL, NULL);

@@ -221,6 +221,49 @@ TEST_P(failing_calls, ThatKeepTheOldContentFromBeingPutBackAreToldAndTheBackupIs
     EXPECT_GE(rows, 6) << listed(calls);
 }
 
+// Somebody else shortens the backup when it is made: the old content is put back without it.
+TEST_P(failing_calls, NeedNoBackupToPutTheOldContentBack) {
+    if (!setting.has_backup) {
+        GTEST_SKIP() << "there is none";
+    }
+    const auto of_backup = [](const seen_call& call) {
+        return call.name.starts_with("open") &&
+               call.about.find("oruslapd.bak") != std::string::npos;
+    };
+    const auto last = std::find_if(calls.rbegin(), calls.rend(), of_backup);
+    ASSERT_NE(last, calls.rend()) << listed(calls);
+    const size_t opening = static_cast<size_t>(calls.rend() - last);
+    size_t writing = 0;
+    for (const bool fails : {false, true}) {
+        stage on(setting);
+        std::vector<fault> faults = {{opening, effect::comes_before, 0, "", [&] {
+                                          EXPECT_EQ(truncate(on.folder().backup().c_str(), 1), 0);
+                                      }}};
+        if (fails) {
+            faults.push_back({writing, effect::fails, EIO});
+        }
+        const int code = on.play(faults);
+        EXPECT_EQ(code, fails ? CFG_OTHER : CFG_SUCCESS) << listed(on.seen()) << on.report();
+        EXPECT_EQ(on.folder().text(), fails ? versions[versions.size() - 2] : after);
+        writing = last_overwriting(on.seen());
+    }
+}
+
+// For the lock it is opened twice, the second time for reading only. To read it then works again.
+TEST_P(failing_calls, ThatKeepTheFileFromBeingLockedKeepItFromBeingRead) {
+    const auto is_open = [](const seen_call& call) { return call.name.starts_with("open"); };
+    const auto first = std::find_if(calls.begin(), calls.end(), is_open);
+    const size_t nth = static_cast<size_t>(first - calls.begin()) + 1;
+    stage on(setting);
+    const int code = on.play({{nth, effect::fails, EMFILE}, {nth + 1, effect::fails, EMFILE}});
+    const std::string description = told("two faults", EMFILE, on);
+    EXPECT_EQ(code, CFG_CONNECT_ERROR) << description;
+    EXPECT_THAT(on.report(), HasSubstr("errno " + std::to_string(EMFILE) + ":"));
+    EXPECT_EQ(on.folder().text(), before) << description;
+    EXPECT_EQ(on.repeat(), CFG_SUCCESS) << on.report();
+    EXPECT_EQ(on.folder().text(), after) << description;
+}
+
 TEST_P(failing_calls, OfWhatFileSystemsNeedNotHaveAreNoFailures) {
     const struct {
         const char* name;

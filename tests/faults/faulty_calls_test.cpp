@@ -134,6 +134,9 @@ std::string home_of(void* definition) {
 }  // namespace
 
 TEST(faulty_calls, EveryNameThatTheLibrariesTakeIsWrappedOrKnownToBeHarmless) {
+#ifdef CFG32_COVERAGE
+    GTEST_SKIP() << "what counts the lines that run takes names of its own";
+#endif
     const std::set<std::string> wrapped(wrapped_names().begin(), wrapped_names().end());
     const std::set<std::string> taken = taken_names();
     ASSERT_EQ(taken.count("pwrite"), 1u) << "the names of the library could not be listed";

@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 
 #include <cerrno>
+#include <utility>
 
 #include "call_faults.h"
 
@@ -47,6 +48,33 @@ TEST(AccountNames, ExhaustedMemoryIsAFailure) {
     const call_fault fault(watched_call::allocate, 1, 0);
     EXPECT_FALSE(find_owner("root", owner));
     EXPECT_EQ(errno, ENOMEM);
+}
+
+TEST(AccountNames, ARecordThatDoesNotFitIsAskedForAgainWithMoreRoom) {
+    uid_t owner = 1;
+    const call_fault fault(watched_call::look_up, 1, ERANGE);
+    EXPECT_TRUE(find_owner("root", owner));
+    EXPECT_EQ(owner, 0u);
+    EXPECT_EQ(fault.calls(), 2);
+}
+
+TEST(AccountNames, ARecordThatNeverFitsIsAFailure) {
+    uid_t owner;
+    const call_fault fault(watched_call::look_up, every_call, ERANGE);
+    EXPECT_FALSE(find_owner("root", owner));
+    EXPECT_EQ(errno, ERANGE);
+}
+
+TEST(AccountNames, AFailureToLookUpIsToldFromANameThatThereIsNot) {
+    const std::pair<int, int> rows[] = {{EINTR, EINTR},   {EIO, EIO},       {EMFILE, EMFILE},
+                                        {ENFILE, ENFILE}, {ENOMEM, ENOMEM}, {ENOENT, EINVAL},
+                                        {ESRCH, EINVAL},  {EPERM, EINVAL}};
+    for (const auto& [error, told] : rows) {
+        uid_t owner;
+        const call_fault fault(watched_call::look_up, 1, error);
+        EXPECT_FALSE(find_owner("root", owner));
+        EXPECT_EQ(errno, told) << error;
+    }
 }
 
 }  // namespace

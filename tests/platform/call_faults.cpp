@@ -1,6 +1,7 @@
 #include "call_faults.h"
 
 #include <malloc.h>
+#include <pwd.h>
 #include <sys/types.h>
 
 #include <cerrno>
@@ -28,7 +29,9 @@ thread_local armed_fault fault;
 thread_local armed_watch watch;
 
 bool fails(watched_call call) {
-    if (!fault.armed || fault.call != call || ++fault.calls != fault.nth)
+    if (!fault.armed || fault.call != call)
+        return false;
+    if (++fault.calls != fault.nth && fault.nth != every_call)
         return false;
     errno = fault.error;
     return true;
@@ -107,6 +110,18 @@ ssize_t __wrap_copy_file_range(int from, off_t* from_at, int to, off_t* to_at, s
     if (fails(watched_call::copy_range))
         return -1;
     return __real_copy_file_range(from, from_at, to, to_at, size, flags);
+}
+
+int __real_getpwnam_r(const char*, passwd*, char*, size_t, passwd**);
+int __wrap_getpwnam_r(const char* name, passwd* record, char* buffer, size_t size, passwd** found) {
+    *found = nullptr;
+    return fails(watched_call::look_up) ? fault.error
+                                        : __real_getpwnam_r(name, record, buffer, size, found);
+}
+
+ssize_t __real_read(int, void*, size_t);
+ssize_t __wrap_read(int fd, void* data, size_t size) {
+    return fails(watched_call::read) ? -1 : __real_read(fd, data, size);
 }
 
 ssize_t __real_getrandom(void*, size_t, unsigned);

@@ -13,14 +13,19 @@ enum class watched_call {
     chown,
     close,
     copy_range,
+    look_up,  // of an account; the error is returned
     random,
+    read,
     rename,
     sync,
     write,
 };
 
 // Lets the nth call (from 1) of its kind fail with this errno for as long as the object lives; 0
-// only counts. A write that fails with no errno writes nothing and returns 0.
+// only counts, and every_call lets all of them fail. A write that fails with no errno writes
+// nothing and returns 0.
+constexpr int every_call = -1;
+
 class call_fault {
   public:
     call_fault(watched_call call, int nth, int error = 0);

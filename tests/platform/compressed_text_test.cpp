@@ -89,6 +89,19 @@ TEST(CompressedText, ExhaustedMemoryIsARefusalAtEveryAllocation) {
     EXPECT_GT(nth, 3) << "the compressor allocates more than once";
 }
 
+TEST(CompressedText, DoesNotComeBackWhenAnyAllocationFails) {
+    const std::string text = "a text, a text, and a text";
+    const std::string data = compressed(text);
+    int nth = 1;
+    for (std::string back; back != text; ++nth) {
+        ASSERT_LT(nth, 20);
+        call_fault fault(watched_call::allocate, nth, ENOMEM);
+        back = expanded(data);
+        EXPECT_EQ(back == "(refused)", fault.happened());
+    }
+    EXPECT_GT(nth, 2) << "the expander allocates";
+}
+
 TEST(CompressedText, LeavesNoTraceInFreedMemory) {
     const std::string secret = "Tr0ub4dor&3-horse";
     std::string text;

@@ -91,6 +91,14 @@ TEST(KeyFile, IsReadWhenItHoldsExactlyAKey) {
     }
 }
 
+TEST(KeyFile, ThatCanNotBeReadGivesNoKey) {
+    const test_directory directory;
+    const std::string path = directory.write("key", key_bytes.substr(0, 32));
+    const call_fault fault(watched_call::read, 1, EIO);
+    EXPECT_EQ(from_file(path), nullptr);
+    EXPECT_EQ(errno, EIO);
+}
+
 TEST(KeyFile, MayHoldAnyBytes) {
     const test_directory directory;
     const std::string bytes(

@@ -42,6 +42,14 @@ TEST(SealedBytes, ComeBackWithTheirFlagsUnderEveryKeySize) {
     }
 }
 
+TEST(SealedBytes, DoNotOpenUnderAKeyOfNoCipher) {
+    const bytes sealed = sealed_form();
+    for (const std::size_t size : {0u, 8u, 31u, 33u}) {
+        const bytes some_key(size, 0x5a);
+        EXPECT_FALSE(opens({some_key, context.label}, sealed)) << size;
+    }
+}
+
 TEST(SealedBytes, AreSealedAfreshEachTime) {
     const bytes first = sealed_form();
     const bytes second = sealed_form();

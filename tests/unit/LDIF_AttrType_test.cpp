@@ -532,3 +532,8 @@ TEST(LDIF_AttrType, LookingUpAllocatesNothing) {
     getAttrType("oru-slapdNoSuchThing");
     EXPECT_EQ(failing_allocation::count(), 0);
 }
+
+TEST(LDIF_AttrType, ANameEndsAtItsNul) {
+    EXPECT_EQ(cfg32::attribute_name(std::string_view("cn\0x", 4)).type(), getAttrType("cn"));
+    EXPECT_EQ(cfg32::attribute_name(std::string_view("c\0n", 3)).type(), getAttrType("c"));
+}

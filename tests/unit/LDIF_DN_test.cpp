@@ -588,3 +588,15 @@ TEST(LDIF_DN, AnyTextIsParsedOrRefused) {
     }
     EXPECT_GT(parsed_count, 1000);
 }
+
+TEST(LDIF_DN, AssignedPartsAreCopies) {
+    const LDIF_DN dn("cn=A+sn=B,o=C");
+    LDIF_RDN step = dn.rdns().front();
+    ASSERT_EQ(stored(step), "o=[C]plain");
+    LDIF_RDN_pair pair = step.pairs().front();
+    step = dn.rdns().back();
+    pair = step.pairs().back();
+    EXPECT_EQ(stored(step), "cn=[A]plain & sn=[B]plain");
+    EXPECT_EQ(pair.str(), "sn=B");
+    EXPECT_EQ(stored(dn), "o=[C]plain / cn=[A]plain & sn=[B]plain");
+}

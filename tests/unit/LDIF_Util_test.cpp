@@ -406,3 +406,12 @@ TEST(LDIF_Util, HexDigitHasItsValue) {
 }
 
 }  // namespace
+
+TEST(LDIF_Util, TextsAreComparedUpToTheirNul) {
+    using namespace std::string_view_literals;
+    EXPECT_EQ(cfg32::compare_without_case("a\0b"sv, "A\0"sv), 0);
+    EXPECT_EQ(cfg32::compare_without_case("a\0"sv, "A\0b"sv), 0);
+    EXPECT_EQ(cfg32::compare_without_case("a\0b"sv, "A"sv), 0);
+    EXPECT_EQ(cfg32::compare_without_case("ab\0"sv, "A"sv), 1);
+    EXPECT_EQ(cfg32::compare_without_case("a"sv, "Ab\0"sv), -1);
+}

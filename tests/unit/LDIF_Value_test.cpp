@@ -186,6 +186,16 @@ TEST(LDIF_Value, AValueWhoseBinaryFormAndLengthDisagreeIsNotCopied) {
     }
 }
 
+TEST(LDIF_Value, ABinaryFormOfAnyLengthIsCopied) {
+    const std::string bytes = "more than a number";
+    LDIF_Value value = value_of("oru-slapdPort", "389");
+    value.set_binary(bytes.data(), static_cast<int>(bytes.size()));
+    const LDIF_Value copy(value);
+    ASSERT_EQ(copy.binaryLength, static_cast<int>(bytes.size()));
+    EXPECT_NE(copy.binary.get(), value.binary.get());
+    EXPECT_EQ(std::string_view(copy.binary.get(), bytes.size()), bytes);
+}
+
 TEST(LDIF_Value, ABinaryFormThatNoMemoryHoldsIsNotCopied) {
     LDIF_Value huge = value_of("oru-slapdPort", "389");
     huge.binaryLength = -1;  // nearly all of the address space, as a size
@@ -200,6 +210,7 @@ TEST(LDIF_Value, HasNoTextWithoutTheOperationOfAType) {
     const LDIF_Value without_operation(&type, "a", nullptr);
     const LDIF_Exception e = failure_of([&] { without_operation.str(); });
     EXPECT_EQ(summary(e), no_to_str);
+    EXPECT_EQ(summary(failure_of([&] { without_operation.shown(); })), no_to_str);
     expect_position(e);
     LDIF_Value without_type = value_of("cn", "a");
     without_type.attrType = nullptr;

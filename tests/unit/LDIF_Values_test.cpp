@@ -569,3 +569,18 @@ TEST(LDIF_Values, ErasedValuesAreGoneBeforeTheirGapsAreClosed) {
         EXPECT_EQ(values.str(), "");
     }
 }
+
+TEST(LDIF_Values, AreTheSameAfterTheyWereAssignedToThemselves) {
+    LDIF_Values values = list_of("cn", {"a", "b"});
+    const LDIF_Values& self = values;
+    values = self;
+    EXPECT_EQ(texts(values), (strings{"a", "b"}));
+}
+
+TEST(LDIF_Values, AWalkThatStepsOnGivesThePlaceBefore) {
+    const LDIF_Values values = list_of("cn", {"a"});
+    auto place = values.begin();
+    const auto before = place++;
+    EXPECT_EQ(before, values.begin());
+    EXPECT_EQ(place, values.end());
+}

@@ -324,3 +324,9 @@ TEST(child_index, AncestorsThatTurnUpInReverseTakeTheirDescendantsOver) {
     EXPECT_EQ(root.children().front().children().size(), 50U);
     EXPECT_EQ(root.children().front().children().front().dn().str(), "cn=49, cn=missing, o=x");
 }
+
+TEST(child_index, WithoutChildrenHasNothingToFind) {
+    const indexed_entries children;
+    EXPECT_EQ(children.nearest("o=a"), "none");
+    EXPECT_THAT(children.below("o=a"), IsEmpty());
+}

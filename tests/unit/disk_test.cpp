@@ -10,6 +10,7 @@
 #include <csignal>
 #include <cstdint>
 #include <cstdlib>
+#include <optional>
 #include <string>
 #include <utility>
 
@@ -36,10 +37,39 @@ timespec rounded(const timespec& time) {
 
 }  // namespace
 
-// Takes the place of the C library's, for file systems of all kinds.
+namespace {
+
+/// What a file of somebody else does with the times that it is to take.
+enum class time_of_others { is_taken, stands_still, fails };
+
+/// Set for the file of somebody else: only the present time can be asked for.
+thread_local std::optional<time_of_others> others;
+
+thread_local bool writes_nothing = false;
+
+}  // namespace
+
+// These take the place of the C library's, for file systems of all kinds.
+extern "C" ssize_t pwrite(int file, const void* bytes, size_t size, off_t offset) {
+    static const auto original =
+        reinterpret_cast<ssize_t (*)(int, const void*, size_t, off_t)>(dlsym(RTLD_NEXT, "pwrite"));
+    return writes_nothing ? 0 : original(file, bytes, size, offset);
+}
+
 extern "C" int futimens(int file, const timespec times[2]) noexcept {
     static const auto original =
         reinterpret_cast<int (*)(int, const timespec*)>(dlsym(RTLD_NEXT, "futimens"));
+    if (others && times) {
+        errno = EPERM;
+        return -1;
+    }
+    if (others == time_of_others::fails) {
+        errno = EROFS;
+        return -1;
+    }
+    if (others == time_of_others::stands_still) {
+        return 0;
+    }
     if (!times || granularity == 1) {
         return original(file, times);
     }
@@ -306,6 +336,16 @@ TEST_F(disk, FailureToWriteIsReportedAndChangesNothing) {
     EXPECT_EQ(folder.read("f"), "before");
 }
 
+TEST_F(disk, WriteThatWritesNothingIsReported) {
+    const unique_fd file = opened(folder.write("f", "before"), O_RDWR);
+    writes_nothing = true;
+    errno = 0;
+    EXPECT_FALSE(replace_content(file.get(), "after"));
+    writes_nothing = false;
+    EXPECT_EQ(errno, EIO);
+    EXPECT_EQ(folder.read("f"), "before");
+}
+
 TEST_F(disk, FullDeviceIsReported) {
     const unique_fd full(open("/dev/full", O_WRONLY));
     ASSERT_TRUE(full);
@@ -459,4 +499,18 @@ TEST_F(disk, TimeOfSomebodyElsesFileIsMadeThePresentOne) {
     const timespec later = file.set(future);
     EXPECT_EQ(as_nobody([&] { return make_later(file.file.get(), later, status) ? 0 : 1; }), 0);
     EXPECT_LT(nanoseconds(file.time()), nanoseconds(later));
+}
+
+TEST_F(disk, TimeOfSomebodyElsesFileThatStaysOrCanNotBeSetIsReported) {
+    const timed_file file{opened(folder.write("f", "x"), O_RDWR)};
+    const timespec before = file.set(some_time);
+    others = time_of_others::fails;
+    EXPECT_FALSE(make_later(file.file.get(), before, status));
+    EXPECT_EQ(errno, EROFS);
+    // Two seconds are waited for, in which the coarsest clock goes on.
+    others = time_of_others::stands_still;
+    EXPECT_FALSE(make_later(file.file.get(), before, status));
+    EXPECT_EQ(errno, EPERM);
+    others.reset();
+    EXPECT_EQ(nanoseconds(file.time()), nanoseconds(before));
 }

@@ -295,6 +295,15 @@ TEST_F(unread, ANumberSignBeginsNoNameWhateverTheFilterAsksFor) {
     EXPECT_TRUE(LDIF_Filter("(cn=b)").match(entry_of(*file)));
 }
 
+// Its line would be read as one without a colon.
+TEST_F(unread, AnAttributeWithoutANameIsNoCanonicalLine) {
+    const auto file = store_of("# c\n : a\nsn:\n b\n");
+    const LDIF_Entry& entry = entry_of(*file);
+    EXPECT_EQ(entry.printed_lines(), nullptr);
+    EXPECT_EQ(entry.attributes().begin()->name().text(), "");
+    EXPECT_EQ(entry.attributes().str(), "# c\n: a\nsn: b\n");
+}
+
 TEST_F(unread, ACopyOutlivesTheStore) {
     for (const char* lines : {"cn: a\nsn: b\n", "sn: b\ncn: a\n"}) {
         auto file = store_of(lines);

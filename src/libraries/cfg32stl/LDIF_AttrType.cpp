@@ -55,7 +55,7 @@ constexpr checked_row rows[] = {
 };
 #undef ATTRIBUTE
 
-constexpr int count_of_name(const char* name) {
+consteval int count_of_name(const char* name) {
     int count = 0;
     for (const checked_row& row : rows) {
         count += __builtin_strcmp(row.name, name) == 0;
@@ -63,7 +63,7 @@ constexpr int count_of_name(const char* name) {
     return count;
 }
 
-constexpr bool names_are_unique() {
+consteval bool names_are_unique() {
     for (const checked_row& row : rows) {
         const int wanted = __builtin_strcmp(row.name, "oru-slapdIdleTimeOut") == 0 ? 2 : 1;
         if (count_of_name(row.name) != wanted) {
@@ -73,7 +73,7 @@ constexpr bool names_are_unique() {
     return true;
 }
 
-constexpr bool bounds_are_in_order() {
+consteval bool bounds_are_in_order() {
     for (const checked_row& row : rows) {
         if (row.maximum != 0 && row.minimum > row.maximum) {
             return false;

@@ -97,7 +97,7 @@ void dn_parser<Char>::dn(std::vector<LDIF_RDN>& rdns) {
             return;
         }
         if (!at_separator()) {
-            raise(dn_failure::bad_separator);
+            raise(dn_failure::bad_separator);  // UNREACHABLE: an RDN ends nowhere else
         }
         skip(1);
         skip_space();

@@ -102,8 +102,8 @@ void loader::dispatch() {
             return dn_line();
         case LDIF_Line::attr:
             return attribute_line();
-        default:
-            raise(unknown_line);
+        default:                  // UNREACHABLE: the reader tells no other type
+            raise(unknown_line);  // UNREACHABLE: as above
     }
 }
 

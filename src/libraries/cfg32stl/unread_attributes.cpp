@@ -60,11 +60,13 @@ bool begins_with_space(std::string_view text) {
 }
 
 /// True for names and values that are what a line of them is read as. They are in ASCII, in one
-/// line and without blanks at the end; folded lines can bring some to the front of a value, and
-/// comments that of a name, which makes no continuation line of it where it stands.
+/// line and without blanks at the end; folded lines can bring some to the front of a value. Behind
+/// a comment a line can begin with blanks, which makes no continuation line of it where it stands:
+/// they are the front of its name, or there is none.
 bool are_read_as_written(const LDIF_Attribute& attribute) {
+    const std::string& name = attribute.name().text();
     const auto texts = attribute.values().texts();
-    return !begins_with_space(attribute.name().text()) && !texts.empty() &&
+    return !name.empty() && !begins_with_space(name) && !texts.empty() &&
            std::ranges::all_of(texts, [](const kept_text& text) {
                return !text.empty() && !begins_with_space(text);
            });

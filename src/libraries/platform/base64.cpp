@@ -12,7 +12,7 @@ constexpr std::string_view alphabet =
 constexpr char padding = '=';
 constexpr std::uint8_t no_digit = 0xff;
 
-constexpr std::array<std::uint8_t, 256> make_digit_table() {
+consteval std::array<std::uint8_t, 256> make_digit_table() {
     std::array<std::uint8_t, 256> table{};
     table.fill(no_digit);
     for (std::size_t value = 0; value < alphabet.size(); ++value) {
