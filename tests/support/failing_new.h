@@ -46,10 +46,13 @@ class failing_allocation {
 
     /// Allocations since the object was made.
     static long count() { return count_; }
+    /// Bytes that this thread has asked for in all.
+    static size_t bytes() { return bytes_; }
 
     /// For the operators new.
     static void* allocate(size_t size) {
         ++count_;
+        bytes_ += size;
         if (left_ == 0) {
             is_over_ = true;
             left_ = is_lasting_ ? 0 : never;
@@ -63,6 +66,7 @@ class failing_allocation {
     static constexpr long never = -1;
     static inline thread_local long left_ = never;
     static inline thread_local long count_ = 0;
+    static inline thread_local size_t bytes_ = 0;
     static inline thread_local bool is_lasting_ = false;
     static inline thread_local bool is_over_ = false;
 };

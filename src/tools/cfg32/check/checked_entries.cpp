@@ -32,19 +32,20 @@ void checked_entries::add(entry_section& section, LDIF_Attribute&& attribute, in
     const auto known = section.attributes.find(attribute.name());
     if (known == section.attributes.end()) {
         value_lines_[attribute.values().texts().front().view().data()] = line;
-        section.attributes += std::move(attribute);
+        section.attributes.emplace(attribute.name(), std::move(attribute));
         return;
     }
-    const size_t before = known->values().size();
-    *known += attribute;
-    if (known->values().size() > before) {
-        value_lines_[known->values().texts().back().view().data()] = line;
+    LDIF_Attribute& present = known->second;
+    const size_t before = present.values().size();
+    present += attribute;
+    if (present.values().size() > before) {
+        value_lines_[present.values().texts().back().view().data()] = line;
         if (is_told) {
-            report_second_value(*known, line, section.written);
+            report_second_value(present, line, section.written);
         }
     } else if (is_told) {
         // Read again, as the load does it: the text of a DN may be that of another one.
-        const LDIF_Value first = *known->values().find(attribute.values().begin()->str());
+        const LDIF_Value first = *present.values().find(attribute.values().begin()->str());
         problem& found = found_.add(kind::duplicate_value, file_.value_place(line),
                                     "value stands twice, the first one" + on_line(line_of(first)) +
                                         "; the next rewrite drops this one");
@@ -78,14 +79,14 @@ int checked_entries::line_of(const LDIF_Value& value) const {
 checked_entries::checked_entry* checked_entries::find(const LDIF_DN& dn) {
     const auto [first, last] = by_dn_.equal_range(dn.hash());
     const auto same =
-        std::find_if(first, last, [&](const auto& row) { return row.second->dn == dn; });
+        std::find_if(first, last, [&](const auto& row) { return row.second->dn() == dn; });
     return same == last ? nullptr : same->second;
 }
 
 void checked_entries::add_header(LDIF_Attribute&& attribute, int line) {
     entry_section header;
     value_lines_[attribute.values().texts().front().view().data()] = line;
-    header.attributes += std::move(attribute);
+    header.attributes.emplace(attribute.name(), std::move(attribute));
     close(std::move(header));
 }
 
@@ -94,8 +95,7 @@ void checked_entries::close(entry_section&& section) {
         if (checked_entry* known = find(section.dn)) {
             merge(*known, section);
         } else {
-            entries_.push_back({section.dn,
-                                section.written,
+            entries_.push_back({section.written,
                                 section.where,
                                 std::move(section.attributes),
                                 {{section.where, section.first, section.last}}});
@@ -112,12 +112,12 @@ void checked_entries::close(entry_section&& section) {
 void checked_entries::merge(checked_entry& known, entry_section& section) {
     const bool is_entry = !section.dn.empty();
     try {
-        for (LDIF_Attribute& attribute : section.attributes) {
-            const auto same = known.attributes.find(attribute.name());
+        for (auto& [name, attribute] : section.attributes) {
+            const auto same = known.attributes.find(name);
             if (same == known.attributes.end()) {
-                known.attributes += std::move(attribute);
+                known.attributes.emplace(name, std::move(attribute));
             } else {
-                merge(*same, attribute, section);
+                merge(same->second, attribute, section);
             }
         }
     } catch (const LDIF_Exception& e) {
@@ -165,8 +165,9 @@ void checked_entries::merge(LDIF_Attribute& known, const LDIF_Attribute& again,
 
 void checked_entries::finish() {
     for (const checked_entry& entry : entries_) {
-        check_ancestors(entry);
-        check_writing(entry);
+        const LDIF_DN dn = entry.dn();
+        check_ancestors(entry, dn);
+        check_writing(entry, dn);
     }
     if (!find(LDIF_DN(configuration_dn))) {
         const int last = std::max(file_.line_count(), 1);
@@ -177,11 +178,11 @@ void checked_entries::finish() {
 
 /// Below the nearest ancestor that is there, the others are missing. Where none is there, the entry
 /// is the topmost of its tree.
-void checked_entries::check_ancestors(const checked_entry& entry) {
+void checked_entries::check_ancestors(const checked_entry& entry, const LDIF_DN& dn) {
     constexpr int named = 3;
     std::string missing;
     int count = 0;
-    LDIF_DN ancestor = entry.dn;
+    LDIF_DN ancestor = dn;
     while (ancestor.rdns().size() > 1) {
         ancestor.remove_leaf();
         if (find(ancestor)) {
@@ -204,8 +205,8 @@ void checked_entries::check_ancestors(const checked_entry& entry) {
 }
 
 /// A rewrite fails for the whole file when one entry would not read back.
-void checked_entries::check_writing(const checked_entry& entry) {
-    const std::string reason = why_unwritable(entry);
+void checked_entries::check_writing(const checked_entry& entry, const LDIF_DN& dn) {
+    const std::string reason = why_unwritable(entry, dn);
     if (reason.empty()) {
         return;
     }
@@ -213,7 +214,7 @@ void checked_entries::check_writing(const checked_entry& entry) {
         if (first == 0) {
             continue;  // version and charset
         }
-        if (!is_rewritten_ && entry.dn.empty()) {
+        if (!is_rewritten_ && dn.empty()) {
             return;  // said of its DN line
         }
         problem& found =
@@ -232,13 +233,13 @@ void checked_entries::check_writing(const checked_entry& entry) {
     }
 }
 
-std::string checked_entries::why_unwritable(const checked_entry& entry) const {
-    if (is_unprintable(entry.dn)) {
+std::string checked_entries::why_unwritable(const checked_entry& entry, const LDIF_DN& dn) const {
+    if (is_unprintable(dn)) {
         return "a value of its DN is empty, or has a line break or NUL";
     }
-    for (const LDIF_Attribute& attribute : entry.attributes) {
+    for (const auto& [name, attribute] : entry.attributes) {
         const bool is_header = is_of_root(attribute) && attribute.values().size() <= 1;
-        if (entry.dn.empty() && !is_header) {
+        if (dn.empty() && !is_header) {
             return fmt::format("it has no DN, but the attribute {}", attribute.name().text());
         }
         std::string reason = why_unwritable(attribute);

@@ -3,6 +3,7 @@
 // The entries of a file that is checked, put together as a load does it.
 
 #include <deque>
+#include <map>
 #include <string>
 #include <unordered_map>
 #include <vector>
@@ -10,8 +11,12 @@
 #include "LDIF_Attribute.h"
 #include "LDIF_DN.h"
 #include "check/findings.h"
+#include "cisString.h"
 
 namespace cfg32::tool {
+
+/// By name. An entry may have so many that a sorted array would be moved all the time.
+using checked_attributes = std::map<cisString, LDIF_Attribute>;
 
 /// A DN line and the attribute lines below it.
 struct entry_section {
@@ -20,7 +25,7 @@ struct entry_section {
     place where{};        ///< of the DN
     int first = 0;        ///< the DN line
     int last = 0;         ///< line of the last attribute
-    LDIF_Attributes attributes;
+    checked_attributes attributes;
     bool is_left_out = false;
     bool has_kept_line = false;      ///< one that a load would keep aside
     std::vector<problem*> stopping;  ///< what a load stops at, unless all of it is left out
@@ -44,11 +49,14 @@ class checked_entries {
     void finish();
 
   private:
+    /// Taken apart, a DN takes many times the room of its text, so it is read again where it is
+    /// asked for.
     struct checked_entry {
-        LDIF_DN dn;
+        LDIF_DN dn() const { return LDIF_DN(cisString(written)); }
+
         std::string written;
         place where;
-        LDIF_Attributes attributes;
+        checked_attributes attributes;
         struct lines {
             place where;  // of the DN
             int first;
@@ -61,9 +69,9 @@ class checked_entries {
     void merge(checked_entry& known, entry_section& section);
     void merge(LDIF_Attribute& known, const LDIF_Attribute& again, const entry_section& section);
     void report_second_value(const LDIF_Attribute& attribute, int line, const std::string& entry);
-    void check_ancestors(const checked_entry& entry);
-    void check_writing(const checked_entry& entry);
-    std::string why_unwritable(const checked_entry& entry) const;
+    void check_ancestors(const checked_entry& entry, const LDIF_DN& dn);
+    void check_writing(const checked_entry& entry, const LDIF_DN& dn);
+    std::string why_unwritable(const checked_entry& entry, const LDIF_DN& dn) const;
     std::string why_unwritable(const LDIF_Attribute& attribute) const;
     int line_of(const LDIF_Value& value) const;
 

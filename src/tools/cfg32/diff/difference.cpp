@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <functional>
+#include <unordered_set>
 
 #include "LDIF_AttrType.h"
 #include "LDIF_Exception.h"
@@ -193,14 +194,16 @@ std::string unspeakable_name(const std::vector<entry_difference>& found) {
 }
 
 std::vector<change_record> changes_between(const LDIF_Entry& from, const LDIF_Entry& to) {
-    const auto may_stay = [&](const LDIF_Entry& node) {
-        for (LDIF_DN dn = node.dn(); !dn.empty(); dn.remove_leaf()) {
-            if (from.find(dn) && !to.find(dn)) {
-                return false;
+    // From the root down, because whatever is below one that goes goes with it.
+    std::unordered_set<const LDIF_Entry*> staying = {&from};
+    for_each_in_preorder(from, [&](const LDIF_Entry& node) {
+        for (const LDIF_Entry& child : node.children()) {
+            if (staying.count(&node) != 0 && to.find(child.dn())) {
+                staying.insert(&child);
             }
         }
-        return true;
-    };
+    });
+    const auto may_stay = [&](const LDIF_Entry& node) { return staying.count(&node) != 0; };
     std::vector<change_record> records;
     for (const entry_difference& each : compare(from, to, may_stay)) {
         records.push_back(record_of(each, to));

@@ -1,0 +1,81 @@
+// The command's own readings of large configurations: what is wrong with one, and what differs from
+// another.
+
+#include <gtest/gtest.h>
+
+#include <sstream>
+
+#include "LDIF_File.h"
+#include "check/problem.h"
+#include "diff/difference.h"
+#include "failing_new.h"
+#include "large_file.h"
+#include "small_stack.h"
+#include "temporary_folder.h"
+
+using namespace cfg32;
+using namespace cfg32::tests;
+
+namespace {
+
+struct large_text : testing::TestWithParam<large_file> {
+    const large_file& file = GetParam();
+    const size_t count = count_of(file);
+    const temporary_folder folder;
+
+    std::string text_of(size_t count) const {
+        std::ostringstream out;
+        write_large_file(file, count, out);
+        return out.str();
+    }
+};
+
+/// What body asks for, by the byte of a text.
+template <class Body>
+double share_of(const std::string& text, Body body) {
+    const size_t before = failing_allocation::bytes();
+    body();
+    return static_cast<double>(failing_allocation::bytes() - before) /
+           static_cast<double>(text.size());
+}
+
+}  // namespace
+
+TEST_P(large_text, IsCheckedOnASmallStack) {
+    static const large_text* that;
+    that = this;
+    on_a_small_stack([] {
+        EXPECT_EQ(tool::find_problems(that->text_of(that->count), nullptr).size(),
+                  that->file.problems(that->count));
+    });
+}
+
+TEST_P(large_text, IsComparedOnASmallStack) {
+    static const large_text* that;
+    that = this;
+    on_a_small_stack([] {
+        const LDIF_File from(that->folder.write("from", that->text_of(that->count)), "", nullptr);
+        const LDIF_File to(that->folder.write("to", that->text_of(1)), "", nullptr);
+        EXPECT_TRUE(tool::changes_between(from.root(), from.root()).empty());
+        EXPECT_EQ(tool::changes_between(from.root(), to.root()).empty(),
+                  tool::differences(from.root(), to.root()).empty());
+    });
+}
+
+TEST_P(large_text, FourTimesAsLongAsksForNoMoreThanItsShareOfMemory) {
+    double checked[2] = {};
+    double compared[2] = {};
+    for (const size_t factor : {1, 4}) {
+        const std::string text = text_of(file.usual * factor / 4);
+        checked[factor / 4] = share_of(text, [&] { tool::find_problems(text, nullptr); });
+        const LDIF_File loaded(folder.write("from", text), "", nullptr);
+        const LDIF_File other(folder.write("to", text), "", nullptr);
+        compared[factor / 4] =
+            share_of(text, [&] { tool::changes_between(loaded.root(), other.root()); });
+    }
+    EXPECT_LT(checked[1], checked[0] * 2);
+    EXPECT_LT(compared[1], compared[0] * 2 + 1);
+}
+
+INSTANTIATE_TEST_SUITE_P(of, large_text, testing::ValuesIn(large_files()),
+                         [](const auto& info) { return std::string(info.param.name); });
