@@ -75,8 +75,9 @@ const std::set<std::string> harmless = {
 };
 
 /// Families of such names: exceptions, the sanitizers, ciphers and compression in memory.
-const char* const harmless_families[] = {"__cxa_",       "__asan_", "__ubsan_", "__tsan_",
-                                         "__sanitizer_", "nettle_", "deflate",  "inflate"};
+const char* const harmless_families[] = {"__cxa_",  "__asan_",      "__ubsan_",
+                                         "__tsan_", "__sanitizer_", "__sancov_",
+                                         "nettle_", "deflate",      "inflate"};
 
 /// The standard library is harmless save for what opens files; the description of a type does not.
 const char* const parts_with_files[] = {"fstream", "filebuf", "filesystem", "random_device"};

@@ -76,13 +76,4 @@ std::string as_written_after(const std::string& text, const attribute_change& wh
 /// written when it ends does not depend on the disk, and thousands of updates wait for none.
 void work_in_memory();
 
-/// True in a build that is several times slower for its checks.
-constexpr bool is_sanitized() {
-#if defined(__SANITIZE_ADDRESS__) || defined(__SANITIZE_THREAD__)
-    return true;
-#else
-    return false;
-#endif
-}
-
 }  // namespace cfg32::tests

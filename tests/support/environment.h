@@ -10,4 +10,13 @@ inline unsigned long number_from_environment(const char* name, unsigned long usu
     return text && *text ? strtoul(text, nullptr, 10) : usual;
 }
 
+/// True in a build that is several times slower for its checks.
+constexpr bool is_sanitized() {
+#if defined(__SANITIZE_ADDRESS__) || defined(__SANITIZE_THREAD__)
+    return true;
+#else
+    return false;
+#endif
+}
+
 }  // namespace cfg32::tests

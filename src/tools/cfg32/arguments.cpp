@@ -84,7 +84,8 @@ void add_words(CLI::App& parser, const char* names, const char* description,
                presence needed) {
     add(parser, names, joined(words).c_str(), description, needed,
         [words, choose = std::move(choose)](const CLI::results_t& given) {
-            choose(std::find(words.begin(), words.end(), given.front()) - words.begin());
+            const auto chosen = std::find(words.begin(), words.end(), given.front());
+            choose(static_cast<size_t>(chosen - words.begin()));
         })
         ->check(CLI::IsMember(words).description(""));
 }

@@ -159,7 +159,7 @@ place file_text::value_place(int number, size_t offset) const {
     size_t at = value_begin(text);
     while (true) {
         for (; offset > 0 && at < text.size(); ++at) {
-            offset -= text[at] == '\r' ? 0 : 1;
+            offset -= text[at] == '\r' ? 0U : 1U;
         }
         const bool is_last = !is_continuation(number + 1);
         if (at < text.size() || is_last) {

@@ -43,7 +43,7 @@ class draft_keeper {
         snprintf(message, sizeof message, "\nwhat you edited is kept in %s\n", path.c_str());
         struct sigaction action {};
         action.sa_handler = tell_and_end;
-        action.sa_flags = SA_RESETHAND;
+        action.sa_flags = static_cast<int>(SA_RESETHAND);
         for (const int signal :
              {SIGHUP, SIGINT, SIGQUIT, SIGPIPE, SIGALRM, SIGTERM, SIGUSR1, SIGUSR2, SIGXCPU}) {
             struct sigaction before {};

@@ -128,7 +128,7 @@ size_t depth_below(const LDIF_Entry& base, const LDIF_Entry& node, const LDIF_En
     LDIF_DN dn = node.dn();
     while (dn != base.dn() && !dn.empty()) {
         dn.remove_leaf();
-        depth += !dn.empty() && root.find(dn) ? 1 : 0;
+        depth += !dn.empty() && root.find(dn) ? 1U : 0U;
     }
     return depth;
 }
