@@ -10,7 +10,7 @@ inline unsigned long number_from_environment(const char* name, unsigned long usu
     return text && *text ? strtoul(text, nullptr, 10) : usual;
 }
 
-/// True in a build that is several times slower for its checks.
+/// True in a build that is several times slower for its checks, and takes memory of its own.
 constexpr bool is_sanitized() {
 #if defined(__SANITIZE_ADDRESS__) || defined(__SANITIZE_THREAD__)
     return true;
