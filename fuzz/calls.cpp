@@ -174,8 +174,7 @@ class session {
         : files_(files), has_backup_(has_backup), user_(new_handle(files, has_backup)) {}
 
     bool bind(const char* dn = nullptr, const char* password = nullptr) {
-        const bool is_bound = note(cfg_bind_s(user_.get(), dn, password, CFG_AUTH_SIMPLE));
-        return is_bound;
+        return note(cfg_bind_s(user_.get(), dn, password, CFG_AUTH_SIMPLE));
     }
 
     void carry_out(const std::string& line);

@@ -116,8 +116,7 @@ std::string place_in_file(const std::string& file, int line) {
 }  // namespace
 
 /// Calls own(cause) for each cause that is shown, and whole(cause) for one of another class, which
-/// reports its causes itself. It does not recurse: a chain may be
-/// deeper than a stack.
+/// reports its causes itself. It does not recurse: a chain may be deeper than a stack.
 template <class Own, class Whole>
 void LDIF_Exception::for_each_cause(Own own, Whole whole) const {
     for (const LDIF_Exception* e = cause.get(); e && showStack; e = e->cause.get()) {
