@@ -455,6 +455,16 @@ TEST(LDIF_DN, CommonAncestorsAndRelativeNames) {
     EXPECT_TRUE((self -= self).empty());
 }
 
+TEST(LDIF_DN, AZeroByteIsPrintedInHexadecimalSoThatItReadsBack) {
+    for (const std::string text : {"cn=\\00", "cn=\\00b", "cn=a\\00b, o=c", "cn=a\\00, o=c",
+                                   "cn=\"\\00b\"", "cn=\"a,\\00b\", o=c", "cn=#0061"}) {
+        SCOPED_TRACE(text);
+        const LDIF_DN parsed = dn(text);
+        EXPECT_EQ(parsed.str(), text);
+        EXPECT_EQ(stored(dn(parsed.str())), stored(parsed));
+    }
+}
+
 TEST(LDIF_DN, BytesThatAreNoCharacterArePrintedInHexadecimal) {
     REQUIRE_UTF8();
     EXPECT_EQ(dn("cn=a\\ffb").str(), "cn=a\\FFb");

@@ -84,11 +84,12 @@ void append_escaped_bytes(std::string_view bytes, std::string& out) {
     }
 }
 
-/// Appends the characters of text; the ones in escaped are preceded by a backslash. A byte that
-/// is no character in the locale is written in hexadecimal, so that the line stays readable.
+/// Appends the characters of text; the ones in escaped are preceded by a backslash. A NUL, at which
+/// every reader would stop, and a byte that is no character in the locale are written in
+/// hexadecimal, so that the line stays readable.
 void append_characters(std::string_view text, const character_set& escaped, std::string& out) {
     while (!text.empty()) {
-        const auto is_ordinary = [&](char c) { return c >= '\0' && !escaped.has(c); };
+        const auto is_ordinary = [&](char c) { return c > '\0' && !escaped.has(c); };
         const auto end = std::find_if_not(text.begin(), text.end(), is_ordinary);
         const auto count = static_cast<size_t>(end - text.begin());
         out.append(text.substr(0, count));
@@ -97,7 +98,7 @@ void append_characters(std::string_view text, const character_set& escaped, std:
             return;
         }
         const character next = first_character(text);
-        if (!next.is_valid) {
+        if (!next.is_valid || next.code == 0) {
             append_escaped_bytes(next.bytes, out);
         } else {
             out.append(escaped.has(next.bytes.front()) ? "\\" : "").append(next.bytes);

@@ -5,6 +5,8 @@
 #include <bit>
 #include <iterator>
 #include <limits>
+#include <numeric>
+#include <unordered_map>
 #include <vector>
 
 #include "schema/attribute_words.h"
@@ -96,23 +98,23 @@ size_t edit_distance(const letters& left_letters, const letters& right_letters, 
     using row = std::array<size_t, 2 * longest_given>;
     row first, second, third;
     row *before = &first, *last = &second, *next = &third;  // in turn
-    last->fill(too_far);
-    for (size_t j = 0; j <= std::min(bound, right.size()); ++j) {
-        (*last)[j] = j;
-    }
+    // The cells beside those that are looked at are too far.
+    const auto end_of = [&](size_t i) { return std::min(right.size(), i + bound); };
+    std::iota(last->begin(), last->begin() + end_of(0) + 1, 0);
+    (*last)[end_of(0) + 1] = too_far;
     for (size_t i = 1; i <= left.size(); ++i) {
-        next->fill(too_far);
-        const size_t end = std::min(right.size(), i + bound);
-        size_t least = too_far;
-        for (size_t j = i > bound ? i - bound : 0; j <= end; ++j) {
-            size_t& cell = (*next)[j] = j == 0 ? i : too_far;
-            if (j > 0) {
-                const bool differ = left[i - 1] != right[j - 1];
-                cell = std::min({(*last)[j] + 1, (*next)[j - 1] + 1, (*last)[j - 1] + differ});
-            }
+        const size_t start = i > bound ? i - bound : 1;
+        const size_t end = end_of(i);
+        (*next)[start - 1] = start == 1 ? i : too_far;
+        (*next)[end + 1] = too_far;
+        size_t least = (*next)[start - 1];
+        for (size_t j = start; j <= end; ++j) {
+            const bool differ = left[i - 1] != right[j - 1];
+            size_t cell = std::min({(*last)[j] + 1, (*next)[j - 1] + 1, (*last)[j - 1] + differ});
             if (i > 1 && j > 1 && left[i - 1] == right[j - 2] && left[i - 2] == right[j - 1]) {
                 cell = std::min(cell, (*before)[j - 2] + 1);
             }
+            (*next)[j] = cell;
             least = std::min(least, cell);
         }
         if (least > bound) {
@@ -154,18 +156,21 @@ std::vector<std::string_view> all_near(std::string_view name) {
 
 }  // namespace
 
-/// The same name is often asked for again at once.
+/// The same few names are asked for again and again.
 std::vector<std::string_view> near_attributes(std::string_view name) {
-    thread_local std::string last_name;
-    thread_local std::vector<std::string_view> last_near;
+    constexpr size_t most_answers = 256;
+    thread_local std::unordered_map<std::string, std::vector<std::string_view>> answers;
     if (name.size() > longest_given) {
         return {};
     }
-    if (name != last_name) {
-        last_near = all_near(name);
-        last_name = name;
+    const std::string key(name);
+    if (const auto known = answers.find(key); known != answers.end()) {
+        return known->second;
     }
-    return last_near;
+    if (answers.size() == most_answers) {
+        answers.clear();
+    }
+    return answers.emplace(key, all_near(name)).first->second;
 }
 
 std::optional<std::string> nearest_attribute(std::string_view name) {
