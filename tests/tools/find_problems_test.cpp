@@ -221,7 +221,7 @@ const row rows[] = {
     {begun + "\ndn: cn=a\\0Ab, cn=Configuration\n", {"7:5 unwritable-entry"}},
     {begun + "\ndn: cn=, cn=Configuration\nx\n", {"7:5 blocked-repair", "8:1 missing-separator"}},
     {begun + "oru-slapdSuffix: cn=a\\0Ab\n", {"4:5 unwritable-entry"}},
-    {begun + "oru-slapdSuffix: cn=a\\00b\nx\n", {"4:5 blocked-repair", "7:1 missing-separator"}},
+    {begun + "oru-slapdSuffix: cn=a\\0Db\nx\n", {"4:5 blocked-repair", "7:1 missing-separator"}},
     {begun + "# c\n x: 1\n", {"7:1 unknown-attribute"}},
     {begun + "# c\n x: 1\n# c\n x: 2\n", {"4:5 unwritable-entry", "7:1 unknown-attribute", "9:1 unknown-attribute"}},
     {begun + "# c\n x: 1\n# c\n x: 2\ny\n", {"4:5 blocked-repair", "7:1 unknown-attribute", "9:1 unknown-attribute", "10:1 missing-separator"}},

@@ -239,8 +239,8 @@ TEST_F(LDIF_File_flush, NameThatCannotBePrintedFailsBeforeAFileIsTouched) {
 }
 
 TEST_F(LDIF_File_flush, NameThatWouldNotReadBackFailsBeforeAFileIsTouched) {
-    for (const char* name : {"cn=a\\0Ab", "cn=a\\0Db", "cn=a\\00b", "cn=\"a\\0A\"",
-                             "cn=x,cn=a\\0A\\0Ab", "cn=a\\0Asn: 2"}) {
+    for (const char* name :
+         {"cn=a\\0Ab", "cn=a\\0Db", "cn=\"a\\0A\"", "cn=x,cn=a\\0A\\0Ab", "cn=a\\0Asn: 2"}) {
         SCOPED_TRACE(name);
         const std::string before = std::string("version: 1\n\ndn: ") + name + "\nsn: 1\n";
         const auto file = store(before, backup);
@@ -254,10 +254,13 @@ TEST_F(LDIF_File_flush, NameThatWouldNotReadBackFailsBeforeAFileIsTouched) {
     }
 }
 
-TEST_F(LDIF_File_flush, EscapedLineBreakAtTheEndOfANameSurvives) {
-    const auto file = store("version: 1\n\ndn: cn=a\\0A\nsn: 1\n");
-    file->flush();
-    EXPECT_THAT(folder.read("conf"), HasSubstr("dn: cn=a\\0A\n"));
+TEST_F(LDIF_File_flush, EscapedLineBreakAtTheEndOfANameAndZeroBytesSurvive) {
+    for (const std::string line :
+         {"dn: cn=a\\0A\n", "dn: cn=a\\00b\n", "dn: cn=\\00, cn=\"\\00b\"\n"}) {
+        const auto file = store("version: 1\n\n" + line + "sn: 1\n");
+        file->flush();
+        EXPECT_THAT(folder.read("conf"), HasSubstr(line));
+    }
 }
 
 TEST_F(LDIF_File_flush, ValueThatWouldNotReadBackFailsBeforeAFileIsTouched) {
