@@ -18,7 +18,10 @@
 #include <memory>
 
 #include "cfg32.h"
+#include "cfg32_platform.h"
+#include "handle.h"
 #include "modifications.h"
+#include "printed_text.h"
 #include "property.h"
 
 namespace cfg32::fuzz {
@@ -56,6 +59,13 @@ class configuration {
     std::string backup() const { return folder_ + "/oruslapd.bak"; }
     std::string text() const { return text_of(name()); }
     std::string backup_text() const { return text_of(backup()); }
+    /// There is no other file.
+    bool are_all() const {
+        const std::filesystem::directory_iterator files(folder_);
+        return std::all_of(begin(files), end(files), [&](const auto& file) {
+            return file.path() == name() || file.path() == backup();
+        });
+    }
 
   private:
     configuration() {
@@ -87,10 +97,18 @@ struct freeing {
 template <class Type>
 using freed = std::unique_ptr<Type, freeing>;
 
+/// The key of every session: passwords are encrypted, too.
+aes_key_data* key() {
+    static constexpr unsigned char bytes[] = "0123456789abcdef0123456789abcde";
+    static aes_key_data* const made = aes_key_data_from_bytes(bytes, sizeof bytes);
+    return made;
+}
+
 handle new_handle(const configuration& files, bool has_backup) {
     handle made(cfg_init());
     require(made != nullptr, "there is a handle");
     cfg_set_option(made.get(), CFG_OPT_CONFIG_FILE, files.name().c_str());
+    cfg_set_option(made.get(), CFG_OPT_KEY_DATA, key());
     if (has_backup) {
         cfg_set_option(made.get(), CFG_OPT_BACKUP_FILE, files.backup().c_str());
     }
@@ -181,7 +199,7 @@ class session {
 
   private:
     bool note(int code) {
-        require(code >= 0, "a result is none below 0");
+        require(code >= 0 && code != CFG_OTHER, "a result is no failure of the library's own");
         if (code != CFG_SUCCESS) {
             ask_for_failure(user_.get());
         }
@@ -199,8 +217,8 @@ class session {
     handle user_;
 };
 
-/// A change that is refused leaves the file as it is. One that is not leaves it so that everybody
-/// reads the same, and the backup as it was.
+/// A change that is refused leaves the file as it is. One that is not leaves it with the text of
+/// the tree, so that everybody can read it, and the backup as the file was.
 template <class Call>
 void session::change(Call call) {
     const std::string before = files_.text();
@@ -211,6 +229,8 @@ void session::change(Call call) {
     if (has_backup_) {
         require_equal(files_.backup_text(), before, "the backup is what was there before");
     }
+    require_equal(files_.text(), printed_text(*user_->file), "a change is in the file");
+    require(files_.are_all(), "nothing else is left behind");
     const handle other = new_handle(files_, false);
     require_equal(cfg_bind_s(other.get(), nullptr, nullptr, CFG_AUTH_SIMPLE), CFG_SUCCESS,
                   "a changed file can be read");
@@ -250,12 +270,14 @@ void session::search_by(const std::vector<std::string>& words) {
 }
 
 void session::set_options(unsigned long bits) {
-    const auto is_set = [&](unsigned bit) {
-        return (bits >> bit) % 2 == 1 ? CFG_OPT_ON : CFG_OPT_OFF;
-    };
-    cfg_set_option(user_.get(), CFG_OPT_DELETE_NON_LEAVES, is_set(0));
-    cfg_set_option(user_.get(), CFG_OPT_SHOW_STACK, is_set(1));
-    cfg_set_option(user_.get(), CFG_OPT_SHOW_SOURCE, is_set(2));
+    for (const int option : {CFG_OPT_DELETE_NON_LEAVES, CFG_OPT_SHOW_STACK, CFG_OPT_SHOW_SOURCE}) {
+        const int wanted = static_cast<int>(bits % 2);
+        bits /= 2;
+        cfg_set_option(user_.get(), option, wanted == 1 ? CFG_OPT_ON : CFG_OPT_OFF);
+        int is_on = -1;
+        cfg_get_option(user_.get(), option, &is_on);
+        require_equal(is_on, wanted, "an option is what it was set to");
+    }
     const char* drawing = cfg_tree_view(user_.get(), static_cast<int>(bits % 3));
     require(drawing == cfg_tree_view(user_.get(), 0),
             "a drawing is the same until it is made anew");

@@ -1,24 +1,18 @@
 #include <algorithm>
+#include <optional>
 
 #include "LDIF_Exception.h"
 #include "LDIF_File.h"
 #include "LDIF_Util.h"
 #include "exempt_dn.h"
 #include "memory_file.h"
+#include "printed_text.h"
 #include "property.h"
 #include "tree_description.h"
 
 namespace cfg32::fuzz {
 
 namespace {
-
-/// The text of each entry, of lines that were not read unless somebody asked.
-std::string text_of(const LDIF_File& file) {
-    std::string text;
-    for_each_in_preorder(file.root(), [&](const LDIF_Entry& entry) { entry.append_to(text); });
-    file.trailing_comment().append_to(text);
-    return text;
-}
 
 bool has_blank_around(const kept_text& text) {
     std::string stripped(std::string_view{text});
@@ -61,18 +55,20 @@ bool is_written(LDIF_File& file, const tool::memory_file& on_disk) {
         file.flush();
         return true;
     } catch (const LDIF_Exception& e) {
+        require_refusal(e);
         require_equal(on_disk.text(), before, "a refused write leaves the file alone");
         return false;
     }
 }
 
 void require_round_trip(LDIF_File& file, const tool::memory_file& on_disk) {
-    const std::string text = text_of(file);
     if (!is_written(file, on_disk)) {
         return;
     }
     const std::string written = on_disk.text();
-    require_equal(written, text, "a file is written as its entries are printed");
+    require_equal(written, printed_text(file), "a file is written as its entries are printed");
+    file.treeView(false);
+    file.treeView(true);
     const bool is_exempt = has_exempt_dn(file);
     const bool was_settled = is_settled(file);
     const std::string tree = tests::description(file);
@@ -84,7 +80,7 @@ void require_round_trip(LDIF_File& file, const tool::memory_file& on_disk) {
         return require_round_trip(again, on_disk);
     }
     require_equal(on_disk.text(), written, "a written file needs no repair");
-    require_equal(text_of(again), written, "a tree is printed as it was written");
+    require_equal(printed_text(again), written, "a tree is printed as it was written");
     require_equal(tests::description(again), tree, "what was written is loaded as the same tree");
     require(is_written(again, on_disk), "what was written can be written again");
     require_equal(on_disk.text(), written, "a file is written as the same bytes again");
@@ -94,14 +90,15 @@ void require_round_trip(LDIF_File& file, const tool::memory_file& on_disk) {
 
 void file_property(std::string_view input) {
     const tool::memory_file on_disk(input);
+    std::optional<LDIF_File> file;
     try {
-        LDIF_File file(on_disk.name(), "", nullptr);
-        require_round_trip(file, on_disk);
-        file.treeView(false);
-        file.treeView(true);
+        file.emplace(on_disk.name(), "", nullptr);
     } catch (const LDIF_Exception& e) {
+        require_refusal(e);
         require_equal(on_disk.text(), input, "a refused load leaves the file alone");
+        return;
     }
+    require_round_trip(*file, on_disk);
 }
 
 }  // namespace cfg32::fuzz

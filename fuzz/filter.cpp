@@ -84,7 +84,8 @@ template <class Made, class... Arguments>
 std::unique_ptr<Made> made_of(const Arguments&... arguments) {
     try {
         return std::make_unique<Made>(arguments...);
-    } catch (const LDIF_Exception&) {
+    } catch (const LDIF_Exception& e) {
+        require_refusal(e);
         return nullptr;
     }
 }

@@ -78,8 +78,10 @@ bool begins_with_space(const std::string& text) {
 /// True for a line that a file has in one piece: one that begins with whitespace continues the one
 /// before it, and only a continuation brings whitespace to the front of a value.
 bool stands_alone(const LDIF_Line& line) {
-    return line.type == LDIF_Line::attr && line.hasSeparator && !line.attribute.empty() &&
-           !begins_with_space(line.attribute) && !begins_with_space(line.value);
+    const bool has_name = line.type == LDIF_Line::attr || line.type == LDIF_Line::dn;
+    return line.type == LDIF_Line::comment ||
+           (has_name && line.hasSeparator && !line.attribute.empty() &&
+            !begins_with_space(line.attribute) && !begins_with_space(line.value));
 }
 
 void require_print(const LDIF_Line& line) {

@@ -21,6 +21,7 @@ std::string failure_of_load(std::string_view text) {
         const LDIF_File loaded(file.name(), "", nullptr);
         return "";
     } catch (const LDIF_Exception& e) {
+        require_refusal(e);
         return e.dump();
     }
 }

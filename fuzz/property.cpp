@@ -1,11 +1,18 @@
 #include "property.h"
 
+#include "LDIF_Exception.h"
+
 namespace cfg32::fuzz {
 
 void require(bool holds, std::string_view promise) {
     if (!holds) {
         throw broken_promise(std::string(promise));
     }
+}
+
+void require_refusal(const LDIF_Exception& e) {
+    constexpr int other = 80;  // RFC 4511
+    require(e.ldapErr != other, "a text is refused for what it is: " + e.dump());
 }
 
 std::vector<std::string> parts_of(std::string_view input, size_t most) {

@@ -8,6 +8,8 @@
 #include <string_view>
 #include <vector>
 
+class LDIF_Exception;
+
 namespace cfg32::fuzz {
 
 /// A property does not hold for a text. Says which, and what was found instead.
@@ -16,6 +18,9 @@ struct broken_promise : std::logic_error {
 };
 
 void require(bool holds, std::string_view promise);
+
+/// A text is refused for what it is. What surprised the library itself is none of that: code 80.
+void require_refusal(const LDIF_Exception& e);
 
 template <class Left, class Right>
 void require_equal(const Left& left, const Right& right, std::string_view promise) {

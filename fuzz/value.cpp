@@ -16,14 +16,19 @@ namespace {
 constexpr size_t most_values = 24;  // more than a list does without an index
 constexpr size_t most_ordered = 6;  // each with each and each
 
-/// A value that can be compared: a stored password that can't be decoded is accepted, too.
+/// What an accepted text gives, that can be compared: a stored password that can't be decoded is
+/// accepted, too.
 template <class Make>
 std::optional<LDIF_Value> comparable(Make make) {
+    std::optional<LDIF_Value> value;
     try {
-        LDIF_Value value = make();
-        static_cast<void>(value.compare(value));
+        value = make();
+        static_cast<void>(value->compare(*value));
         return value;
-    } catch (const LDIF_Exception&) {
+    } catch (const LDIF_Exception& e) {
+        require_refusal(e);
+        require(!value || (value->attrType->match == pwCompare && e.ldapErr == 84),
+                "what is accepted can be compared");
         return {};
     }
 }
@@ -33,14 +38,19 @@ std::optional<LDIF_Value> accepted(const _AttrType* type, const std::string& tex
     return comparable([&] { return LDIF_Value(type, text.c_str(), nullptr); });
 }
 
+/// KEPT: of a text only 32 bits are accepted, of bytes 64; a large integer's text may have more.
+bool is_beyond_text(const _AttrType* type, int64_t number) {
+    return type->fromStr != kiloFromStr && number != static_cast<int32_t>(number);
+}
+
 std::optional<LDIF_Value> accepted_bytes(const _AttrType* type, const std::string& bytes) {
     int64_t number = 0;
     if (bytes.size() != sizeof number) {
         return {};  // an integer's bytes are so many
     }
     memcpy(&number, bytes.data(), sizeof number);
-    if (number != static_cast<int32_t>(number)) {
-        return {};  // KEPT: of a text only 32 bits are accepted, of bytes 64
+    if (is_beyond_text(type, number)) {
+        return {};
     }
     return comparable([&] { return LDIF_Value(type, bytes.data(), sizeof number, nullptr); });
 }
