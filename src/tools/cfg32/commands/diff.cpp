@@ -83,8 +83,9 @@ void print_values(char mark, const fmt::text_style& look, const std::string& nam
 void print_text(const std::vector<entry_difference>& found) {
     for (const entry_difference& each : found) {
         const kind_of_change& kind = kind_of(each.change);
-        const std::string dn =
-            each.dn.empty() ? "above all entries" : printable(shown_text(each.dn.str()));
+        const std::string dn = each.entry->is_root()
+                                   ? "above all entries"
+                                   : printable(shown_text(each.entry->dn().str()));
         fmt::print("{}\n", styled(stdout, *kind.style, fmt::format("{} {}", kind.mark, dn)));
         for (const attribute_difference& attribute : each.attributes) {
             print_values('-', style::removed, attribute.name, attribute.removed);
@@ -110,7 +111,7 @@ void print_as_json(const arguments& given, const std::vector<entry_difference>& 
                                   {"removed", json_of(attribute.name, attribute.removed)},
                                   {"added", json_of(attribute.name, attribute.added)}});
         }
-        entries.push_back({{"dn", utf8(shown_text(each.dn.str()))},
+        entries.push_back({{"dn", utf8(shown_text(each.entry->dn().str()))},
                            {"change", kind_of(each.change).word},
                            {"attributes", std::move(attributes)}});
     }

@@ -16,6 +16,17 @@ namespace {
 
 using change_list = std::vector<entry_difference>;
 
+std::string text_of(const kept_dn& dn) {
+    std::string text;
+    dn.append_to(text);
+    return text;
+}
+
+/// The entry of that name in the other tree, null if it has none.
+const LDIF_Entry* counterpart_of(const LDIF_Entry& entry, const LDIF_Entry& other) {
+    return other.find(dn_path(entry.named_dn()));
+}
+
 bool has_text(const LDIF_Values& values, const LDIF_Value& wanted) {
     return std::any_of(values.begin(), values.end(),
                        [&](const LDIF_Value& each) { return each.str() == wanted.str(); });
@@ -79,10 +90,10 @@ change_list compare(const LDIF_Entry& from, const LDIF_Entry& to,
     change_list added;
     const auto append = [](change_list& list, entry_difference::kind kind, const LDIF_Entry& node,
                            std::vector<attribute_difference> attributes) {
-        list.push_back({kind, node.dn(), std::move(attributes)});
+        list.push_back({kind, &node, std::move(attributes)});
     };
     for_each_in_preorder(from, [&](const LDIF_Entry& node) {
-        const LDIF_Entry* counterpart = may_stay(node) ? to.find(node.dn()) : nullptr;
+        const LDIF_Entry* counterpart = may_stay(node) ? counterpart_of(node, to) : nullptr;
         auto attributes = attribute_differences(node, counterpart ? *counterpart : nothing);
         if (!counterpart) {
             append(removed, entry_difference::removed, node, std::move(attributes));
@@ -91,7 +102,7 @@ change_list compare(const LDIF_Entry& from, const LDIF_Entry& to,
         }
     });
     for_each_in_preorder(to, [&](const LDIF_Entry& node) {
-        const LDIF_Entry* counterpart = from.find(node.dn());
+        const LDIF_Entry* counterpart = counterpart_of(node, from);
         if (!counterpart || !may_stay(*counterpart)) {
             append(added, entry_difference::added, node, attribute_differences(nothing, node));
         }
@@ -132,7 +143,7 @@ std::vector<modification> modifications_for(const attribute_difference& differen
 
 change_record record_of(const entry_difference& difference, const LDIF_Entry& to) {
     change_record record;
-    record.dn = difference.dn.str();
+    record.dn = text_of(difference.entry->named_dn());
     switch (difference.change) {
         case entry_difference::removed:
             record.kind = change_record::remove;
@@ -147,7 +158,8 @@ change_record record_of(const entry_difference& difference, const LDIF_Entry& to
             break;
     }
     for (const attribute_difference& each : difference.attributes) {
-        for (modification& change : modifications_for(each, *to.find(difference.dn))) {
+        for (modification& change :
+             modifications_for(each, *counterpart_of(*difference.entry, to))) {
             record.modifications.push_back(std::move(change));
         }
     }
@@ -180,8 +192,9 @@ std::vector<entry_difference> differences(const LDIF_Entry& from, const LDIF_Ent
 
 std::string unspeakable_name(const std::vector<entry_difference>& found) {
     for (const entry_difference& each : found) {
-        if (is_read_as_another(each.dn.str())) {
-            return each.dn.str();
+        std::string dn = text_of(each.entry->named_dn());
+        if (is_read_as_another(dn)) {
+            return dn;
         }
         for (const attribute_difference& attribute : each.attributes) {
             std::string name = unspeakable_name(attribute);
@@ -198,7 +211,7 @@ std::vector<change_record> changes_between(const LDIF_Entry& from, const LDIF_En
     std::unordered_set<const LDIF_Entry*> staying = {&from};
     for_each_in_preorder(from, [&](const LDIF_Entry& node) {
         for (const LDIF_Entry& child : node.children()) {
-            if (staying.count(&node) != 0 && to.find(child.dn())) {
+            if (staying.count(&node) != 0 && counterpart_of(child, to)) {
                 staying.insert(&child);
             }
         }

@@ -21,12 +21,12 @@ struct entry_difference {
     enum kind { added, removed, changed };
 
     kind change;
-    LDIF_DN dn;  ///< empty for the lines above all entries
+    const LDIF_Entry* entry;  ///< where it is; of the former tree, unless it was added
     std::vector<attribute_difference> attributes;
 };
 
 /// What makes one tree out of the other: removed entries with their content, each after those below
-/// it; then changed ones; then new ones, each before those below it.
+/// it; then changed ones; then new ones, each before those below it. They point into the trees.
 std::vector<entry_difference> differences(const LDIF_Entry& from, const LDIF_Entry& to);
 
 /// What of the differences no change record can say, because its name would be read as another: the
