@@ -199,7 +199,9 @@ class session {
 
   private:
     bool note(int code) {
-        require(code >= 0 && code != CFG_OTHER, "a result is no failure of the library's own");
+        require(code >= 0, "a result is none below 0");
+        require(!is_surprise(code, cfg_get_exterror(user_.get())),
+                "a call is refused for a reason");
         if (code != CFG_SUCCESS) {
             ask_for_failure(user_.get());
         }

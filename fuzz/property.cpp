@@ -1,6 +1,7 @@
 #include "property.h"
 
 #include "LDIF_Exception.h"
+#include "failure.h"
 
 namespace cfg32::fuzz {
 
@@ -10,9 +11,12 @@ void require(bool holds, std::string_view promise) {
     }
 }
 
+bool is_surprise(int ldap, int extended) {
+    return ldap == system_error.ldap && extended == system_error.ext;
+}
+
 void require_refusal(const LDIF_Exception& e) {
-    constexpr int other = 80;  // RFC 4511
-    require(e.ldapErr != other, "a text is refused for what it is: " + e.dump());
+    require(!is_surprise(e.ldapErr, e.extErr), "a text is refused for what it is: " + e.dump());
 }
 
 std::vector<std::string> parts_of(std::string_view input, size_t most) {

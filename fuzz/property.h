@@ -19,7 +19,10 @@ struct broken_promise : std::logic_error {
 
 void require(bool holds, std::string_view promise);
 
-/// A text is refused for what it is. What surprised the library itself is none of that: code 80.
+/// True for the codes of what surprised the library itself.
+bool is_surprise(int ldap, int extended);
+
+/// A text is refused for what it is, and that is no surprise.
 void require_refusal(const LDIF_Exception& e);
 
 template <class Left, class Right>

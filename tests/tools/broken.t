@@ -126,11 +126,11 @@ An entry whose DN can't be printed is left out, because nothing could name it:
     $ printf 'dn: cn=Configuration\ncn: x\n\ndn: cn=\ncn: y\n' > nameless.conf
     $ cfg32 -f nameless.conf tree
     cfg32: nameless.conf: read from a private copy, because not all of it can be used (`cfg32 check` tells more):
-      line 4: no change of the file can be made, because this entry can't be written: a value of its DN is empty, or has a line break or NUL, left out
+      line 4: no change of the file can be made, because this entry can't be written: a value of its DN is empty, or has a line break, left out
     ─ cn=Configuration (suffix)
     $ cfg32 -f nameless.conf search 'cn=*'
     cfg32: nameless.conf: read from a private copy, because not all of it can be used (`cfg32 check` tells more):
-      line 4: no change of the file can be made, because this entry can't be written: a value of its DN is empty, or has a line break or NUL, left out
+      line 4: no change of the file can be made, because this entry can't be written: a value of its DN is empty, or has a line break, left out
     dn: cn=Configuration
     cn: x
     

@@ -10,6 +10,7 @@
 
 #include "LDIF_Exception.h"
 #include "LDIF_File.h"
+#include "failing_new.h"
 #include "failures.h"
 #include "model_tree.h"
 #include "modifications.h"
@@ -18,6 +19,7 @@
 
 using namespace cfg32::tests;
 using namespace cfg32::tests::operations;
+using testing::AnyOf;
 using testing::ElementsAre;
 using testing::IsEmpty;
 
@@ -54,6 +56,39 @@ struct LDIF_File_change : store_test {
         return entry ? entry->relative_dn().str() : "none";
     }
 };
+
+/// Makes the change of a store again and again, each time with less memory from some allocation on,
+/// until it is made. What a flush writes afterwards has been changed wholly or not at all.
+template <class Make, class Change>
+void expect_all_or_nothing(const temporary_folder& folder, Make make, Change change) {
+    const auto text_after = [&](LDIF_File& file) {
+        file.refresh();
+        file.flush();
+        return folder.read("conf");
+    };
+    const std::string before = text_after(*make());
+    const auto changed = make();
+    change(*changed);
+    changed->flush();
+    const std::string after = folder.read("conf");
+    ASSERT_NE(before, after);
+    bool is_made = false;
+    for (long which = 0; !is_made; ++which) {
+        SCOPED_TRACE(which);
+        const auto file = make();
+        {
+            const failing_allocation failing(which, failing_allocation::from_then_on);
+            try {
+                change(*file);
+                is_made = !failing.happened();
+            } catch (const std::exception&) {  // of the library, or of the making of its arguments
+            }
+        }
+        if (!is_made) {
+            ASSERT_THAT(text_after(*file), AnyOf(before, after));
+        }
+    }
+}
 
 using LDIF_File_add = LDIF_File_change;
 using LDIF_File_erase = LDIF_File_change;
@@ -111,6 +146,28 @@ TEST_F(LDIF_File_add, EntriesThatBelongBelowANewOneMoveThere) {
                 ElementsAre("o=a", "cn=2, o=a", "cn=1, o=a", "sn=x, cn=1, o=a", "sn=y, cn=1, o=a"));
     EXPECT_EQ(relative_name(*file, "sn=x,cn=1,o=a"), "sn=x");
     EXPECT_EQ(file->root().find(dn_of("cn=1,o=a"))->str(), "dn: cn=1, o=a\nsn: v\n\n");
+}
+
+TEST_F(LDIF_File_add, AncestorThatTurnsUpWhileMemoryIsExhaustedTakesNoEntryAway) {
+    const auto make = [&] {
+        return store_of({"cn=1, cn=m, o=a", "cn=2, cn=m, o=a", "cn=3, cn=m, o=a", "o=b"});
+    };
+    expect_all_or_nothing(folder, make, [&](LDIF_File& file) { add_entry(file, "cn=m, o=a"); });
+    expect_all_or_nothing(folder, make,
+                          [&](LDIF_File& file) { add_entry(file, "cn=4, cn=n, o=c"); });
+}
+
+TEST_F(LDIF_File_change, ValuesAreAllDeletedOrNoneWhileMemoryIsExhausted) {
+    std::string lines;
+    change deletion{del, "sn", {}};
+    for (int i = 0; i < 40; ++i) {
+        lines += "sn: " + std::to_string(i) + "\n";
+        deletion.values.push_back(std::to_string(i));
+    }
+    deletion.values.resize(15);
+    expect_all_or_nothing(
+        folder, [&] { return store(store_head + "dn: o=a\n" + lines + "\n"); },
+        [&](LDIF_File& file) { file.modify(dn_of("o=a"), modifications({deletion}).records()); });
 }
 
 TEST_F(LDIF_File_add, EntryThatIsThereTakesOverTheAttributes) {

@@ -2,6 +2,7 @@
 
 #include <gmock/gmock.h>
 
+#include <clocale>
 #include <sstream>
 #include <string>
 #include <utility>
@@ -279,6 +280,21 @@ TEST(child_index, ErasedChildIsFoundNoMore) {
     EXPECT_EQ(children.nearest("cn=1,o=a"), "none");
     EXPECT_EQ(children.nearest("cn=2,o=a"), "cn=2, o=a");
     EXPECT_THAT(children.below("o=a"), ElementsAre("cn=2, o=a"));
+}
+
+// Another thread may do so while it is filled.
+TEST(child_index, HasOneKindOfHashesHoweverOftenTheLocaleChanges) {
+    const std::string before = setlocale(LC_ALL, nullptr);
+    indexed_entries children;
+    for (int i = 0; i < 8; ++i) {
+        setlocale(LC_ALL, i % 2 == 0 ? "C" : "C.UTF-8");
+        children.add("cn=idx" + std::to_string(i));
+    }
+    for (int i = 0; i < 8; ++i) {
+        setlocale(LC_ALL, i % 2 == 0 ? "C.UTF-8" : "C");
+        EXPECT_EQ(children.nearest("cn=idx" + std::to_string(i)), "cn=idx" + std::to_string(i));
+    }
+    setlocale(LC_ALL, before.c_str());
 }
 
 TEST(child_index, TellsWhereAChildStands) {

@@ -78,9 +78,9 @@ equal_texts* cfg32::equal_texts_of(const _AttrType& type) {
     return support ? support->equal : nullptr;
 }
 
-size_t cfg32::hash_of(const LDIF_Value& value) {
+size_t cfg32::hash_of(const LDIF_Value& value, hash_kind kind) {
     const match_support* support = support_of(*value.attrType);
-    return support ? support->hash(value) : 0;
+    return support ? support->hash(value, kind) : 0;
 }
 
 void cfg32::complete(LDIF_Value& value) {

@@ -10,6 +10,7 @@
 #include <string_view>
 #include <utility>
 
+#include "LDIF_Util.h"
 #include "cisString.h"
 #include "kept_text.h"
 
@@ -119,7 +120,7 @@ using equal_texts = bool(std::string_view left, std::string_view right);
 equal_texts* equal_texts_of(const _AttrType& type);
 
 /// A hash of the value that goes with its type's match: equal values have equal hashes.
-size_t hash_of(const LDIF_Value& value);
+size_t hash_of(const LDIF_Value& value, hash_kind kind = present_hash_kind());
 
 /// Gives a value that has only its text what else its type's match needs.
 void complete(LDIF_Value& value);

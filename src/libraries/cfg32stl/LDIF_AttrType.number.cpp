@@ -138,7 +138,8 @@ void complete_number(LDIF_Value& value) {
 
 const match_support cfg32::int_match{
     [](std::string_view left, std::string_view right) { return left == right; },
-    [](const LDIF_Value& value) { return static_cast<size_t>(number_of(value)); }, complete_number};
+    [](const LDIF_Value& value, hash_kind) { return static_cast<size_t>(number_of(value)); },
+    complete_number};
 
 // KEPT: the sign is that of right minus left, the reverse of every other syntax.
 int intCompare(const LDIF_Value& left, const LDIF_Value& right) {

@@ -96,7 +96,7 @@ std::string decoder_input(const std::string& stored) {
 
 const match_support pw_match{
     nullptr,
-    [](const LDIF_Value& value) {
+    [](const LDIF_Value& value, hash_kind) {
         // A list of several passwords holds only ones that can be decoded: what fails here is a new
         // one, which a comparison would have on its right.
         const decoded_password password(value, right_not_decoded);

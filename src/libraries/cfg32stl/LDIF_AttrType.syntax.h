@@ -13,9 +13,9 @@ namespace cfg32 {
 
 /// What goes with a match, beside the operations of the table.
 struct match_support {
-    equal_texts* equal;                 ///< of stored texts; null where they don't tell all
-    size_t (*hash)(const LDIF_Value&);  ///< equal values have equal ones
-    void (*complete)(LDIF_Value&);      ///< what a value needs beside its text; null for nothing
+    equal_texts* equal;  ///< of stored texts; null where they don't tell all
+    size_t (*hash)(const LDIF_Value&, hash_kind);  ///< equal values have equal ones
+    void (*complete)(LDIF_Value&);  ///< what a value needs beside its text; null for nothing
 };
 
 extern const match_support ces_match;

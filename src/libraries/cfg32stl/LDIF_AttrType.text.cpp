@@ -81,13 +81,17 @@ void refuse_with_message(const failure& kind, const char* message, const LDIF_Va
 
 const match_support ces_match{
     [](std::string_view left, std::string_view right) { return left == right; },
-    [](const LDIF_Value& value) { return std::hash<std::string_view>()(value.shown()); }, nullptr};
+    [](const LDIF_Value& value, hash_kind) { return std::hash<std::string_view>()(value.shown()); },
+    nullptr};
 
-const match_support cis_match{
-    [](std::string_view left, std::string_view right) {
-        return left.empty() == right.empty() && equal_without_case(left, right);
-    },
-    [](const LDIF_Value& value) { return hash_without_case(value.shown()); }, nullptr};
+const match_support cis_match{[](std::string_view left, std::string_view right) {
+                                  return left.empty() == right.empty() &&
+                                         equal_without_case(left, right);
+                              },
+                              [](const LDIF_Value& value, hash_kind kind) {
+                                  return hash_without_case(value.shown(), hash_seed, kind);
+                              },
+                              nullptr};
 
 }  // namespace cfg32
 

@@ -245,14 +245,17 @@ void LDIF_RDN::append_to(std::string& out) const {
 
 int LDIF_RDN::compare(const LDIF_RDN& other) const { return compare_steps(pairs_, other.pairs_); }
 
-size_t LDIF_RDN::hash(size_t seed) const {
+size_t LDIF_RDN::hash(size_t seed, hash_kind kind) const {
+    const auto take = [&](std::string_view text) { seed = hash_without_case(text, seed, kind); };
     // As of the text, where that is no more than attribute and value.
     for (const LDIF_RDN_pair& pair : pairs_) {
-        seed = hash_without_case(&pair == pairs_.data() ? "" : "+", seed);
-        seed = hash_without_case("=", hash_without_case(pair.attribute.text(), seed));
-        seed = hash_without_case(pair.value.text(), seed);
+        take(&pair == pairs_.data() ? "" : "+");
+        take(pair.attribute.text());
+        take("=");
+        take(pair.value.text());
     }
-    return hash_without_case(",", seed);
+    take(",");
+    return seed;
 }
 
 LDIF_DN& LDIF_DN::operator=(const cisString& text) {
@@ -307,9 +310,10 @@ void LDIF_DN::append_to(std::string& out) const {
 }
 
 size_t LDIF_DN::hash() const {
+    const hash_kind kind = present_hash_kind();
     size_t hash = 0;
     for (const LDIF_RDN& rdn : rdns_) {
-        hash = rdn.hash(hash);
+        hash = rdn.hash(hash, kind);
     }
     return hash;
 }

@@ -11,6 +11,7 @@
 #include <string>
 #include <vector>
 
+#include "LDIF_Util.h"
 #include "cisString.h"
 
 /// The attribute type of one part of an RDN, without an "oid." prefix.
@@ -94,7 +95,7 @@ class LDIF_RDN {
 
     const std::vector<LDIF_RDN_pair>& pairs() const { return pairs_; }
     /// Equal RDNs have equal hashes. Continues the hash of the RDNs before it.
-    size_t hash(size_t seed) const;
+    size_t hash(size_t seed, cfg32::hash_kind kind = cfg32::present_hash_kind()) const;
 
   private:
     std::vector<LDIF_RDN_pair> pairs_;

@@ -269,6 +269,19 @@ const LDIF_Entry* LDIF_Entry::find(const dn_path& path) const {
     return entry;
 }
 
+LDIF_Entry* LDIF_Entry::parent_of(const LDIF_Entry& descendant) {
+    const dn_path path(descendant.dn_);
+    LDIF_Entry* parent = nullptr;
+    LDIF_Entry* entry = this;
+    for (size_t depth = relative_size(); entry && entry != &descendant;) {
+        parent = entry;
+        const child_index* index = entry->index();
+        entry = index ? index->equal_or_ancestor(path, depth) : nullptr;
+        depth += entry ? entry->relative_size() : 0;
+    }
+    return entry ? parent : nullptr;
+}
+
 void LDIF_Entry::erase(LDIF_Entry& child) {
     child_index& index = *this->index();
     const list::iterator position = index.position_of(child);

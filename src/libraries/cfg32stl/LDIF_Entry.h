@@ -75,6 +75,9 @@ class LDIF_Entry {
     const LDIF_Entry* find(const LDIF_DN& dn) const;
     const LDIF_Entry* find(const cfg32::dn_path& path) const;
 
+    /// The parent of an entry somewhere below this one; null when it is not there.
+    LDIF_Entry* parent_of(const LDIF_Entry& descendant);
+
     /// Removes a child with everything below it.
     void erase(LDIF_Entry& child);
 

@@ -200,28 +200,23 @@ void apply(LDIF_Entry& entry, const modification& mod, aes_key_data* key) {
     }
 }
 
-/// The nearest ancestor of dn that is there; the root if there is no other.
-LDIF_Entry& nearest_ancestor(LDIF_Entry& root, LDIF_DN dn) {
-    LDIF_Entry* found = nullptr;
-    while (!found && !dn.empty()) {
-        dn.remove_leaf();
-        found = root.find(dn);
-    }
-    return found ? *found : root;
-}
-
 }  // namespace
 
-/// Completes the report of a failed change. Exhausted memory may have left it half done: the next
-/// refresh reads the file again.
-void LDIF_File::note_failure(LDIF_Exception& e, const LDIF_DN& dn) {
-    name_file(e);
-    e.entryDn = shown(dn);
-    is_loaded_ = is_loaded_ && e.sysErrno != ENOMEM;
+/// Carries out a change of the tree, and completes the report of its failure. Exhausted memory may
+/// leave it half done, and may end the report too: then the next refresh reads the file again.
+template <class Body>
+void LDIF_File::change(const char* operation, const LDIF_DN& dn, Body body) {
+    const bool was_loaded = std::exchange(is_loaded_, false);
+    with_boundary(in(operation), body, [&](LDIF_Exception& e) {
+        name_file(e);
+        e.entryDn = shown(dn);
+        is_loaded_ = was_loaded && e.sysErrno != ENOMEM;
+    });
+    is_loaded_ = was_loaded;
 }
 
 void LDIF_File::modify(const LDIF_DN& dn, ldapmod** mods) {
-    const auto body = [&] {
+    change("LDIF_File::modify()", dn, [&] {
         if (!mods || !*mods) {
             return;
         }
@@ -232,12 +227,11 @@ void LDIF_File::modify(const LDIF_DN& dn, ldapmod** mods) {
         for (; *mods; ++mods) {
             apply(*entry, modification(**mods), key_);
         }
-    };
-    with_boundary(in("LDIF_File::modify()"), body, [&](LDIF_Exception& e) { note_failure(e, dn); });
+    });
 }
 
 void LDIF_File::add(const LDIF_DN& dn, ldapmod** mods) {
-    const auto body = [&] {
+    change("LDIF_File::add()", dn, [&] {
         LDIF_Entry added(dn);
         // KEPT: whatever a modification is to do with its values, here it adds them.
         for (; mods && *mods; ++mods) {
@@ -250,20 +244,19 @@ void LDIF_File::add(const LDIF_DN& dn, ldapmod** mods) {
             }
         }
         root_ += std::move(added);
-    };
-    with_boundary(in("LDIF_File::add()"), body, [&](LDIF_Exception& e) { note_failure(e, dn); });
+    });
 }
 
 void LDIF_File::erase(const LDIF_DN& dn, bool deleteNonLeaves) {
-    const auto body = [&] {
+    change("LDIF_File::erase()", dn, [&] {
         LDIF_Entry* entry = root_.find(dn);
-        if (!entry || entry->is_root()) {
+        LDIF_Entry* parent = entry ? root_.parent_of(*entry) : nullptr;
+        if (!parent) {
             raise(no_entry);
         }
         if (!entry->children().empty() && !deleteNonLeaves) {
             raise(not_a_leaf);
         }
-        nearest_ancestor(root_, dn).erase(*entry);
-    };
-    with_boundary(in("LDIF_File::erase()"), body, [&](LDIF_Exception& e) { note_failure(e, dn); });
+        parent->erase(*entry);
+    });
 }

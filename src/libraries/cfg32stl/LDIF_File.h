@@ -149,7 +149,8 @@ class LDIF_File {
 
     // What is filled in of a failure.
     void name_file(LDIF_Exception& e) const { e.configFile = file_name_; }
-    void note_failure(LDIF_Exception& e, const LDIF_DN& dn);
+    template <class Body>
+    void change(const char* operation, const LDIF_DN& dn, Body body);
     auto name_file_and_errno(int error) const {
         return [this, error](LDIF_Exception& e) {
             name_file(e);

@@ -226,8 +226,8 @@ hash_kind present_hash_kind() {
     return MB_CUR_MAX > 1 ? hash_kind::of_ascii_letters : hash_kind::of_every_byte;
 }
 
-size_t hash_without_case(std::string_view text, size_t seed) {
-    const byte_classes& classes = classes_by_kind[static_cast<size_t>(present_hash_kind())];
+size_t hash_without_case(std::string_view text, size_t seed, hash_kind kind) {
+    const byte_classes& classes = classes_by_kind[static_cast<size_t>(kind)];
     for (const char c : text) {  // FNV-1a
         if (c == '\0') {
             break;

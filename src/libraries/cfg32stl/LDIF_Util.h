@@ -142,8 +142,11 @@ enum class hash_kind { of_ascii_letters, of_every_byte };
 hash_kind present_hash_kind();
 
 /// A hash that is the same for texts that are equal without regard to case in whichever locale of
-/// the present kind; seed continues another hash.
-size_t hash_without_case(std::string_view text, size_t seed = 0xcbf29ce484222325);
+/// that kind; seed continues another hash. Hashes that are kept are all made of one kind: another
+/// thread may change the locale between two of them.
+inline constexpr size_t hash_seed = 0xcbf29ce484222325;
+size_t hash_without_case(std::string_view text, size_t seed = hash_seed,
+                         hash_kind kind = present_hash_kind());
 
 /// The value of a hexadecimal digit, or -1.
 int hex_digit(wchar_t c);

@@ -236,7 +236,10 @@ LDIF_Values& LDIF_Values::operator-=(const std::string& text) {
     const auto body = [&]() -> LDIF_Values& {
         const const_iterator value = find(text);
         if (value != end()) {
-            erase(value);
+            remove(value.position_);
+        }
+        if (several_ && several_->gaps > size()) {
+            several_->close_gaps();
         }
         return *this;
     };
@@ -314,7 +317,7 @@ void LDIF_Values::append(LDIF_Value&& value) {
         all.dns = all.dns ? std::move(all.dns) : std::make_unique<dn_map>();
     }
     if (hash_index* index = all.good_index()) {
-        index->positions.emplace(hash_of(value), all.texts.size());
+        index->positions.emplace(hash_of(value, index->kind), all.texts.size());
     }
     if (value.dn) {
         all.dns->merge(dn);
@@ -331,19 +334,23 @@ LDIF_Values::const_iterator LDIF_Values::find(const LDIF_Value& value) const {
 }
 
 LDIF_Values::const_iterator LDIF_Values::erase(const const_iterator& value) {
+    remove(value.position_);
+    return {this, value.position_ + 1};
+}
+
+/// Removes a value. It leaves a gap: to close that at once would make it slow to remove many.
+void LDIF_Values::remove(size_t position) {
     if (!several_) {
         first_ = {};
-        return end();
+        return;
     }
-    kept_text& erased = several_->texts[value.position_];
-    forget(value.position_);
+    kept_text& erased = several_->texts[position];
+    forget(position);
     if (several_->dns) {
         several_->dns->erase(erased.view().data());
     }
-    // To close the gap at once would make it slow to erase many.
     erased = {};
     ++several_->gaps;
-    return std::next(value);
 }
 
 void LDIF_Values::several::close_gaps() {
@@ -376,7 +383,8 @@ size_t LDIF_Values::position_of(const LDIF_Value& value) const {
 }
 
 size_t LDIF_Values::indexed_position_of(const LDIF_Value& value) const {
-    const auto [first, last] = index().positions.equal_range(hash_of(value));
+    const hash_index& known = index();
+    const auto [first, last] = known.positions.equal_range(hash_of(value, known.kind));
     const auto is_equal = [&](const auto& entry) {
         return value_of(several_->texts[entry.second]).compare(value) == 0;
     };
@@ -391,7 +399,7 @@ const LDIF_Values::hash_index& LDIF_Values::index() const {
         const std::span<const kept_text> all = texts_and_gaps();
         for (size_t position = 0; position < all.size(); ++position) {
             if (all[position].has_value()) {
-                index->positions.emplace(hash_of(value_of(all[position])), position);
+                index->positions.emplace(hash_of(value_of(all[position]), index->kind), position);
             }
         }
         several_->index = std::move(index);
@@ -405,8 +413,8 @@ void LDIF_Values::forget(size_t position) {
     if (!index) {
         return;
     }
-    const auto [first, last] =
-        index->positions.equal_range(hash_of(value_of(several_->texts[position])));
+    const size_t hash = hash_of(value_of(several_->texts[position]), index->kind);
+    const auto [first, last] = index->positions.equal_range(hash);
     const auto is_it = [&](const auto& entry) { return entry.second == position; };
     index->positions.erase(std::find_if(first, last, is_it));
 }

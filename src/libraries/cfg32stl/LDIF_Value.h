@@ -180,6 +180,7 @@ class LDIF_Values {
     size_t position_of(const LDIF_Value& value) const;
     size_t indexed_position_of(const LDIF_Value& value) const;
     const hash_index& index() const;
+    void remove(size_t position);
     void forget(size_t position);
 
     cfg32::attribute_name name_;

@@ -12,19 +12,19 @@ namespace {
 /// Calls use(hash) with the hash of each root-side part of the child's relative DN but the whole;
 /// returns the hash of that.
 template <class Use>
-size_t for_each_ancestor(const LDIF_Entry& child, const dn_path& path, Use use) {
+size_t for_each_ancestor(const LDIF_Entry& child, const dn_path& path, hash_kind kind, Use use) {
     size_t hash = 0;
     for (size_t i = child.depth(); i < path.size(); ++i) {
         if (i > child.depth()) {
             use(hash);
         }
-        hash = path.hash(i, hash);
+        hash = path.hash(i, hash, kind);
     }
     return hash;
 }
 
-size_t hash_of(const LDIF_Entry& child, const dn_path& path) {
-    return for_each_ancestor(child, path, [](size_t) {});
+size_t hash_of(const LDIF_Entry& child, const dn_path& path, hash_kind kind) {
+    return for_each_ancestor(child, path, kind, [](size_t) {});
 }
 
 }  // namespace
@@ -74,7 +74,7 @@ void hashed_children::erase(size_t hash, const LDIF_Entry& child) {
 }
 
 void child_index::insert(position child, const dn_path& path) {
-    const size_t hash = for_each_ancestor(*child, path, [&](size_t ancestor) {
+    const size_t hash = for_each_ancestor(*child, path, kind_, [&](size_t ancestor) {
         by_ancestor_.emplace(ancestor_place(ancestor, next_ordinal_), child);
     });
     by_dn_.insert(hash, child);
@@ -86,7 +86,7 @@ void child_index::insert(position child, const dn_path& path) {
 void child_index::erase(position child) {
     const dn_path path(child->named_dn());
     const auto ordinal = ordinals_.find(&*child);
-    const size_t hash = for_each_ancestor(*child, path, [&](size_t ancestor) {
+    const size_t hash = for_each_ancestor(*child, path, kind_, [&](size_t ancestor) {
         by_ancestor_.erase(ancestor_place(ancestor, ordinal->second));
     });
     by_dn_.erase(hash, *child);
@@ -97,13 +97,13 @@ void child_index::erase(position child) {
 
 child_index::position child_index::position_of(const LDIF_Entry& child) const {
     const auto is_child = [&](const LDIF_Entry& own) { return &own == &child; };
-    return *by_dn_.find(hash_of(child, dn_path(child.named_dn())), is_child);
+    return *by_dn_.find(hash_of(child, dn_path(child.named_dn()), kind_), is_child);
 }
 
 LDIF_Entry* child_index::equal_or_ancestor(const dn_path& dn, size_t from) const {
     size_t hash = 0;
     for (size_t to = from + 1; to <= dn.size(); ++to) {
-        hash = dn.hash(to - 1, hash);
+        hash = dn.hash(to - 1, hash, kind_);
         const auto is_wanted = [&](const LDIF_Entry& child) {
             return dn.is_relative_dn(from, to, child);
         };
@@ -120,7 +120,7 @@ std::vector<child_index::position> child_index::descendants(const LDIF_Entry& si
     if (by_ancestor_.empty()) {
         return found;
     }
-    const size_t hash = hash_of(sibling, path);
+    const size_t hash = hash_of(sibling, path, kind_);
     for (auto entry = by_ancestor_.lower_bound({hash, 0});
          entry != by_ancestor_.end() && entry->first.first == hash; ++entry) {
         const LDIF_Entry& child = *entry->second;

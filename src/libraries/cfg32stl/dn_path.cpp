@@ -237,12 +237,13 @@ int dn_path::compare_rdn(size_t i, const dn_path& other) const {
                       : compare_without_case(left.substr(left_name), right.substr(right_name));
 }
 
-size_t dn_path::hash(size_t i, size_t seed) const {
-    if (last_hashed_.i != i || last_hashed_.seed != seed) {
-        const size_t hash = is_simple()
-                                ? hash_without_case(",", hash_without_case(part(i, i + 1), seed))
-                                : dn_->rdns()[i].hash(seed);
-        last_hashed_ = {i, seed, hash};
+size_t dn_path::hash(size_t i, size_t seed, hash_kind kind) const {
+    if (last_hashed_.i != i || last_hashed_.seed != seed || last_hashed_.kind != kind) {
+        const size_t hash =
+            is_simple()
+                ? hash_without_case(",", hash_without_case(part(i, i + 1), seed, kind), kind)
+                : dn_->rdns()[i].hash(seed, kind);
+        last_hashed_ = {i, seed, kind, hash};
     }
     return last_hashed_.hash;
 }

@@ -103,7 +103,7 @@ class dn_path {
     int compare(const dn_path& other) const;
 
     /// Continues a hash of the RDNs on the root side of the i-th, counted from the root, with that.
-    size_t hash(size_t i, size_t seed) const;
+    size_t hash(size_t i, size_t seed, hash_kind kind = present_hash_kind()) const;
 
     /// True when the RDNs from `from` up to `to` are the relative DN of the entry.
     bool is_relative_dn(size_t from, size_t to, const LDIF_Entry& entry) const;
@@ -127,10 +127,11 @@ class dn_path {
     struct hashed_rdn {
         size_t i;
         size_t seed;
+        hash_kind kind;
         size_t hash;
     };
 
-    mutable hashed_rdn last_hashed_{~size_t{}, 0, 0};  // it is mostly asked for twice
+    mutable hashed_rdn last_hashed_{~size_t{}, 0, {}, 0};  // it is mostly asked for twice
     mutable const LDIF_DN* dn_ = nullptr;  // of another, or once it is compared with one
     mutable std::unique_ptr<LDIF_DN> own_dn_;
 };

@@ -235,7 +235,7 @@ void checked_entries::check_writing(const checked_entry& entry, const LDIF_DN& d
 
 std::string checked_entries::why_unwritable(const checked_entry& entry, const LDIF_DN& dn) const {
     if (is_unprintable(dn)) {
-        return "a value of its DN is empty, or has a line break or NUL";
+        return "a value of its DN is empty, or has a line break";
     }
     for (const auto& [name, attribute] : entry.attributes) {
         const bool is_header = is_of_root(attribute) && attribute.values().size() <= 1;
@@ -260,7 +260,7 @@ std::string checked_entries::why_unwritable(const LDIF_Attribute& attribute) con
     const bool is_dn = attribute.values().type()->fromStr == dnFromStr;
     for (const LDIF_Value& value : attribute.values()) {
         if (is_dn && breaks_line(value.text)) {
-            return fmt::format("a value of {}{} has a line break or NUL", name,
+            return fmt::format("a value of {}{} has a line break", name,
                                on_line(line_of(value)));
         }
     }
