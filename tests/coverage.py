@@ -5,7 +5,7 @@ usage: coverage.py <source folder> < <output of llvm-cov export>
 
 The libraries' own code has to be covered: every line, and of each 100 ways that a condition can go,
 95. A line that can't be reached says why in a comment that begins with UNREACHABLE:, and is left
-out, with the branches on it.
+out, with the branches on it. What was not counted at all is not covered.
 """
 
 import collections
@@ -73,6 +73,9 @@ class Area:
                 never = "true" if if_true == 0 else "false"
                 self.missed.append((name, line, f"never {never}, column {column}"))
 
+    def is_measured(self):
+        return self.lines > 0 and self.branches > 0
+
     def is_covered(self):
         return (self.lines_run >= LEAST_LINES * self.lines
                 and self.branches_run >= LEAST_BRANCHES * self.branches)
@@ -96,7 +99,7 @@ def main(root):
     branches = branch_counts(data["functions"])
     areas = {name: Area() for name in AREAS}
     for file in data["files"]:
-        path = pathlib.Path(file["filename"])
+        path = pathlib.Path(file["filename"]).resolve()
         name = str(path.relative_to(root)) if path.is_relative_to(root) else ""
         left_out = lines_left_out(path.read_text("utf-8")) if name else []
         lines = {line: count for line, count in line_counts(file["segments"]).items()
@@ -108,7 +111,10 @@ def main(root):
                 areas[area].add(name, lines, conditions)
     for name, area in areas.items():
         area.print(name)
-    return 0 if areas["libraries"].is_covered() else 1
+        if not area.is_measured():
+            print(f"{name}: no lines, or no branches, were counted below {root}/{AREAS[name]}")
+    is_measured = all(area.is_measured() for area in areas.values())
+    return 0 if is_measured and areas["libraries"].is_covered() else 1
 
 
 sys.exit(main(pathlib.Path(sys.argv[1]).resolve()))

@@ -78,7 +78,7 @@ static void changed_meanwhile(struct scene *s) {
 
 static void with_uncanonical_lines(struct scene *s) {
     created(s);
-    write_with(s, "\ndn:CN = Extra , " CONFIGURATION "\ncn:Extra\noru-slapdPort:  0389\n");
+    write_with(s, "\ndn:CN = Extra, " CONFIGURATION "\ncn:Extra\noru-slapdPort:  0389\n");
     bind_example(s);
 }
 
@@ -115,6 +115,24 @@ static void refused(struct scene *s) {
                      21);
 }
 
+static void refused_word(struct scene *s) {
+    bound(s);
+    assert_int_equal(
+        modify_one(s->handle, CONFIGURATION, LDAP_MOD_REPLACE, "oru-slapdSysLogLevel", "loud"), 21);
+}
+
+static void refused_mask(struct scene *s) {
+    bound(s);
+    assert_int_equal(modify_one(s->handle, TLS, LDAP_MOD_REPLACE, "oru-slapdSslCipherSpecs", "255"),
+                     21);
+}
+
+static void refused_line(struct scene *s) {
+    created(s);
+    write_file(s->f->config, "version: 1\n\ncn: before any entry\n");
+    assert_int_equal(cfg_bind_s(s->handle, "cn=root", "Correct-Horse-7", CFG_AUTH_SIMPLE), 65);
+}
+
 static void refused_and_told(struct scene *s) {
     refused(s);
     assert_non_null(cfg_dump_exception(s->handle));
@@ -145,17 +163,22 @@ static void tell_handle(struct scene *s, FILE *out) {
     s->handle = NULL;
 }
 
+/* The file's path is another in each run. */
+static const char *shown(const struct scene *s, const char *text) {
+    return !text ? "null" : strcmp(text, s->f->config) == 0 ? "the file" : text;
+}
+
 static void tell_name_option(struct scene *s, FILE *out) {
     char *name = NULL;
     cfg_get_option(s->handle, CFG_OPT_CONFIG_FILE, &name);
-    fprintf(out, "%d %s", s->code, strcmp(name, s->f->config) == 0 ? "old" : name);
+    fprintf(out, "%d %s", s->code, shown(s, name));
     cfg_memfree(name);
 }
 
 /* A text that is the caller's, or null and the code. */
 static void tell_text(struct scene *s, FILE *out) {
     if (s->text) {
-        fprintf(out, "%s", s->text);
+        fputs(shown(s, s->text), out);
     } else {
         fprintf(out, "null %d", cfg_get_errno(s->handle));
     }
@@ -170,14 +193,12 @@ static void tell_first_attribute(struct scene *s, FILE *out) {
     tell_text(s, out);
 }
 
-static void tell_seen_text(struct scene *s, FILE *out) {
-    fprintf(out, "%s", s->seen ? (const char *)s->seen : "null");
-}
+static void tell_seen_text(struct scene *s, FILE *out) { fputs(shown(s, s->seen), out); }
 
 static void tell_seen_list(struct scene *s, FILE *out) {
-    const char *const *word = s->seen;
-    for (; word && *word; ++word) {
-        fprintf(out, "%s ", *word);
+    const char *const *words = s->seen;
+    for (const char *const *word = words; word && *word; ++word) {
+        fprintf(out, "%s%s", word == words ? "" : " ", *word);
     }
 }
 
@@ -216,6 +237,9 @@ static void tell_entry(struct scene *s, FILE *out, CfgMessage *entry) {
 static void tell_result(struct scene *s, FILE *out) {
     tell_code(s, out);
     assert_true(s->code == CFG_SUCCESS || !s->result);
+    if (s->code == CFG_SUCCESS) {
+        fprintf(out, ", %d found", cfg_count_entries(s->handle, s->result));
+    }
     for (CfgMessage *entry = s->result; entry; entry = cfg_next_entry(s->handle, entry)) {
         tell_entry(s, out, entry);
     }
@@ -381,75 +405,90 @@ static void draw_cp437(struct scene *s) { s->seen = cfg_tree_view(s->handle, CFG
 #define OR_DECODING "|84"
 #define OR_BACKUP "|50"
 
+/* Rows that are alike in the rest. */
 /* clang-format off */
+#define BIND(of, prepare, make, answer, failures, besides) \
+    {"cfg_bind_s", of, prepare, make, tell_code, answer, failures, NULL, besides}
+#define SEARCH(of, prepare, make, answer, failures) \
+    {"cfg_search_s", of, prepare, make, tell_result, answer, failures, NULL, 0}
+#define CHANGE(call, of, prepare, make, answer, done_before) \
+    {call, of, prepare, make, tell_code, answer, SYSTEM_OR_MEMORY OR_BACKUP, done_before, 0}
+#define GIVES(call, of, prepare, make, tell, answer, failures) \
+    {call, of, prepare, make, tell, answer, failures, NULL, 0}
+#define NEVER_FAILS(call, of, prepare, make, tell, answer) \
+    {call, of, prepare, make, tell, answer, NULL, NULL, 0}
+
 const struct row allocation_rows[] = {
-    {"cfg_init", "a process in the C locale", nothing, init, tell_handle, "null", NULL, loses_a_block},
-    {"cfg_bind_s", "the default file", unnamed, bind_administrator_of_example, tell_code, SYSTEM_OR_MEMORY OR_DECODING, NULL, 0},
-    {"cfg_bind_s", "another method", created, bind_by_unknown_method, tell_code, SYSTEM_OR_MEMORY, NULL, 0},
-    {"cfg_bind_s", "unusable lines", with_unusable_lines, bind_administrator_of_example, tell_code, SYSTEM_OR_MEMORY OR_DECODING OR_BACKUP, NULL, repairs_first},
-    {"cfg_bind_s", "a malformed DN", with_a_malformed_dn, bind_administrator_of_example, tell_code, SYSTEM_OR_MEMORY, NULL, 0},
-    {"cfg_bind_s", "a bound handle", refused_and_told, bind_administrator_of_example, tell_code, SYSTEM_OR_MEMORY OR_DECODING, NULL, 0},
-    {"cfg_unbind", "a failed handle", refused_and_told, unbind, tell_number, NULL, NULL, 0},
-    {"cfg_reset", "a failed handle", refused_and_told, reset, tell_code, NULL, NULL, 0},
-    {"cfg_get_option", "a name", created, get_name_option, tell_text, "null 0", NULL, 0},
-    {"cfg_get_option", "a flag", created, get_flag_option, tell_number, NULL, NULL, 0},
-    {"cfg_set_option", "a name", created, set_name_option, tell_name_option, "90 old", NULL, 0},
-    {"cfg_set_option", "a flag", created, set_flag_option, tell_number, NULL, NULL, 0},
-    {"cfg_search_s", "all names", bound, search_all_names, tell_result, SYSTEM_OR_MEMORY, NULL, 0},
-    {"cfg_search_s", "a subtree", bound, search_subtree, tell_result, SYSTEM_OR_MEMORY, NULL, 0},
-    {"cfg_search_s", "a subtree, read before", read_before, search_subtree, tell_result, SYSTEM_OR_MEMORY, NULL, 0},
-    {"cfg_search_s", "uncanonical lines", with_uncanonical_lines, search_extra, tell_result, SYSTEM_OR_MEMORY, NULL, 0},
-    {"cfg_search_s", "a changed file", changed_meanwhile, search_extra, tell_result, SYSTEM_OR_MEMORY OR_DECODING, NULL, 0},
-    {"cfg_search_s", "one level", bound, search_one_level, tell_result, SYSTEM_OR_MEMORY, NULL, 0},
-    {"cfg_search_s", "a number", bound, search_number, tell_result, SYSTEM_OR_MEMORY, NULL, 0},
-    {"cfg_search_s", "a number, uncanonical", with_uncanonical_lines, search_number, tell_result, SYSTEM_OR_MEMORY, NULL, 0},
-    {"cfg_search_s", "a DN", bound, search_dn, tell_result, SYSTEM_OR_MEMORY, NULL, 0},
-    {"cfg_search_s", "passwords", bound, search_passwords, tell_result, SYSTEM_OR_MEMORY OR_DECODING, NULL, 0},
-    {"cfg_search_s", "a refused value", bound, search_refused_value, tell_result, SYSTEM_OR_MEMORY, NULL, 0},
-    {"cfg_search_s", "a missing base", bound, search_missing_base, tell_result, SYSTEM_OR_MEMORY, NULL, 0},
-    {"cfg_first_entry", "a result", searched, first_entry, tell_number, NULL, NULL, 0},
-    {"cfg_next_entry", "a result", searched, next_entry, tell_number, NULL, NULL, 0},
-    {"cfg_count_entries", "a result", searched, count_entries, tell_number, NULL, NULL, 0},
-    {"cfg_count_attributes", "a result", searched, count_attributes, tell_number, NULL, NULL, 0},
-    {"cfg_first_attribute", "a result", searched, first_attribute, tell_first_attribute, "null 90", NULL, 0},
-    {"cfg_next_attribute", "a result", walked, next_attribute, tell_text, "null 90", "nuv-instanceLocation", 0},
-    {"cfg_get_values", "a result", searched, get_values, tell_values, "null 90", NULL, 0},
-    {"cfg_count_values", "values", given_values, count_values, tell_number, NULL, NULL, 0},
-    {"cfg_value_free", "values", given_values, value_free, tell_number, NULL, NULL, 0},
-    {"cfg_get_dn", "a result", searched, get_dn, tell_text, "null 90", NULL, 0},
-    {"cfg_msgfree", "a result", searched, msgfree, tell_number, NULL, NULL, 0},
-    {"cfg_ber_free", "a cursor", walked, free_cursor, tell_number, NULL, NULL, 0},
-    {"cfg_memfree", "a DN", given_text, memfree, tell_number, NULL, NULL, 0},
-    {"cfg_modify_s", "a number", bound, modify_number, tell_code, SYSTEM_OR_MEMORY OR_BACKUP, NULL, 0},
-    {"cfg_modify_s", "a number, no backup", bound_without_backup, modify_number, tell_code, SYSTEM_OR_MEMORY, NULL, 0},
-    {"cfg_modify_s", "a password", bound, modify_password, tell_code, SYSTEM_OR_MEMORY OR_BACKUP, NULL, 0},
-    {"cfg_modify_s", "one more value", bound, modify_by_adding, tell_code, SYSTEM_OR_MEMORY OR_BACKUP, NULL, 0},
-    {"cfg_modify_s", "one value less", bound, modify_by_deleting, tell_code, SYSTEM_OR_MEMORY OR_BACKUP, NULL, 0},
-    {"cfg_modify_s", "no entry", bound, modify_missing_entry, tell_code, SYSTEM_OR_MEMORY OR_BACKUP, NULL, 0},
-    {"cfg_add_s", "an entry", bound, add_entry, tell_code, SYSTEM_OR_MEMORY OR_BACKUP, NULL, 0},
-    {"cfg_delete_s", "a leaf", bound, delete_leaf, tell_code, SYSTEM_OR_MEMORY OR_BACKUP, "32", 0},
-    {"cfg_delete_s", "a subtree", bound_to_delete_subtrees, delete_subtree, tell_code, SYSTEM_OR_MEMORY OR_BACKUP, "32", 0},
-    {"cfg_delete_s", "an entry with others below", bound, delete_subtree, tell_code, SYSTEM_OR_MEMORY OR_BACKUP, NULL, 0},
-    {"cfg_flush_s", "the file", bound, flush, tell_code, SYSTEM_OR_MEMORY OR_BACKUP, NULL, 0},
-    {"cfg_flush_s", "uncanonical lines", with_uncanonical_lines, flush, tell_code, SYSTEM_OR_MEMORY OR_BACKUP, NULL, 0},
-    {"cfg_err2string", "a code", refused, err2string, tell_seen_text, NULL, NULL, 0},
-    {"cfg_get_errno", "a refusal", refused, get_errno, tell_number, NULL, NULL, 0},
-    {"cfg_get_exterror", "a refusal", refused, get_exterror, tell_number, NULL, NULL, 0},
-    {"cfg_perror", "a refusal", refused, call_perror, tell_number, NULL, NULL, 0},
-    {"cfg_dump_exception", "a refusal", refused, dump_exception, tell_seen_text, "null", NULL, 0},
-    {"cfg_get_file_name", "a refusal", refused, get_file_name, tell_seen_text, NULL, NULL, 0},
-    {"cfg_get_file_name", "the default file", unnamed, get_file_name, tell_seen_text, "null", NULL, 0},
-    {"cfg_get_file_line", "a refusal", refused, get_file_line, tell_number, NULL, NULL, 0},
-    {"cfg_get_entry", "a refusal", refused, get_entry, tell_seen_text, NULL, NULL, 0},
-    {"cfg_get_attribute", "a refusal", refused, get_attribute, tell_seen_text, NULL, NULL, 0},
-    {"cfg_get_value", "a refusal", refused, get_value, tell_seen_text, NULL, NULL, 0},
-    {"cfg_get_enum", "a refusal", refused, get_enum, tell_seen_list, NULL, NULL, 0},
-    {"cfg_get_bitmask", "a refusal", refused, get_bitmask, tell_number, NULL, NULL, 0},
-    {"cfg_get_minimum", "a refusal", refused, get_minimum, tell_number, NULL, NULL, 0},
-    {"cfg_get_maximum", "a refusal", refused, get_maximum, tell_number, NULL, NULL, 0},
-    {"cfg_get_is_single", "a refusal", refused, get_is_single, tell_number, NULL, NULL, 0},
-    {"cfg_tree_view", "ASCII", bound, draw_ascii, tell_seen_text, "null", NULL, 0},
-    {"cfg_tree_view", "lines", bound, draw_cp437, tell_seen_text, "null", NULL, 0},
-    {NULL, NULL, NULL, NULL, NULL, NULL, NULL, 0},
+    {"cfg_init", "a process in the C locale", nothing, init, tell_handle, "1 0", "null", NULL, loses_a_block},
+    BIND("the default file", unnamed, bind_administrator_of_example, "0", SYSTEM_OR_MEMORY OR_DECODING, 0),
+    BIND("another method", created, bind_by_unknown_method, "86", SYSTEM_OR_MEMORY, 0),
+    BIND("unusable lines", with_unusable_lines, bind_administrator_of_example, "0", SYSTEM_OR_MEMORY OR_DECODING OR_BACKUP, repairs_first),
+    BIND("a malformed DN", with_a_malformed_dn, bind_administrator_of_example, "34", SYSTEM_OR_MEMORY, 0),
+    BIND("a bound handle", refused_and_told, bind_administrator_of_example, "0", SYSTEM_OR_MEMORY OR_DECODING, 0),
+    NEVER_FAILS("cfg_unbind", "a failed handle", refused_and_told, unbind, tell_number, "0"),
+    NEVER_FAILS("cfg_reset", "a failed handle", refused_and_told, reset, tell_code, "0"),
+    GIVES("cfg_get_option", "a name", created, get_name_option, tell_text, "the file", "null 0"),
+    NEVER_FAILS("cfg_get_option", "a flag", created, get_flag_option, tell_number, "1"),
+    GIVES("cfg_set_option", "a name", created, set_name_option, tell_name_option, "0 /a/name/that/does/not/fit/into/a/short/text", "90 the file"),
+    NEVER_FAILS("cfg_set_option", "a flag", created, set_flag_option, tell_number, "0"),
+    SEARCH("all names", bound, search_all_names, "0, 75 found", SYSTEM_OR_MEMORY),
+    SEARCH("a subtree", bound, search_subtree, "0, 7 found", SYSTEM_OR_MEMORY),
+    SEARCH("a subtree, read before", read_before, search_subtree, "0, 7 found", SYSTEM_OR_MEMORY),
+    SEARCH("uncanonical lines", with_uncanonical_lines, search_extra, "0, 1 found", SYSTEM_OR_MEMORY),
+    SEARCH("a changed file", changed_meanwhile, search_extra, "0, 1 found", SYSTEM_OR_MEMORY OR_DECODING),
+    SEARCH("one level", bound, search_one_level, "0, 5 found", SYSTEM_OR_MEMORY),
+    SEARCH("a number", bound, search_number, "0, 1 found", SYSTEM_OR_MEMORY),
+    SEARCH("a number, uncanonical", with_uncanonical_lines, search_number, "0, 2 found", SYSTEM_OR_MEMORY),
+    SEARCH("a DN", bound, search_dn, "0, 1 found", SYSTEM_OR_MEMORY),
+    SEARCH("passwords", bound, search_passwords, "0, 2 found", SYSTEM_OR_MEMORY OR_DECODING),
+    SEARCH("a refused value", bound, search_refused_value, "21", SYSTEM_OR_MEMORY),
+    SEARCH("a missing base", bound, search_missing_base, "32", SYSTEM_OR_MEMORY),
+    NEVER_FAILS("cfg_first_entry", "a result", searched, first_entry, tell_number, "1"),
+    NEVER_FAILS("cfg_next_entry", "a result", searched, next_entry, tell_number, "1"),
+    NEVER_FAILS("cfg_count_entries", "a result", searched, count_entries, tell_number, "75"),
+    NEVER_FAILS("cfg_count_attributes", "a result", searched, count_attributes, tell_number, "14"),
+    GIVES("cfg_first_attribute", "a result", searched, first_attribute, tell_first_attribute, "cn", "null 90"),
+    {"cfg_next_attribute", "a result", walked, next_attribute, tell_text, "nuv-instanceDesc", "null 90", "nuv-instanceLocation", 0},
+    GIVES("cfg_get_values", "a result", searched, get_values, tell_values, "top", "null 90"),
+    NEVER_FAILS("cfg_count_values", "values", given_values, count_values, tell_number, "2"),
+    NEVER_FAILS("cfg_value_free", "values", given_values, value_free, tell_number, "0"),
+    GIVES("cfg_get_dn", "a result", searched, get_dn, tell_text, CONFIGURATION, "null 90"),
+    NEVER_FAILS("cfg_msgfree", "a result", searched, msgfree, tell_number, "0"),
+    NEVER_FAILS("cfg_ber_free", "a cursor", walked, free_cursor, tell_number, "0"),
+    NEVER_FAILS("cfg_memfree", "a DN", given_text, memfree, tell_number, "0"),
+    CHANGE("cfg_modify_s", "a number", bound, modify_number, "0", NULL),
+    GIVES("cfg_modify_s", "a number, no backup", bound_without_backup, modify_number, tell_code, "0", SYSTEM_OR_MEMORY),
+    CHANGE("cfg_modify_s", "a password", bound, modify_password, "0", NULL),
+    CHANGE("cfg_modify_s", "one more value", bound, modify_by_adding, "0", NULL),
+    CHANGE("cfg_modify_s", "one value less", bound, modify_by_deleting, "0", NULL),
+    CHANGE("cfg_modify_s", "no entry", bound, modify_missing_entry, "32", NULL),
+    CHANGE("cfg_add_s", "an entry", bound, add_entry, "0", NULL),
+    CHANGE("cfg_delete_s", "a leaf", bound, delete_leaf, "0", "32"),
+    CHANGE("cfg_delete_s", "a subtree", bound_to_delete_subtrees, delete_subtree, "0", "32"),
+    CHANGE("cfg_delete_s", "an entry with others below", bound, delete_subtree, "66", NULL),
+    CHANGE("cfg_flush_s", "the file", bound, flush, "0", NULL),
+    CHANGE("cfg_flush_s", "uncanonical lines", with_uncanonical_lines, flush, "0", NULL),
+    NEVER_FAILS("cfg_err2string", "a code", refused, err2string, tell_seen_text, "Integer value is not within allowable range."),
+    NEVER_FAILS("cfg_get_errno", "a refusal", refused, get_errno, tell_number, "21"),
+    NEVER_FAILS("cfg_get_exterror", "a refusal", refused, get_exterror, tell_number, "1015"),
+    NEVER_FAILS("cfg_perror", "a refusal", refused, call_perror, tell_number, "0"),
+    GIVES("cfg_dump_exception", "a refusal", refused, dump_exception, tell_seen_text, "value: 70000", "null"),
+    NEVER_FAILS("cfg_get_file_name", "a refusal", refused, get_file_name, tell_seen_text, "the file"),
+    GIVES("cfg_get_file_name", "the default file", unnamed, get_file_name, tell_seen_text, "the file", "null"),
+    NEVER_FAILS("cfg_get_file_line", "a refused number", refused, get_file_line, tell_number, "0"),
+    NEVER_FAILS("cfg_get_file_line", "a refused line", refused_line, get_file_line, tell_number, "3"),
+    NEVER_FAILS("cfg_get_entry", "a refusal", refused, get_entry, tell_seen_text, LISTENER),
+    NEVER_FAILS("cfg_get_attribute", "a refusal", refused, get_attribute, tell_seen_text, "oru-slapdPort"),
+    NEVER_FAILS("cfg_get_value", "a refusal", refused, get_value, tell_seen_text, "70000"),
+    NEVER_FAILS("cfg_get_enum", "a refused number", refused, get_enum, tell_seen_list, ""),
+    NEVER_FAILS("cfg_get_enum", "a refused word", refused_word, get_enum, tell_seen_list, "l m h"),
+    NEVER_FAILS("cfg_get_bitmask", "a refused number", refused, get_bitmask, tell_number, "0"),
+    NEVER_FAILS("cfg_get_bitmask", "a refused mask", refused_mask, get_bitmask, tell_number, "65280"),
+    NEVER_FAILS("cfg_get_minimum", "a refused number", refused, get_minimum, tell_number, "1"),
+    NEVER_FAILS("cfg_get_maximum", "a refused number", refused, get_maximum, tell_number, "65535"),
+    NEVER_FAILS("cfg_get_is_single", "a refused number", refused, get_is_single, tell_number, "1"),
+    GIVES("cfg_tree_view", "ASCII", bound, draw_ascii, tell_seen_text, "- " CONFIGURATION " (suffix)", "null"),
+    GIVES("cfg_tree_view", "lines", bound, draw_cp437, tell_seen_text, "\xC4 " CONFIGURATION " (suffix)", "null"),
+    {NULL, NULL, NULL, NULL, NULL, NULL, NULL, NULL, 0},
 };
 /* clang-format on */

@@ -37,6 +37,7 @@ struct row {
     void (*prepare)(struct scene *s); /**< with a fresh handle, and the example as the file */
     void (*make)(struct scene *s);    /**< the call, and nothing else that allocates */
     void (*tell)(struct scene *s, FILE *out); /**< prints the answer, and frees it */
+    const char *answer;                       /**< a line of it, when nothing fails */
     const char *failures;    /**< what it answers without memory, separated by "|"; null: never */
     const char *done_before; /**< what it answers when its change was made in memory already */
     unsigned besides;        /**< of the flags below */

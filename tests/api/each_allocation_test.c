@@ -123,6 +123,19 @@ static char *answer_of(struct scene *s, const struct row *row) {
     return text;
 }
 
+static int has_line(const char *text, const char *line) {
+    const size_t length = strcspn(text, "\n");
+    return (strlen(line) == length && strncmp(text, line, length) == 0) ||
+           (text[length] != '\0' && has_line(text + length + 1, line));
+}
+
+/* It is the answer that the row is there for, and not a refusal that nobody thought of. */
+static void assert_answer(const struct row *row, const char *answer) {
+    if (!has_line(answer, row->answer)) {
+        fail_msg("%s, %s: without the line \"%s\":\n%s", row->call, row->of, row->answer, answer);
+    }
+}
+
 /* The answer, and what is left, when nothing fails. */
 static struct expectation expect(struct scene *s, const struct row *row) {
     struct expectation expected;
@@ -130,6 +143,7 @@ static struct expectation expect(struct scene *s, const struct row *row) {
     expected.before = text_of(s->f->config);
     row->make(s);
     expected.answer = answer_of(s, row);
+    assert_answer(row, expected.answer);
     expected.after = text_of(s->f->config);
     expected.is_backed_up = file_exists(s->backup);
     end(s);

@@ -11,8 +11,8 @@ namespace cfg32::tests {
 
 namespace {
 
-/// So many parts are few.
-constexpr size_t few = 8;  // operations
+/// Of so many operations every part is tried.
+constexpr size_t few = 8;
 
 ino_t number_of(const std::string& path) {
     struct stat status {};
@@ -203,10 +203,7 @@ recorded_disk::image recorded_disk::image_of(const state& what) {
 recorded_disk::image recorded_disk::image_of(state durable, const std::vector<operation>& open,
                                              const std::vector<bool>& is_done) {
     for (size_t i = 0; i < open.size(); ++i) {
-        // The last sector stands before the size.
-        const bool is_too_early = open[i].kind == operation::grow && i > 0 &&
-                                  open[i - 1].kind == operation::write && !is_done[i - 1];
-        if (is_done[i] && !is_too_early) {
+        if (is_done[i]) {
             apply(open[i], durable);
         }
     }

@@ -12,7 +12,15 @@
 #include "faulty_calls.h"
 
 // What a power cut leaves of a folder. What was done to it is recorded call by call; what was
-// synced by then is on the disk, and of everything else any part, in any order.
+// synced by then is on the disk, and of everything else any part, in any order: all of them when
+// there are up to eight operations, and a sample when there are more.
+//
+// A size may be on the disk before what was written up to it: there are zero bytes then, as on file
+// systems that keep a journal of sizes only. What was in the blocks before is never seen.
+//
+// A sync that fails is recorded like none: nothing that it was to bring to the disk is known to be
+// there, and a later one that succeeds brings it. (A system may also give up what it could not
+// write, and let the later one succeed without it; that is not modelled.)
 
 namespace cfg32::tests {
 
@@ -58,8 +66,7 @@ class recorded_disk {
         std::map<file_number, content> files;
     };
 
-    /// What is on the disk whole or not at all. A size comes to the disk no sooner than the last
-    /// sector that it lets be seen.
+    /// What is on the disk whole or not at all.
     struct operation {
         enum { write, cut, grow, name, sync } kind;
         std::optional<file_number> file;  // nothing for the folder

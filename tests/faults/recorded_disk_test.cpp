@@ -90,17 +90,21 @@ TEST_F(recorded, OnlyWhatIsSyncedLasts) {
     EXPECT_EQ(disk.lasting(), (image{{"file", "new"}}));
 }
 
-TEST_F(recorded, AWriteIsThereInPartBySectorsAndItsSizeNotBeforeItsEnd) {
+TEST_F(recorded, AWriteIsThereInPartBySectorsWithZerosWhereItsSizeIsAndItIsNot) {
     const std::string a(sector, 'a');
     const std::string b(sector, 'b');
     folder.write("file", a + a);
     const std::string hole(sector, '\0');
-    EXPECT_THAT(texts_of([&](int file) { write_at(file, b + b + b, 0); }),
-                UnorderedElementsAre(a + a, a + b, b + a, b + b, a + a + b, a + b + b, b + a + b,
-                                     b + b + b));
+    EXPECT_THAT(
+        texts_of([&](int file) { write_at(file, b + b + b, 0); }),
+        UnorderedElementsAre(a + a, a + b, b + a, b + b, a + a + b, a + b + b, b + a + b, b + b + b,
+                             a + a + hole, a + b + hole, b + a + hole, b + b + hole));
     folder.write("file", a);
     EXPECT_THAT(texts_of([&](int file) { write_at(file, b + b, sector); }),
-                UnorderedElementsAre(a, a + hole + b, a + b + b));
+                UnorderedElementsAre(a, a + hole + hole, a + b + hole, a + hole + b, a + b + b));
+    folder.write("file", "a");
+    EXPECT_THAT(texts_of([&](int file) { write_at(file, "b", 1); }),
+                UnorderedElementsAre("a", std::string("a\0", 2), "ab"));
 }
 
 TEST_F(recorded, LaterWritesAreThereWithoutEarlierOnes) {
@@ -126,11 +130,15 @@ TEST_F(recorded, ANameMayBeThereBeforeWhatItNames) {
         EXPECT_EQ(fsync(at.get()), 0);
         EXPECT_TRUE(file.close());
     };
-    EXPECT_THAT(images_of([&] { replace(false); }), Contains(image{{"file", ""}}));
+    const std::string zeros(3, '\0');
+    const auto images = images_of([&] { replace(false); });
+    EXPECT_THAT(images, Contains(image{{"file", ""}}));
+    EXPECT_THAT(images, Contains(image{{"file", zeros}}));
     folder.write("file", "old");
     EXPECT_THAT(images_of([&] { replace(true); }),
                 UnorderedElementsAre(image{{"file", "old"}}, image{{"file", "new"}},
                                      image{{"file", "old"}, {"temporary", ""}},
+                                     image{{"file", "old"}, {"temporary", zeros}},
                                      image{{"file", "old"}, {"temporary", "new"}}));
 }
 

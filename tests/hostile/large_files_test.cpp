@@ -1,6 +1,6 @@
-// Large configurations are loaded, searched, drawn, changed and written, on a small stack, with
-// memory and work that grow with the file and no faster. CFG32_HOSTILE_SCALE=100 makes them as
-// large as in large_file.cpp, and tells what each took.
+// Large configurations are loaded, searched, drawn, changed and written: on a small stack, with
+// memory that grows with the file and no faster, at its most and of all that is asked for together.
+// CFG32_HOSTILE_SCALE=100 makes them as large as in large_file.cpp, and tells what each took.
 
 #include <gtest/gtest.h>
 #include <sys/resource.h>
@@ -215,8 +215,9 @@ TEST_P(large, FileIsUsedOnASmallStackInMemoryThatGrowsWithIt) {
     }
 }
 
-// Memory that is asked for is memory that is filled: what is done anew for each of many lines shows
-// in it. A vector that grows by doubling takes up to twice as much at one size as at another.
+// Memory that is asked for is memory that is filled: what is made anew for each of many lines shows
+// in it. (What only looks at them again and again does not.) A vector that grows by doubling takes
+// up to twice as much at one size as at another.
 TEST_P(large, FileFourTimesAsLargeAsksForNoMoreThanItsShareOfMemory) {
     double share[2] = {};
     for (const size_t factor : {1, 4}) {

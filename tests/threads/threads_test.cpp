@@ -2,10 +2,15 @@
 // is the library. The thread sanitizer sees what they would do to each other.
 
 #include <gtest/gtest.h>
+#include <sys/wait.h>
+#include <unistd.h>
 
 #include <array>
 #include <barrier>
+#include <cstdio>
+#include <cstdlib>
 #include <cstring>
+#include <filesystem>
 #include <memory>
 #include <string>
 #include <thread>
@@ -185,31 +190,73 @@ void own_session::expect_failure(int code) const {
     EXPECT_TRUE(report && *report);
 }
 
-/// Calls body(session) in all threads at once, each with a session of its own.
+/// Runs the body in a process of its own, and fails if that fails.
+template <class Body>
+void in_new_process(Body body) {
+    fflush(nullptr);
+    const pid_t child = fork();
+    ASSERT_GE(child, 0);
+    if (child == 0) {
+        body();
+        exit(testing::Test::HasFailure() ? EXIT_FAILURE : EXIT_SUCCESS);
+    }
+    int status = 0;
+    EXPECT_EQ(waitpid(child, &status, 0), child);
+    EXPECT_EQ(status, 0);
+}
+
+/// Calls body(session) in all threads at once, each with a session of its own. No test is in the
+/// library but here, so that what is made once in a process is made anew by these threads.
 template <class Body>
 void in_all_threads(Body body) {
-    const shared_key key;
-    std::vector<std::unique_ptr<own_session>> sessions;
-    for (size_t i = 0; i < thread_count; ++i) {
-        sessions.push_back(std::make_unique<own_session>(key));
-    }
-    std::barrier together(thread_count);
-    std::vector<std::thread> threads;
-    for (const auto& own : sessions) {
-        threads.emplace_back([&] {
-            together.arrive_and_wait();
-            body(*own);
-        });
-    }
-    for (std::thread& thread : threads) {
-        thread.join();
-    }
+    in_new_process([&] {
+        const shared_key key;
+        std::vector<std::unique_ptr<own_session>> sessions;
+        for (size_t i = 0; i < thread_count; ++i) {
+            sessions.push_back(std::make_unique<own_session>(key));
+        }
+        std::barrier together(thread_count);
+        std::vector<std::thread> threads;
+        for (const auto& own : sessions) {
+            threads.emplace_back([&] {
+                together.arrive_and_wait();
+                body(*own);
+            });
+        }
+        for (std::thread& thread : threads) {
+            thread.join();
+        }
+    });
 }
+
+/// An installation whose configuration is the one that handles without a file name have.
+class default_installation {
+  public:
+    default_installation() {
+        std::filesystem::create_directory(folder_.file("etc"));
+        folder_.write("etc/oruslapd.conf", "dn: cn=Configuration\ncn: Configuration\n");
+        setenv("NUV_INSTALL_PATH", folder_.file("").c_str(), 1);
+    }
+    default_installation(const default_installation&) = delete;
+    default_installation& operator=(const default_installation&) = delete;
+    ~default_installation() { unsetenv("NUV_INSTALL_PATH"); }
+
+  private:
+    const temporary_folder folder_;
+};
 
 }  // namespace
 
-// Every test is run by a process of its own, in which nothing was looked up before.
+// A file that is named is checked, for which one thread looks up the type of such names while the
+// others wait. So no file is named.
 TEST(threads, MakeTheFirstLookUpTogether) {
+    const default_installation installation;
+    in_all_threads([](const own_session& own) {
+        EXPECT_EQ(cfg_bind_s(own.handle(), nullptr, nullptr, CFG_AUTH_SIMPLE), CFG_SUCCESS);
+    });
+}
+
+TEST(threads, NameTheirFilesTogether) {
     in_all_threads([](const own_session& own) { own.name_the_files(); });
 }
 
