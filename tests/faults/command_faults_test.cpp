@@ -253,5 +253,14 @@ TEST_P(command_faults, OfThePowerLeaveACompleteVersionAndWhatIsDoneLasts) {
     EXPECT_EQ(run.status, 0) << run.output << run.told;
 }
 
+// Else the file would take the place of a link that there may be.
+TEST(restore_of_a_missing_file, EndsWhenItCanNotBeToldWhetherItsNameIsALink) {
+    const command_row& row = command_row_of("restore_of_a_missing_file");
+    const command_run run = run_command(row, {{0, effect::fails, EIO, "lstat"}});
+    EXPECT_GT(run.status, 0);
+    EXPECT_THAT(run.told, HasSubstr("oruslapd.conf: Input/output error"));
+    EXPECT_EQ(run.after, comparable(row.before));
+}
+
 INSTANTIATE_TEST_SUITE_P(of, command_faults, testing::ValuesIn(command_rows()),
                          [](const auto& info) { return std::string(info.param.name); });
