@@ -26,9 +26,13 @@ namespace {
 const std::string config = "oruslapd.conf";
 
 /// What a failure is about, if not a file.
-const char* const other_subjects[] = {
-    "a private copy in memory", "no password was given", "the editor failed",
-    "oru-slapdDbUserPW: ",      "/tmp/cfg32-",           "TMPDIR"};
+const char* const other_subjects[] = {"a private copy in memory",
+                                      "no password was given",
+                                      "the editor failed",
+                                      "oru-slapdDbUserPW: ",
+                                      "/tmp/cfg32-",
+                                      "TMPDIR",
+                                      "standard input"};
 
 std::string text_in(const folder_image& image, const std::string& name) {
     const auto found = image.find(name);
@@ -61,38 +65,52 @@ struct command_faults : testing::TestWithParam<command_row> {
         ASSERT_GT(good.calls.size(), 5u);
     }
 
-    /// All of them, or as many by chance as an ordinary run has time for.
-    std::vector<fault> chosen(std::vector<fault> all) {
+    /// What is certain, and of the others as many by chance as an ordinary run has time for. With
+    /// the sanitizers chance chooses of all: each run takes several times as long.
+    std::vector<fault> chosen(std::vector<fault> certain, std::vector<fault> others) {
+        if (is_sanitized()) {
+            others.insert(others.end(), certain.begin(), certain.end());
+            certain.clear();
+        }
         const unsigned long most =
             number_from_environment("CFG32_FAULTS_COMMAND", is_sanitized() ? 10 : 20);
-        std::shuffle(all.begin(), all.end(), random);
-        all.resize(std::min<size_t>(all.size(), most));
-        return all;
+        std::shuffle(others.begin(), others.end(), random);
+        others.resize(std::min<size_t>(others.size(), most));
+        certain.insert(certain.end(), others.begin(), others.end());
+        return certain;
     }
 
+    /// Every call fails, and every transfer is short; which error comes for certain is drawn. After
+    /// EINTR most calls are made again.
     std::vector<fault> failures() {
-        std::vector<fault> all;
+        constexpr int errors[] = {EIO, ENOSPC, EACCES, EMFILE};
+        std::vector<fault> certain;
+        std::vector<fault> others;
         for (size_t nth = 1; nth <= good.calls.size(); ++nth) {
-            for (const int error : {EIO, ENOSPC, EACCES, EMFILE, EINTR}) {
-                all.push_back({nth, effect::fails, error});
+            const int drawn = errors[random() % std::size(errors)];
+            for (const int error : errors) {
+                (error == drawn ? certain : others).push_back({nth, effect::fails, error});
             }
+            others.push_back({nth, effect::fails, EINTR});
             if (good.calls[nth - 1].is_transfer) {
-                all.push_back({nth, effect::is_short});
+                certain.push_back({nth, effect::is_short});
             }
         }
-        return chosen(all);
+        return chosen(certain, others);
     }
 
+    /// At every call. After one is much the same as before the next.
     std::vector<fault> deaths() {
-        std::vector<fault> all;
+        std::vector<fault> certain;
+        std::vector<fault> others;
         for (size_t nth = 1; nth <= good.calls.size(); ++nth) {
-            all.push_back({nth, effect::kills_before});
-            all.push_back({nth, effect::kills_after});
+            certain.push_back({nth, effect::kills_before});
+            others.push_back({nth, effect::kills_after});
             if (good.calls[nth - 1].is_transfer) {
-                all.push_back({nth, effect::kills_halfway});
+                certain.push_back({nth, effect::kills_halfway});
             }
         }
-        return chosen(all);
+        return chosen(certain, others);
     }
 
     /// Every file is what it was or what it becomes, and the configuration becomes something else
@@ -185,6 +203,20 @@ TEST_P(command_faults, OfOneCallAreToldAndLeaveCompleteFilesAndNothingElse) {
     EXPECT_GT(refused, 0u);
 }
 
+TEST_P(command_faults, OfStandardOutputAreToldAndLeaveCompleteFilesAndNothingElse) {
+    const command_run run = run_without_output(row);
+    expect_complete(run.after);
+    EXPECT_THAT(temporary_files(run.after), IsEmpty());
+    if (good.output.empty()) {
+        EXPECT_EQ(run.status, 0) << run.told;
+        EXPECT_EQ(run.after, good.after);
+    } else {
+        EXPECT_GT(run.status, 0);
+        EXPECT_THAT(run.told, AnyOf(HasSubstr("standard output can't be written"),
+                                    HasSubstr("can't be shown")));
+    }
+}
+
 TEST_P(command_faults, ThatKillItLeaveACompleteVersion) {
     const std::vector<fault> faults = deaths();
     for (const fault& planned : faults) {
@@ -219,6 +251,15 @@ TEST_P(command_faults, OfThePowerLeaveACompleteVersionAndWhatIsDoneLasts) {
     });
     std::cout << run.output.substr(run.output.rfind('\n', run.output.size() - 2) + 1);
     EXPECT_EQ(run.status, 0) << run.output << run.told;
+}
+
+// Else the file would take the place of a link that there may be.
+TEST(restore_of_a_missing_file, EndsWhenItCanNotBeToldWhetherItsNameIsALink) {
+    const command_row& row = command_row_of("restore_of_a_missing_file");
+    const command_run run = run_command(row, {{0, effect::fails, EIO, "lstat"}});
+    EXPECT_GT(run.status, 0);
+    EXPECT_THAT(run.told, HasSubstr("oruslapd.conf: Input/output error"));
+    EXPECT_EQ(run.after, comparable(row.before));
 }
 
 INSTANTIATE_TEST_SUITE_P(of, command_faults, testing::ValuesIn(command_rows()),

@@ -5,6 +5,7 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <cstdio>
 #include <cstdlib>
 #include <filesystem>
@@ -166,9 +167,16 @@ const std::vector<command_row>& command_rows() {
             return two;
         };
         const std::string backup = configuration("2389");
+        // Longer than what is read at once or not at all.
+        const std::string changes = "# " + std::string(600, '-') + "\ndn: " + listener +
+                                    "\nchangetype: modify\nreplace: oru-slapdPort\n"
+                                    "oru-slapdPort: 389\n-\n";
         const std::string torn = unfinished_head + before.substr(unfinished_head.size(), 3000);
         return std::vector<command_row>{
             {"set", {"set", listener, "oru-slapdPort", "389"}, alone},
+            {"set_by_the_administrator",
+             {"-D", "cn=root", "-y", "typed", "set", listener, "oru-slapdPort", "389"},
+             with("typed", "correct horse\n")},
             {"unset", {"unset", listener, "oru-slapdPort"}, alone},
             {"passwd",
              {"passwd", "cn=Spare, cn=Configuration", "oru-slapdDbUserPW"},
@@ -177,11 +185,8 @@ const std::vector<command_row>& command_rows() {
             {"add",
              {"add", "-l", "new.ldif"},
              with("new.ldif", "dn: cn=New, cn=Configuration\ncn: New\nobjectclass: top\n")},
-            {"modify",
-             {"modify", "-l", "changes.ldif"},
-             with("changes.ldif", "dn: " + listener +
-                                      "\nchangetype: modify\nreplace: oru-slapdPort\n"
-                                      "oru-slapdPort: 389\n-\n")},
+            {"modify", {"modify", "-l", "changes.ldif"}, with("changes.ldif", changes)},
+            {"modify_from_standard_input", {"modify"}, alone, changes},
             {"delete", {"delete", "cn=Spare, cn=Configuration"}, alone},
             {"apply", {"apply", "wanted.conf"}, with("wanted.conf", backup)},
             {"edit", {"edit"}, alone},
@@ -198,6 +203,12 @@ const std::vector<command_row>& command_rows() {
     return all;
 }
 
+const command_row& command_row_of(const std::string& name) {
+    const auto& all = command_rows();
+    return *std::find_if(all.begin(), all.end(),
+                         [&](const command_row& row) { return row.name == name; });
+}
+
 std::string command_run::described() const {
     return "ended with " + std::to_string(status) + ", signal " + std::to_string(signal) +
            ", and told:\n" + told + listed(calls);
@@ -206,6 +217,13 @@ std::string command_run::described() const {
 command_run run_command(const command_row& row, const std::vector<fault>& faults) {
     return run_apart(row, [&](const place& at, const std::vector<std::string>& words) {
         return carry_out(words, faults, at.trace);
+    });
+}
+
+command_run run_without_output(const command_row& row) {
+    return run_apart(row, [&](const place& at, const std::vector<std::string>& words) {
+        redirect("/dev/full", O_WRONLY, STDOUT_FILENO);
+        return carry_out(words, {}, at.trace);
     });
 }
 

@@ -29,6 +29,8 @@ inline void PrintTo(const command_row& one, std::ostream* out) { *out << one.nam
 /// Every command that writes, some of them in more than one situation.
 const std::vector<command_row>& command_rows();
 
+const command_row& command_row_of(const std::string& name);
+
 inline const std::string unfinished_head =
     "# This file is being written. If it stays so, its backup is the complete version.\n";
 
@@ -45,6 +47,9 @@ struct command_run {
 };
 
 command_run run_command(const command_row& row, const std::vector<fault>& faults);
+
+/// Its standard output can't be written.
+command_run run_without_output(const command_row& row);
 
 /// Has what happens to the disk recorded, and then judged, in the process of the command. The exit
 /// status of a run that was judged badly is bad_run, and the reason is in what it printed.

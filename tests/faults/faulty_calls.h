@@ -64,4 +64,7 @@ std::string listed(const std::vector<seen_call>& calls);
 /// The names by which the libraries take them.
 const std::vector<std::string>& wrapped_names();
 
+/// The others by which the command does, in the tests that it is part of.
+const std::vector<std::string>& names_wrapped_for_the_command();
+
 }  // namespace cfg32::tests

@@ -5,14 +5,11 @@
 #include <dlfcn.h>
 #include <gmock/gmock.h>
 
-#include <algorithm>
-#include <cstdio>
-#include <memory>
 #include <set>
-#include <sstream>
 
 #include "cfg32.h"
 #include "session.h"
+#include "taken_names.h"
 
 using namespace cfg32::tests;
 using testing::ElementsAre;
@@ -20,105 +17,7 @@ using testing::IsEmpty;
 
 namespace {
 
-/// What the libraries take from elsewhere and what can't lose a file, by the reason.
-const std::set<std::string> harmless = {
-    // the compiler's and the linker's
-    "_ITM_deregisterTMCloneTable",
-    "_ITM_registerTMCloneTable",
-    "__ctype_get_mb_cur_max",
-    "__cxa_atexit",
-    "__cxa_finalize",
-    "__errno_location",
-    "__gmon_start__",
-    "__gxx_personality_v0",
-    "__stack_chk_fail",
-    "__tls_get_addr",
-    "_Unwind_Resume",
-    // memory
-    "calloc",
-    "explicit_bzero",
-    "free",
-    "malloc",
-    "memchr",
-    "memcmp",
-    "memcpy",
-    "memmove",
-    "memset",
-    "wmemchr",
-    "wmemcpy",
-    "wmemmove",
-    "wmemset",
-    // text
-    "__ctype_tolower_loc",
-    "iswspace",
-    "mbrtowc",
-    "mbstowcs",
-    "snprintf",
-    "strcasecmp",
-    "strcmp",
-    "strcspn",
-    "strdup",
-    "strerror",
-    "strlen",
-    "strncasecmp",
-    "strnlen",
-    "strrchr",
-    "strtol",
-    "vsnprintf",
-    "wcslen",
-    "wcstombs",
-    // the process: cfg_init() reads the C library's own files of the locale, nothing else
-    "pthread_mutex_lock",
-    "pthread_mutex_unlock",
-    "secure_getenv",
-    "setlocale",
-};
-
-/// Families of such names: exceptions, the sanitizers, ciphers and compression in memory.
-const char* const harmless_families[] = {"__cxa_",  "__asan_",      "__ubsan_",
-                                         "__tsan_", "__sanitizer_", "__sancov_",
-                                         "nettle_", "deflate",      "inflate"};
-
-/// The standard library is harmless save for what opens files; the description of a type does not.
-const char* const parts_with_files[] = {"fstream", "filebuf", "filesystem", "random_device"};
-
-bool is_harmless(const std::string& name) {
-    if (name.starts_with("_ZTI")) {
-        return true;
-    }
-    if (name.starts_with("_Z")) {
-        return std::none_of(std::begin(parts_with_files), std::end(parts_with_files),
-                            [&](const char* part) { return name.find(part) != std::string::npos; });
-    }
-    // A function that looks at the size of what it writes to has a name made of its own.
-    const std::string_view checked = "_chk";
-    if (name.starts_with("__") && name.ends_with(checked)) {
-        return is_harmless(name.substr(2, name.size() - 2 - checked.size()));
-    }
-    return harmless.count(name) != 0 ||
-           std::any_of(std::begin(harmless_families), std::end(harmless_families),
-                       [&](const char* family) { return name.starts_with(family); });
-}
-
-/// The undefined names of a library, save those that one of the two gives the other.
-std::set<std::string> taken_names(const std::string& library) {
-    const std::string command = NM " -D --undefined-only '" + library + "'";
-    const std::unique_ptr<FILE, int (*)(FILE*)> output(popen(command.c_str(), "r"), pclose);
-    std::set<std::string> names;
-    char line[4096];
-    while (output && fgets(line, sizeof line, output.get())) {
-        std::istringstream words(line);
-        std::string type;
-        std::string name;
-        words >> type >> name;
-        if (name.find("@CFG32") == std::string::npos) {
-            names.insert(name.substr(0, name.find('@')));
-        }
-    }
-    return names;
-}
-
-std::set<std::string> taken_names() {
+std::set<std::string> names_taken_by_the_libraries() {
     std::set<std::string> names = taken_names(CFG32_LIBRARY);
     names.merge(taken_names(CFG32_PLATFORM_LIBRARY));
     return names;
@@ -132,12 +31,6 @@ std::vector<std::string> names_of(const std::vector<seen_call>& calls) {
     return names;
 }
 
-/// The program or library that something is defined in.
-std::string home_of(void* definition) {
-    Dl_info info{};
-    return definition && dladdr(definition, &info) != 0 ? info.dli_fname : "";
-}
-
 }  // namespace
 
 TEST(faulty_calls, EveryNameThatTheLibrariesTakeIsWrappedOrKnownToBeHarmless) {
@@ -145,7 +38,7 @@ TEST(faulty_calls, EveryNameThatTheLibrariesTakeIsWrappedOrKnownToBeHarmless) {
     GTEST_SKIP() << "what counts the lines that run takes names of its own";
 #endif
     const std::set<std::string> wrapped(wrapped_names().begin(), wrapped_names().end());
-    const std::set<std::string> taken = taken_names();
+    const std::set<std::string> taken = names_taken_by_the_libraries();
     ASSERT_EQ(taken.count("pwrite"), 1u) << "the names of the library could not be listed";
     ASSERT_EQ(taken.count("copy_file_range"), 1u) << "those of the other could not be listed";
     for (const std::string& name : taken) {
@@ -154,7 +47,7 @@ TEST(faulty_calls, EveryNameThatTheLibrariesTakeIsWrappedOrKnownToBeHarmless) {
 }
 
 TEST(faulty_calls, EveryWrappedNameIsTakenByALibraryAndDefinedByThisProgram) {
-    const std::set<std::string> taken = taken_names();
+    const std::set<std::string> taken = names_taken_by_the_libraries();
     const std::string program = home_of(reinterpret_cast<void*>(&wrapped_names));
     ASSERT_NE(program, "");
     for (const std::string& name : wrapped_names()) {

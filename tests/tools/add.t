@@ -144,3 +144,9 @@ No file, a folder, and nothing at all:
     [3]
     $ cfg32 -f conf add < /dev/null
     unchanged
+
+A pipe is read to its end, however the text comes:
+
+    $ cfg32 -f conf add -n -l <(printf 'dn: cn=P, cn=Configuration\n'; sleep 0.1; echo 'cn: P') | grep '^+[a-z]'
+    +dn: cn=P, cn=Configuration
+    +cn: P

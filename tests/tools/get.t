@@ -83,6 +83,23 @@ With a DN it binds as the administrator; whose password it is has to be right:
     cfg32: -D needs a password: add -W or -y FILE
     [2]
 
+The password is the first line, of a pipe as well, and what can't be read is told:
+
+    $ cfg32 -f oruslapd.conf --key-file oruslapd.key -D cn=root -y <(printf Correct-; sleep 0.1; printf Horse-7) get cn=Configuration cn
+    Configuration
+    $ printf 'Correct-Horse-7\nand more\n' > password
+    $ cfg32 -f oruslapd.conf --key-file oruslapd.key -D cn=root -y password get cn=Configuration cn
+    Configuration
+    $ cfg32 -f oruslapd.conf -D cn=root -y nowhere get cn=Configuration cn
+    cfg32: nowhere: No such file or directory
+    [3]
+    $ cfg32 -f oruslapd.conf -D cn=root -y . get cn=Configuration cn
+    cfg32: .: Is a directory
+    [3]
+    $ cfg32 -f oruslapd.conf -D cn=root -y /dev/zero get cn=Configuration cn
+    cfg32: /dev/zero: a password has at most 1024 bytes
+    [3]
+
 A key that others could read is not used:
 
     $ chmod 640 oruslapd.key

@@ -2,30 +2,16 @@
 
 #include "settings.h"
 
-#include <cerrno>
-#include <cstring>
-#include <fstream>
 #include <memory>
 
 #include "cfg32.h"
+#include "given_text.h"
 #include "outcome.h"
 #include "terminal.h"
 
 namespace cfg32::tool {
 
 namespace {
-
-/// The first line of a file, which one ends with or without a newline.
-secret first_line(const std::string& name) {
-    std::ifstream file(name);
-    std::string line;
-    if (!file || !(std::getline(file, line) || file.eof())) {
-        fail_for_system(name, errno);
-    }
-    secret text(line);
-    wipe(line);
-    return text;
-}
 
 /// The server's own configuration file.
 std::string default_file_name() {
@@ -52,7 +38,7 @@ secret settings::bind_password() const {
     if (password_file.empty()) {
         throw ended(usage_error, "-D needs a password: add -W or -y FILE");
     }
-    return first_line(password_file);
+    return given_password(password_file);
 }
 
 }  // namespace cfg32::tool

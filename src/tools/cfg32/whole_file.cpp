@@ -63,6 +63,10 @@ std::string target_of(const std::string& name) {
          target = read_symlink(path, no_link)) {
         path = path.parent_path() / target;
     }
+    // Not to know is no answer here either: a file would take the place of the link.
+    if (no_link != std::errc::invalid_argument && no_link != std::errc::no_such_file_or_directory) {
+        fail_for_system(path.string(), no_link.value());
+    }
     return path;
 }
 

@@ -2,41 +2,17 @@
 
 #include "change/ldif_command.h"
 
-#include <cerrno>
-#include <cstdio>
+#include <algorithm>
 #include <memory>
 
 #include "arguments.h"
 #include "change/ldif_reader.h"
+#include "given_text.h"
 #include "outcome.h"
 
 namespace cfg32::tool {
 
 namespace {
-
-std::string all_of(std::FILE* in, const std::string& name) {
-    std::string text;
-    char buffer[65536];
-    while (const size_t count = fread(buffer, 1, sizeof buffer, in)) {
-        text.append(buffer, count);
-    }
-    if (ferror(in)) {
-        fail_for_system(name, errno);
-    }
-    return text;
-}
-
-std::string read_source(const ldif_options& given, const std::string& name) {
-    if (given.file.empty()) {
-        return all_of(stdin, name);
-    }
-    const std::unique_ptr<std::FILE, int (*)(std::FILE*)> file(fopen(given.file.c_str(), "re"),
-                                                               fclose);
-    if (!file) {
-        fail_for_system(name, errno);
-    }
-    return all_of(file.get(), name);
-}
 
 /// The records of a text, and what is wrong with those that are not well-formed.
 struct ldif_records {
@@ -95,9 +71,9 @@ std::shared_ptr<ldif_options> add_ldif_options(CLI::App& parser) {
 int update_from_ldif(const settings& options, const ldif_options& given,
                      change_record::operation default_kind, bool only_default) {
     update_options how = given.how;
-    how.source = given.file.empty() ? "standard input" : given.file;
-    ldif_records records =
-        records_of(read_source(given, how.source), how.source, default_kind, only_default);
+    how.source = given.file.empty() ? standard_input : given.file;
+    const std::string text = given.file.empty() ? given_text() : given_text(given.file);
+    ldif_records records = records_of(text, how.source, default_kind, only_default);
     if (!how.goes_on) {
         require_none(records.bad);
     }
