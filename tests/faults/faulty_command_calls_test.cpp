@@ -16,6 +16,7 @@
 
 using namespace cfg32::tests;
 using testing::Contains;
+using testing::StartsWith;
 
 namespace {
 
@@ -165,11 +166,11 @@ TEST(faulty_command_calls, ThatOtherLibrariesMakeForTheCommandAreSeen) {
         {"passwd", "read(0)"},
         {"keygen", "getrandom()"},
         {"restore_of_a_missing_file", "lstat(oruslapd.conf)"},
-        {"edit", "fdopendir(3)"},
+        {"edit", "fdopendir("},
         {"edit", "unlinkat(oruslapd.conf)"},
     };
     for (const auto& row : rows) {
-        EXPECT_THAT(calls_of(row.command), Contains(row.call)) << row.command;
+        EXPECT_THAT(calls_of(row.command), Contains(StartsWith(row.call))) << row.command;
     }
 }
 
@@ -183,6 +184,6 @@ TEST(faulty_command_calls, ThatReadWhatIsGivenAreSeen) {
         {"set_by_the_administrator", "open(typed)"},
     };
     for (const auto& row : rows) {
-        EXPECT_THAT(calls_of(row.command), Contains(row.call)) << row.command;
+        EXPECT_THAT(calls_of(row.command), Contains(StartsWith(row.call))) << row.command;
     }
 }
