@@ -77,7 +77,11 @@ int checked_entries::line_of(const LDIF_Value& value) const {
 }
 
 checked_entries::checked_entry* checked_entries::find(const LDIF_DN& dn) {
-    const auto [first, last] = by_dn_.equal_range(dn.hash());
+    return find(dn, dn.hash());
+}
+
+checked_entries::checked_entry* checked_entries::find(const LDIF_DN& dn, size_t hash) {
+    const auto [first, last] = by_dn_.equal_range(hash);
     const auto same =
         std::find_if(first, last, [&](const auto& row) { return row.second->dn() == dn; });
     return same == last ? nullptr : same->second;
@@ -182,10 +186,14 @@ void checked_entries::check_ancestors(const checked_entry& entry, const LDIF_DN&
     constexpr int named = 3;
     std::string missing;
     int count = 0;
+    std::vector<size_t> hashes;  // of the ancestors from the root down, and of the DN
+    for (const LDIF_RDN& rdn : dn.rdns()) {
+        hashes.push_back(rdn.hash(hashes.empty() ? 0 : hashes.back()));
+    }
     LDIF_DN ancestor = dn;
     while (ancestor.rdns().size() > 1) {
         ancestor.remove_leaf();
-        if (find(ancestor)) {
+        if (find(ancestor, hashes[ancestor.rdns().size() - 1])) {
             break;
         }
         if (++count <= named) {
@@ -260,8 +268,7 @@ std::string checked_entries::why_unwritable(const LDIF_Attribute& attribute) con
     const bool is_dn = attribute.values().type()->fromStr == dnFromStr;
     for (const LDIF_Value& value : attribute.values()) {
         if (is_dn && breaks_line(value.text)) {
-            return fmt::format("a value of {}{} has a line break", name,
-                               on_line(line_of(value)));
+            return fmt::format("a value of {}{} has a line break", name, on_line(line_of(value)));
         }
     }
     return {};

@@ -66,6 +66,7 @@ class checked_entries {
     };
 
     checked_entry* find(const LDIF_DN& dn);
+    checked_entry* find(const LDIF_DN& dn, size_t hash);
     void merge(checked_entry& known, entry_section& section);
     void merge(LDIF_Attribute& known, const LDIF_Attribute& again, const entry_section& section);
     void report_second_value(const LDIF_Attribute& attribute, int line, const std::string& entry);
