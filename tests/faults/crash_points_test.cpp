@@ -36,13 +36,15 @@ struct crash_points : testing::TestWithParam<scenario> {
     const std::vector<seen_call> calls = calls_of(setting);
     const std::vector<std::string> versions_before{versions.begin(), versions.end() - 1};
 
-    /// Lets a process die at every call, in every way, and checks what it left behind.
+    /// Lets a process die at every call, in every way, and checks what it left behind. After a call
+    /// is before the next one.
     template <class Check>
     void for_each_death(Check check) {
         for (size_t nth = 1; nth <= calls.size() && !HasFailure(); ++nth) {
             for (const effect what :
                  {effect::kills_before, effect::kills_halfway, effect::kills_after}) {
-                if (what == effect::kills_halfway && !calls[nth - 1].is_transfer) {
+                if ((what == effect::kills_halfway && !calls[nth - 1].is_transfer) ||
+                    (what == effect::kills_after && nth < calls.size())) {
                     continue;
                 }
                 stage on(setting);
