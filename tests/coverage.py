@@ -91,7 +91,9 @@ class Area:
 
 
 def lines_left_out(text):
-    return [number for number, line in enumerate(text.split("\n"), 1) if "UNREACHABLE:" in line]
+    """What can't be reached, and the braces behind it, which are no code."""
+    return [number for number, line in enumerate(text.split("\n"), 1)
+            if "UNREACHABLE:" in line or line.strip() == "}"]
 
 
 def main(root):

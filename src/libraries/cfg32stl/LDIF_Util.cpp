@@ -205,7 +205,7 @@ using byte_classes = std::array<unsigned char, 256>;
 /// are kept while the process may change its locale: they must fit the equality of each. Turkish
 /// has an I with and one without a dot, and the character sets of one byte have letters beyond
 /// ASCII.
-constexpr byte_classes classes_of(hash_kind kind) {
+constexpr auto classes_of = [](hash_kind kind) {
     constexpr unsigned char any_letter = 0x80;
     byte_classes classes{};
     for (size_t c = 0; c < 256; ++c) {
@@ -215,7 +215,7 @@ constexpr byte_classes classes_of(hash_kind kind) {
         classes[c] = may_be_any ? any_letter : static_cast<unsigned char>(lower);
     }
     return classes;
-}
+};
 
 constexpr byte_classes classes_by_kind[] = {classes_of(hash_kind::of_ascii_letters),
                                             classes_of(hash_kind::of_every_byte)};
