@@ -233,7 +233,8 @@ TEST_P(command_faults, ThatKillItLeaveACompleteVersion) {
 }
 
 TEST_P(command_faults, OfThePowerLeaveACompleteVersionAndWhatIsDoneLasts) {
-    const unsigned long cuts = number_from_environment("CFG32_FAULTS_POWER_CUTS", 100);
+    const unsigned long cuts =
+        number_from_environment("CFG32_FAULTS_POWER_CUTS", is_sanitized() ? 25 : 100);
     const command_run run = run_recorded(row, [&](const recorded_disk& disk) {
         SCOPED_TRACE(disk.listed());
         size_t images = 0;

@@ -37,14 +37,16 @@ struct crash_points : testing::TestWithParam<scenario> {
     const std::vector<std::string> versions_before{versions.begin(), versions.end() - 1};
 
     /// Lets a process die at every call, in every way, and checks what it left behind. After a call
-    /// is before the next one.
+    /// is before the next one. With a sanitizer, under which a run takes several times as long and
+    /// leaves the same, every third of the deaths between two calls.
     template <class Check>
     void for_each_death(Check check) {
         for (size_t nth = 1; nth <= calls.size() && !HasFailure(); ++nth) {
             for (const effect what :
                  {effect::kills_before, effect::kills_halfway, effect::kills_after}) {
                 if ((what == effect::kills_halfway && !calls[nth - 1].is_transfer) ||
-                    (what == effect::kills_after && nth < calls.size())) {
+                    (what == effect::kills_after && nth < calls.size()) ||
+                    (what == effect::kills_before && is_sanitized() && nth % 3 != 0)) {
                     continue;
                 }
                 stage on(setting);

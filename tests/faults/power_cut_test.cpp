@@ -40,7 +40,8 @@ struct power_cut : testing::TestWithParam<scenario> {
     const scenario& setting = GetParam();
     const std::vector<std::string> versions = versions_of(setting);
     const unsigned long seed = number_from_environment("CFG32_FAULTS_SEED", 20);
-    const unsigned long cuts = number_from_environment("CFG32_FAULTS_POWER_CUTS", 100);
+    const unsigned long cuts =
+        number_from_environment("CFG32_FAULTS_POWER_CUTS", is_sanitized() ? 25 : 100);
     std::mt19937_64 random{seed};
     std::set<recorded_disk::image> known;
     size_t images = 0;
