@@ -109,22 +109,19 @@ static void given_text(struct scene *s) {
     s->text = cfg_get_dn(s->handle, s->result);
 }
 
-static void refused(struct scene *s) {
+static void refused_value(struct scene *s, const char *dn, const char *name, const char *value) {
     bound(s);
-    assert_int_equal(modify_one(s->handle, LISTENER, LDAP_MOD_REPLACE, "oru-slapdPort", "70000"),
-                     21);
+    assert_int_equal(modify_one(s->handle, dn, LDAP_MOD_REPLACE, name, value), 21);
 }
 
+static void refused(struct scene *s) { refused_value(s, LISTENER, "oru-slapdPort", "70000"); }
+
 static void refused_word(struct scene *s) {
-    bound(s);
-    assert_int_equal(
-        modify_one(s->handle, CONFIGURATION, LDAP_MOD_REPLACE, "oru-slapdSysLogLevel", "loud"), 21);
+    refused_value(s, CONFIGURATION, "oru-slapdSysLogLevel", "loud");
 }
 
 static void refused_mask(struct scene *s) {
-    bound(s);
-    assert_int_equal(modify_one(s->handle, TLS, LDAP_MOD_REPLACE, "oru-slapdSslCipherSpecs", "255"),
-                     21);
+    refused_value(s, TLS, "oru-slapdSslCipherSpecs", "255");
 }
 
 static void refused_line(struct scene *s) {

@@ -5,7 +5,7 @@
 #include <memory>
 
 #include "cfg32.h"
-#include "given_text.h"
+#include "input.h"
 #include "outcome.h"
 #include "terminal.h"
 
@@ -38,7 +38,7 @@ secret settings::bind_password() const {
     if (password_file.empty()) {
         throw ended(usage_error, "-D needs a password: add -W or -y FILE");
     }
-    return given_password(password_file);
+    return input_password(password_file);
 }
 
 }  // namespace cfg32::tool

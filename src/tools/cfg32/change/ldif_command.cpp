@@ -7,7 +7,7 @@
 
 #include "arguments.h"
 #include "change/ldif_reader.h"
-#include "given_text.h"
+#include "input.h"
 #include "outcome.h"
 
 namespace cfg32::tool {
@@ -72,7 +72,7 @@ int update_from_ldif(const settings& options, const ldif_options& given,
                      change_record::operation default_kind, bool only_default) {
     update_options how = given.how;
     how.source = given.file.empty() ? standard_input : given.file;
-    const std::string text = given.file.empty() ? given_text() : given_text(given.file);
+    const std::string text = given.file.empty() ? input_text() : input_text(given.file);
     ldif_records records = records_of(text, how.source, default_kind, only_default);
     if (!how.goes_on) {
         require_none(records.bad);

@@ -1,6 +1,6 @@
 // Texts from files of every kind.
 
-#include "given_text.h"
+#include "input.h"
 
 #include <fcntl.h>
 #include <fmt/format.h>
@@ -67,11 +67,11 @@ bool read_line(int file, std::span<char> buffer, std::string_view& line) {
 
 }  // namespace
 
-std::string given_text(const std::string& name) { return text_of(opened(name).get(), name); }
+std::string input_text(const std::string& name) { return text_of(opened(name).get(), name); }
 
-std::string given_text() { return text_of(STDIN_FILENO, standard_input); }
+std::string input_text() { return text_of(STDIN_FILENO, standard_input); }
 
-secret given_password(const std::string& name) {
+secret input_password(const std::string& name) {
     const unique_fd file = opened(name);
     std::array<char, CFG32_PASSWORD_MAX + 1> buffer;  // no part of it stays where a text has grown
     std::string_view line;

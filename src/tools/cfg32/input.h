@@ -14,12 +14,12 @@ namespace cfg32::tool {
 inline constexpr const char* standard_input = "standard input";
 
 /// The text of a file of that name.
-std::string given_text(const std::string& name);
+std::string input_text(const std::string& name);
 
 /// The text of standard input.
-std::string given_text();
+std::string input_text();
 
 /// The first line of a file, which one ends with or without a newline.
-secret given_password(const std::string& name);
+secret input_password(const std::string& name);
 
 }  // namespace cfg32::tool
