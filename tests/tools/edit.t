@@ -204,6 +204,30 @@ Whichever it is that ends a program:
     [152]
     $ rm -r private/*
 
+The same when what would change reaches nobody:
+
+    $ edit_by 'sed -i "s/^# Plain port/# That port/" "$1"; until [ -e gone ]; do sleep 0.01; done'
+    $ cfg32 -f before.conf edit -n 2> told | { exec <&-; touch gone; }
+    [141]
+    $ sed "s|$TMPDIR/cfg32-[^/]*|PRIVATE|" told
+    
+    what you edited is kept in PRIVATE/before.conf
+    $ grep -c '^# That port' private/*/before.conf && rm -r private/*
+    1
+    $ cfg32 -f before.conf edit -n 2>&1 > /dev/full | sed "s|$TMPDIR/cfg32-[^/]*|PRIVATE|"
+    what you edited is kept in PRIVATE/before.conf
+    cfg32: what would change can't be shown
+    cfg32: standard output can't be written
+    [3]
+    $ rm -r private/*
+
+When there is no draft any more, none is told of:
+
+    $ edit_by 'until [ -e gone ]; do sleep 0.01; done'
+    $ rm gone && cfg32 -f before.conf edit | { exec <&-; touch gone; }
+    [141]
+    $ ls private
+
 An entry that its edit makes the same as another is a problem elsewhere in the file:
 
     $ replace 's/^dn: .*/dn: cn=Referrals, cn=Network, cn=Configuration/'

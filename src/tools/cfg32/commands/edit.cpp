@@ -3,6 +3,7 @@
 #include <fmt/format.h>
 #include <unistd.h>
 
+#include <array>
 #include <climits>
 #include <csignal>
 #include <cstdio>
@@ -36,7 +37,7 @@ void run_editor(const std::string& path) {
     }
 }
 
-/// Tells where the draft is when a signal ends the program.
+/// Tells where the draft is when a signal ends the program, as long as there is one.
 class draft_keeper {
   public:
     explicit draft_keeper(const std::string& path) {
@@ -44,23 +45,33 @@ class draft_keeper {
         struct sigaction action {};
         action.sa_handler = tell_and_end;
         action.sa_flags = static_cast<int>(SA_RESETHAND);
-        for (const int signal :
-             {SIGHUP, SIGINT, SIGQUIT, SIGPIPE, SIGALRM, SIGTERM, SIGUSR1, SIGUSR2, SIGXCPU}) {
-            struct sigaction before {};
-            sigaction(signal, &action, &before);
-            if (before.sa_handler == SIG_IGN) {
-                sigaction(signal, &before, nullptr);
+        for (size_t i = 0; i < ending.size(); ++i) {
+            sigaction(ending[i], &action, &before_[i]);
+            if (before_[i].sa_handler == SIG_IGN) {
+                sigaction(ending[i], &before_[i], nullptr);
             }
+        }
+    }
+    draft_keeper(const draft_keeper&) = delete;
+    draft_keeper& operator=(const draft_keeper&) = delete;
+    ~draft_keeper() {
+        for (size_t i = 0; i < ending.size(); ++i) {
+            sigaction(ending[i], &before_[i], nullptr);
         }
     }
 
   private:
+    static constexpr std::array ending = {SIGHUP,  SIGINT,  SIGQUIT, SIGPIPE, SIGALRM,
+                                          SIGTERM, SIGUSR1, SIGUSR2, SIGXCPU};
+
     static void tell_and_end(int signal) {
         [[maybe_unused]] const ssize_t written = ::write(STDERR_FILENO, message, strlen(message));
         raise(signal);
     }
 
     static inline char message[PATH_MAX + 64];
+
+    std::array<struct sigaction, ending.size()> before_{};
 };
 
 /// One edit: the editor, the check and the question, until it is written or dropped.
@@ -119,6 +130,9 @@ int session::finish(const std::string& draft) {
         fmt::print("unchanged\n");
     } else if (options_.is_dry_run) {
         fmt::print("{}", unified_diff(text_.before(), after, file_name_));
+        if (fflush(stdout) != 0) {  // while the draft is there
+            throw ended(failed, "what would change can't be shown");
+        }
     } else {
         replace_file(file_name_, options_.backup_name(), after, text_.before());
     }
