@@ -188,7 +188,7 @@ An editor that fails writes nothing:
 A signal at the question ends it, and says where the draft is:
 
     $ replace 's/^oru-slapdVersion: .*/oru-slapdVersion/'
-    $ setsid -w cfg32 -f oruslapd.conf edit cn=Configuration < <(sleep 1; pkill -INT -f 'cfg32 -f oruslapd.conf edit'; sleep 1) 2>&1 | tail -1 | sed "s|$TMPDIR/cfg32-[^/]*|PRIVATE|"
+    $ EDITOR="echo \$PPID > asking; $EDITOR" setsid -w cfg32 -f oruslapd.conf edit cn=Configuration < <(sleep 1; kill -INT "$(cat asking)"; sleep 1) 2>&1 | tail -1 | sed "s|$TMPDIR/cfg32-[^/]*|PRIVATE|"
     what you edited is kept in PRIVATE/oruslapd.conf
     [130]
     $ rm -r private/*
