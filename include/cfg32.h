@@ -240,7 +240,8 @@ CFG32_API CfgHandle *cfg_init(void) CFG32_NOEXCEPT;
  *         one "charset" line that can be used;
  *         80 for a failure of the system (exhausted memory included) or of the library, when no
  *         file name is known, or for a file that was not written to its end;
- *         83 (Encoding error) for a password that is too long when it is encoded;
+ *         83 (Encoding error) for a password that is too long when it is encoded, and for want of
+ *         random numbers to encode one of the file with;
  *         84 (Decoding error) for a stored password that can't be decoded with the key given;
  *         86 for another method;
  *         89 for a null handle;

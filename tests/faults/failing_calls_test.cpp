@@ -233,6 +233,30 @@ TEST_P(failing_calls, ThatKeepTheOldContentFromBeingPutBackAreToldAndTheBackupIs
     EXPECT_GE(rows, 6) << listed(calls);
 }
 
+// Without them no password can be encoded, which is not the password's fault: neither is it kept as
+// a line that can't be used, nor does the one before it go.
+TEST(failing_random_numbers, TakeNoPasswordAway) {
+    const auto with = [](const std::string& password) {
+        return configuration_head +
+               "\ndn: cn=a, cn=Configuration\ncn: a\noru-slapdMasterPW: " + password + "\n\n";
+    };
+    const attribute_change harmless = {LDAP_MOD_REPLACE, "cn=a, cn=Configuration", "cn", {"a"}};
+    constexpr int encoding_error = 83;
+    attribute_change new_password = harmless;
+    new_password.attribute = "oru-slapdMasterPW";
+    new_password.values = {"new"};
+    for (const scenario& one : {scenario{"read", false, with("secret"), harmless, {}},
+                                scenario{"changed", false, with("{SHA}x"), new_password, {}}}) {
+        for (const int error : {EIO, ENOSYS, EPERM}) {
+            stage on(one);
+            EXPECT_EQ(on.play({{0, effect::fails, error, "getrandom"}}), encoding_error);
+            EXPECT_EQ(on.folder().text(), one.before);
+            EXPECT_EQ(on.user().modify(harmless), CFG_SUCCESS) << on.report();
+            EXPECT_THAT(on.folder().text(), HasSubstr("\noru-slapdMasterPW: {"));
+        }
+    }
+}
+
 // Somebody else shortens the backup when it is made: the old content is put back without it.
 TEST_P(failing_calls, NeedNoBackupToPutTheOldContentBack) {
     if (!setting.has_backup) {

@@ -31,11 +31,16 @@ length_bounds bounds_of(const _AttrType* type) {
     return {lower, type && type->maximum >= lower ? type->maximum : longest};
 }
 
-/// Throws for a password routine that failed. It may have lacked memory, which is not the text's
-/// fault.
+/// Errors that are not the text's fault: the routine lacked memory, or random numbers
+/// (getrandom(2); a sandbox may refuse it).
+bool is_of_system(int error) {
+    return error == ENOMEM || error == EAGAIN || error == EIO || error == ENOSYS || error == EPERM;
+}
+
+/// Throws for a password routine that failed.
 [[noreturn]] void routine_failed(const failure& kind, const LDIF_Value& value,
                                  const std::string& text, const throw_site& site = {}) {
-    const int error = errno == ENOMEM ? ENOMEM : 0;
+    const int error = is_of_system(errno) ? errno : 0;
     const auto details = [&](LDIF_Exception& e) {
         e.sysErrno = error;
         e.value = text;

@@ -151,8 +151,8 @@ void loader::attribute_line() {
             add_attribute();
         }
     } catch (const LDIF_Exception& e) {
-        // Exhausted memory says nothing about the line.
-        if (e.ldapErr == object_class_violation || e.sysErrno == ENOMEM) {
+        // A failure of the system says nothing about the line.
+        if (e.ldapErr == object_class_violation || e.sysErrno != 0) {
             throw;
         }
         line_.change_to_invalid_attribute();

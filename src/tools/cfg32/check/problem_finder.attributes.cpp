@@ -36,7 +36,7 @@ void problem_finder::attribute_line() {
     try {
         take();
     } catch (const LDIF_Exception& e) {
-        if (e.sysErrno == ENOMEM) {
+        if (e.sysErrno != 0) {
             throw;  // that says nothing about the line
         }
         report_refused(e);
@@ -69,7 +69,7 @@ void problem_finder::check_unreadable_value() {
     try {
         LDIF_Attribute(key_, line_, {});
     } catch (const LDIF_Exception& e) {
-        if (e.sysErrno == ENOMEM) {
+        if (e.sysErrno != 0) {
             throw;
         }
         report_refused(e);
