@@ -121,6 +121,12 @@ Nor is a file that is gone; the new one has the backup's mode:
     $ cmp original oruslapd.conf && stat --format=%a oruslapd.conf
     640
 
+It is made again also when its name is too long for one to keep it by:
+
+    $ name=$(printf '%0243d' 1) && cp original $name.bak
+    $ cfg32 -f $name restore --yes > diff
+    $ cmp original $name && rm $name*
+
 Where the replaced file goes can be said, but not over what is restored:
 
     $ cfg32 -f oruslapd.conf --backup kept restore --yes changed > diff

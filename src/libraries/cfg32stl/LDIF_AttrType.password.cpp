@@ -1,9 +1,11 @@
 // The syntax of passwords: encoded when they are set, decoded when they are compared, by the
 // server's routines.
 
+#include <algorithm>
 #include <cerrno>
 #include <cstring>
 #include <functional>
+#include <initializer_list>
 #include <string_view>
 
 #include "LDIF_AttrType.h"
@@ -31,16 +33,14 @@ length_bounds bounds_of(const _AttrType* type) {
     return {lower, type && type->maximum >= lower ? type->maximum : longest};
 }
 
-/// Errors that are not the text's fault: the routine lacked memory, or random numbers
-/// (getrandom(2); a sandbox may refuse it).
-bool is_of_system(int error) {
-    return error == ENOMEM || error == EAGAIN || error == EIO || error == ENOSYS || error == EPERM;
-}
-
-/// Throws for a password routine that failed.
+/// Throws for a password routine that failed. It may have lacked memory, or something else that is
+/// not the text's fault either.
 [[noreturn]] void routine_failed(const failure& kind, const LDIF_Value& value,
-                                 const std::string& text, const throw_site& site = {}) {
-    const int error = is_of_system(errno) ? errno : 0;
+                                 const std::string& text, const throw_site& site = {},
+                                 std::initializer_list<int> others = {}) {
+    const bool is_of_system =
+        errno == ENOMEM || std::find(others.begin(), others.end(), errno) != others.end();
+    const int error = is_of_system ? errno : 0;
     const auto details = [&](LDIF_Exception& e) {
         e.sysErrno = error;
         e.value = text;
@@ -86,7 +86,8 @@ std::string encoded(const LDIF_Value& value, const std::string& clear, int lengt
     errno = 0;
     if (!format_password(CFG32_PASSWORD_SELECTOR, CFG32_PASSWORD_FLAG, value.key, clear.c_str(),
                          length, buffer, sizeof buffer)) {
-        routine_failed(not_encoded, value, clear);
+        // Without random numbers (getrandom(2); a sandbox may refuse them) none can be encoded.
+        routine_failed(not_encoded, value, clear, {}, {EAGAIN, EIO, ENOSYS, EPERM});
     }
     return buffer;
 }

@@ -202,9 +202,9 @@ void apply(LDIF_Entry& entry, const modification& mod, aes_key_data* key) {
 
 }  // namespace
 
-/// Carries out a change of the tree, and completes the report of its failure. A failure
-/// of the system may leave it half done, and may end the report too: then the next refresh reads
-/// the file again.
+/// Carries out a change of the tree, and completes the report of its failure. A failure of the
+/// system may leave it half done, and may end the report too: then the next refresh reads the file
+/// again.
 template <class Body>
 void LDIF_File::change(const char* operation, const LDIF_DN& dn, Body body) {
     const bool was_loaded = std::exchange(is_loaded_, false);

@@ -416,7 +416,10 @@ void LDIF_Values::forget(size_t position) {
     const size_t hash = hash_of(value_of(several_->texts[position]), index->kind);
     const auto [first, last] = index->positions.equal_range(hash);
     const auto is_it = [&](const auto& entry) { return entry.second == position; };
-    index->positions.erase(std::find_if(first, last, is_it));
+    const auto entry = std::find_if(first, last, is_it);
+    if (entry != last) {  // another locale may hash its DN otherwise
+        index->positions.erase(entry);
+    }
 }
 
 std::string LDIF_Values::str() const {

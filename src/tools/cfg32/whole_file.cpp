@@ -19,13 +19,13 @@ namespace cfg32::tool {
 
 namespace {
 
-/// Takes the status of a file; false when there is no such file. What can't be told is no such
-/// answer: a file that is taken for missing would be overwritten.
+/// Takes the status of a file; false when there is no such file, as none is of too long a name.
+/// What can't be told is no such answer: a file that is taken for missing would be overwritten.
 bool has_status(const std::string& name, struct stat& status) {
     if (stat(name.c_str(), &status) == 0) {
         return true;
     }
-    if (errno != ENOENT && errno != ENOTDIR) {
+    if (errno != ENOENT && errno != ENOTDIR && errno != ENAMETOOLONG) {
         fail_for_system(name, errno);
     }
     return false;
