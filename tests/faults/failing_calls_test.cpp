@@ -257,6 +257,21 @@ TEST(failing_random_numbers, TakeNoPasswordAway) {
     }
 }
 
+// There is no room for the mark of an unfinished file: nothing of the file was touched.
+TEST(a_file_that_is_shorter_than_the_mark, IsAsItWasWhenItCanNotGrow) {
+    const scenario one{"short",
+                       true,
+                       "dn: cn=Configuration\ncn: Configuration\n",
+                       {LDAP_MOD_REPLACE, "cn=Configuration", "description", {"d"}},
+                       {{0, effect::fails, EOPNOTSUPP, "fallocate"}}};
+    stage on(one);
+    EXPECT_EQ(on.play({{0, effect::fails, ENOSPC, "pwrite"}}), CFG_OTHER) << listed(on.seen());
+    EXPECT_THAT(on.report(), HasSubstr("errno " + std::to_string(ENOSPC) + ":"));
+    EXPECT_THAT(on.report(), Not(HasSubstr("could not be put back")));
+    EXPECT_EQ(on.folder().text(), one.before);
+    EXPECT_EQ(on.repeat(), CFG_SUCCESS) << on.report();
+}
+
 // Somebody else shortens the backup when it is made: the old content is put back without it.
 TEST_P(failing_calls, NeedNoBackupToPutTheOldContentBack) {
     if (!setting.has_backup) {

@@ -239,7 +239,7 @@ void LDIF_File::overwrite(unique_fd file, struct stat& status, const std::string
     const bool has_copy = copy.is_of(status);
     const std::string before = has_copy ? "" : content_of(file.get(), status);
     const size_t size_before = has_copy ? static_cast<size_t>(status.st_size) : before.size();
-    if (!reserve(file.get(), size_before, std::max(content.size(), mark.size()), !mark.empty())) {
+    if (!reserve(file.get(), size_before, content.size(), mark)) {
         raise_with(not_written, {}, name_file_and_errno(errno));
     }
     is_loaded_ = false;  // until it is known what the file has become

@@ -135,6 +135,12 @@ bool extend(int file, size_t from, size_t to, bool is_marked) {
            (is_unsupported(errno) && (is_marked || write_blank_lines(file, from, to)));
 }
 
+/// A size may come to the disk later than what is written beyond the old one: a file that is
+/// shorter than the mark grows before, so that the mark has no part missing.
+bool make_place_for(std::string_view mark, int file, size_t size) {
+    return size >= mark.size() || write_blank_lines(file, size, mark.size());
+}
+
 bool is_equal(const timespec& left, const timespec& right) {
     return left.tv_sec == right.tv_sec && left.tv_nsec == right.tv_nsec;
 }
@@ -179,13 +185,8 @@ bool write_mark(int file, std::string_view mark) {
     if (fstat(file, &status) != 0) {
         return false;
     }
-    // A size may come to the disk later than what is written beyond the old one: a file that is
-    // shorter than the mark grows before, so that the mark has no part missing.
-    const auto size = static_cast<size_t>(status.st_size);
-    if (size < mark.size() && !write_blank_lines(file, size, mark.size())) {
-        return give_back(file, size);
-    }
-    return write_all(file, mark, 0) && is_in_order(file, mark);
+    return make_place_for(mark, file, static_cast<size_t>(status.st_size)) &&
+           write_all(file, mark, 0) && is_in_order(file, mark);
 }
 
 /// Puts the head in the place of the mark, and cuts the file to its size.
@@ -233,11 +234,13 @@ bool read_first(int file, size_t count, std::string& bytes) {
     return part.data() != nullptr;
 }
 
-bool reserve(int file, size_t present, size_t wanted, bool is_marked) {
-    if (!is_within_limit(wanted)) {
+bool reserve(int file, size_t present, size_t wanted, std::string_view mark) {
+    const size_t needed = std::max(wanted, mark.size());
+    if (!is_within_limit(needed)) {
         return false;
     }
-    return (unshare(file, std::min(present, wanted)) && extend(file, present, wanted, is_marked)) ||
+    return (unshare(file, std::min(present, needed)) &&
+            extend(file, present, needed, !mark.empty()) && make_place_for(mark, file, present)) ||
            give_back(file, present);
 }
 
