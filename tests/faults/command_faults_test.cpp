@@ -233,12 +233,10 @@ TEST_P(command_faults, ThatKillItLeaveACompleteVersion) {
 }
 
 TEST_P(command_faults, OfThePowerLeaveACompleteVersionAndWhatIsDoneLasts) {
-    const unsigned long cuts =
-        number_from_environment("CFG32_FAULTS_POWER_CUTS", is_sanitized() ? 25 : 100);
     const command_run run = run_recorded(row, [&](const recorded_disk& disk) {
         SCOPED_TRACE(disk.listed());
         size_t images = 0;
-        disk.for_each_image(cuts, random, [&](const folder_image& left) {
+        disk.for_each_image(cuts_by_chance(), random, [&](const folder_image& left) {
             ++images;
             if (!HasFailure()) {
                 expect_nothing_lost(comparable(left));

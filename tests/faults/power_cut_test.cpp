@@ -40,8 +40,6 @@ struct power_cut : testing::TestWithParam<scenario> {
     const scenario& setting = GetParam();
     const std::vector<std::string> versions = versions_of(setting);
     const unsigned long seed = number_from_environment("CFG32_FAULTS_SEED", 20);
-    const unsigned long cuts =
-        number_from_environment("CFG32_FAULTS_POWER_CUTS", is_sanitized() ? 25 : 100);
     std::mt19937_64 random{seed};
     std::set<recorded_disk::image> known;
     size_t images = 0;
@@ -58,7 +56,7 @@ struct power_cut : testing::TestWithParam<scenario> {
         }
         const int code = on.play(all);
         SCOPED_TRACE(disk.listed() + "of:\n" + listed(on.seen()));
-        disk.for_each_image(cuts, random, [&](const recorded_disk::image& left) {
+        disk.for_each_image(cuts_by_chance(), random, [&](const recorded_disk::image& left) {
             ++images;
             recorded_disk::image both = left;
             std::erase_if(both, [](const auto& file) { return file.first.front() == '.'; });

@@ -7,6 +7,8 @@
 #include <fstream>
 #include <iterator>
 
+#include "environment.h"
+
 namespace cfg32::tests {
 
 namespace {
@@ -258,6 +260,10 @@ std::string recorded_disk::listed() const {
         text += "\n";
     }
     return text;
+}
+
+size_t cuts_by_chance() {
+    return number_from_environment("CFG32_FAULTS_POWER_CUTS", is_sanitized() ? 25 : 100);
 }
 
 }  // namespace cfg32::tests

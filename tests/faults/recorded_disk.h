@@ -94,4 +94,8 @@ class recorded_disk {
     std::vector<operation> operations_;
 };
 
+/// How many parts of what is not synced are taken by chance: CFG32_FAULTS_POWER_CUTS, else fewer
+/// where they take longer. What a cut leaves is the same with a sanitizer.
+size_t cuts_by_chance();
+
 }  // namespace cfg32::tests
