@@ -6,6 +6,7 @@
 
 #include <cerrno>
 #include <cstdlib>
+#include <new>
 #include <system_error>
 
 #include "disk.h"
@@ -29,11 +30,18 @@ private_folder::private_folder() {
 }
 
 private_folder::~private_folder() {
-    if (!is_kept_) {
+    if (is_kept_) {
+        return;
+    }
+    try {
         std::error_code error;
         std::filesystem::remove_all(path_, error);
         if (error) {
             complain(path_.string() + " can't be removed: " + error.message());
+        }
+    } catch (const std::bad_alloc&) {
+        for (const char* part : {"cfg32: no memory to remove ", path_.c_str(), "\n"}) {
+            tell(part);
         }
     }
 }
