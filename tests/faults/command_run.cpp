@@ -14,11 +14,9 @@
 #include <regex>
 #include <sstream>
 
+#include "command_line.h"
 #include "session.h"
 #include "temporary_folder.h"
-
-/// The command's main(), under another name.
-int command_main(int argc, char** argv);
 
 namespace cfg32::tests {
 
@@ -126,7 +124,7 @@ int carry_out(std::vector<std::string> words, const std::vector<fault>& faults,
     }
     arguments.push_back(nullptr);
     const watched_calls calls(faults);
-    const int status = command_main(static_cast<int>(words.size()), arguments.data());
+    const int status = tool::run_command_line(static_cast<int>(words.size()), arguments.data());
     keep(calls.seen(), trace);
     return status;
 }
