@@ -198,6 +198,14 @@ A name that would be read as another can't be said in LDIF:
     $ cfg32 -f one.conf apply pair.conf
     cfg32: pair.conf can't be applied: "cn=a + ou=b, cn=Configuration" would be taken for another name, or not at all
     [3]
+    $ printf 'dn: cn=Configuration\ncn: x\noru-slapdAdminDN: cn=a+ou=b\n' > value.conf
+    $ cfg32 -f one.conf apply value.conf
+    cfg32: value.conf can't be applied: "cn=a + ou=b" would be taken for another name, or not at all
+    [3]
+    $ printf 'dn: cn=Configuration\ncn: x\na b: y\n' > attribute.conf
+    $ cfg32 -f one.conf apply attribute.conf
+    cfg32: attribute.conf can't be applied: "a b" would be taken for another name, or not at all
+    [3]
 
 What can't be read is a failure:
 

@@ -100,12 +100,26 @@ The password is the first line, of a pipe as well, and what can't be read is tol
     cfg32: /dev/zero: a password has at most 1024 bytes
     [3]
 
-A key that others could read is not used:
+A key that others could read is not used, nor what is no key:
 
     $ chmod 640 oruslapd.key
     $ cfg32 -f oruslapd.conf --key-file oruslapd.key get cn=Configuration cn
     cfg32: oruslapd.key: a key file that others can read is not used
     [3]
+    $ install -m 600 /dev/null empty.key
+    $ cfg32 -f oruslapd.conf --key-file empty.key get cn=Configuration cn
+    cfg32: empty.key: a key file holds 16, 24 or 32 bytes
+    [3]
+    $ cfg32 -f oruslapd.conf --key-file no.key get cn=Configuration cn
+    cfg32: no.key: No such file or directory
+    [3]
+
+A locale that is not there is told, and what is ASCII is read all the same:
+
+    $ printf 'dn: cn=Configuration\ncn: Configuration\n' > ascii.conf
+    $ LC_ALL=xx_XX cfg32 -f ascii.conf get cn=Configuration cn
+    cfg32: the locale that the environment names is not installed: text is taken for ASCII (LC_ALL=C.UTF-8 is always there)
+    Configuration
 
 Without -f it is the server's own file, and without a server that is said:
 

@@ -92,6 +92,9 @@ not there, and an empty value:
     cfg32: --file: is empty
       hint: `cfg32 check --help` tells what there is
     [2]
+    $ cfg32 --file= check
+    cfg32: --file= is empty
+    [2]
     $ cfg32 -D '' -W get a b
     cfg32: --bind-dn: is empty
       hint: `cfg32 get --help` tells what there is
