@@ -1,17 +1,22 @@
 // The command's own readings of large configurations: what is wrong with one, and what differs from
 // another.
 
+#include <fcntl.h>
 #include <gtest/gtest.h>
+#include <unistd.h>
 
+#include <cstdio>
 #include <sstream>
 
 #include "LDIF_File.h"
 #include "check/problem.h"
+#include "command_line.h"
 #include "diff/difference.h"
 #include "failing_new.h"
 #include "large_file.h"
 #include "small_stack.h"
 #include "temporary_folder.h"
+#include "unique_fd.h"
 
 using namespace cfg32;
 using namespace cfg32::tests;
@@ -38,6 +43,41 @@ double share_of(const std::string& text, Body body) {
     return static_cast<double>(failing_allocation::bytes() - before) /
            static_cast<double>(text.size());
 }
+
+/// What is printed while this is there goes nowhere.
+class unseen_output {
+  public:
+    unseen_output() {
+        fflush(nullptr);
+        const int nowhere = open("/dev/null", O_WRONLY | O_CLOEXEC);
+        dup2(nowhere, STDOUT_FILENO);
+        dup2(nowhere, STDERR_FILENO);
+        close(nowhere);
+    }
+    unseen_output(const unseen_output&) = delete;
+    unseen_output& operator=(const unseen_output&) = delete;
+    ~unseen_output() {
+        fflush(nullptr);
+        dup2(out_.get(), STDOUT_FILENO);
+        dup2(err_.get(), STDERR_FILENO);
+    }
+
+  private:
+    const unique_fd out_{dup(STDOUT_FILENO)};
+    const unique_fd err_{dup(STDERR_FILENO)};
+};
+
+int run_unseen(std::vector<std::string> words) {
+    std::vector<char*> arguments;
+    for (std::string& word : words) {
+        arguments.push_back(word.data());
+    }
+    const unseen_output nowhere;
+    return tool::run_command_line(static_cast<int>(arguments.size()), arguments.data());
+}
+
+const std::vector<std::vector<std::string>> readings = {
+    {"search"}, {"search", "--json"}, {"tree"}, {"tree", "--json"}, {"check", "--json"}};
 
 }  // namespace
 
@@ -75,6 +115,19 @@ TEST_P(large_text, FourTimesAsLongAsksForNoMoreThanItsShareOfMemory) {
     }
     EXPECT_LT(checked[1], checked[0] * 2);
     EXPECT_LT(compared[1], compared[0] * 2 + 1);
+}
+
+TEST_P(large_text, FourTimesAsLongIsPrintedForNoMoreThanItsShareOfMemory) {
+    for (const std::vector<std::string>& reading : readings) {
+        double share[2] = {};
+        for (const size_t factor : {1, 4}) {
+            const std::string text = text_of(file.usual * factor / 4);
+            std::vector<std::string> words = {"cfg32", "-f", folder.write("conf", text)};
+            words.insert(words.end(), reading.begin(), reading.end());
+            share[factor / 4] = share_of(text, [&] { EXPECT_LE(run_unseen(words), 1); });
+        }
+        EXPECT_LT(share[1], share[0] * 2) << testing::PrintToString(reading);
+    }
 }
 
 INSTANTIATE_TEST_SUITE_P(of, large_text, testing::ValuesIn(large_files()),

@@ -4,6 +4,10 @@
 #include <vector>
 
 #include "LDIF_File.h"
+#include "tree_drawing.h"
+
+using cfg32::drawing_characters;
+using cfg32::missing_entries;
 
 namespace {
 
@@ -25,8 +29,8 @@ constexpr drawing_style code_page_437 = {"\xC0\xC4 ", "\xC3\xC4 ", "\xC4 ",
 /// Draws an entry and everything below it. It does not recurse: a tree may be deeper than a stack.
 class drawing {
   public:
-    drawing(const drawing_style& style, std::set<LDIF_DN>& undefined, const std::string& prefix)
-        : style_(style), undefined_(undefined), prefix_(prefix) {}
+    drawing(const drawing_style& style, missing_entries& missing, const std::string& prefix)
+        : style_(style), missing_(missing), prefix_(prefix) {}
 
     std::string of(const LDIF_Entry& top, bool is_last);
 
@@ -40,10 +44,9 @@ class drawing {
 
     void draw(const LDIF_Entry& entry, bool is_last);
     void draw_next_child();
-    void note_missing(const LDIF_Entry& entry);
 
     const drawing_style& style_;
-    std::set<LDIF_DN>& undefined_;
+    missing_entries& missing_;
     std::string prefix_;
     std::string text_;
     std::vector<level> open_;
@@ -76,7 +79,7 @@ void drawing::draw(const LDIF_Entry& entry, bool is_last) {
     text_.append(is_last ? style_.corner : style_.tee).append(entry.relative_dn().str());
     if (entry.relative_size() > 1) {
         text_ += " *";
-        note_missing(entry);
+        missing_.add_above(entry);
     }
     text_ += '\n';
 }
@@ -96,36 +99,40 @@ void drawing::draw_next_child() {
     draw(child, is_last);
 }
 
-/// Notes the ancestors that are missing between the entry and its parent in the tree.
-void drawing::note_missing(const LDIF_Entry& entry) {
-    LDIF_DN missing = entry.dn();
-    for (size_t count = entry.relative_size(); count > 1; --count) {
-        missing.remove_leaf();
-        undefined_.insert(missing);
-    }
-}
-
 }  // namespace
+
+std::string cfg32::tree_drawing(drawing_characters characters, const LDIF_Entry& top, bool is_last,
+                                missing_entries& missing, const std::string& prefix) {
+    const bool is_ascii = characters == drawing_characters::ascii;
+    return drawing(is_ascii ? plain : code_page_437, missing, prefix).of(top, is_last);
+}
 
 std::string IA5_TreeView(const LDIF_Entry& entry, std::set<LDIF_DN>& undefined,
                          const std::string& prefix) {
-    return drawing(plain, undefined, prefix).of(entry, false);
+    missing_entries missing;
+    std::string text =
+        cfg32::tree_drawing(drawing_characters::ascii, entry, false, missing, prefix);
+    missing.copy_to(undefined);
+    return text;
 }
 
 std::string OEM_TreeView(const LDIF_Entry& entry, bool last, std::set<LDIF_DN>& undefined,
                          const std::string& prefix) {
-    return drawing(code_page_437, undefined, prefix).of(entry, last);
+    missing_entries missing;
+    std::string text =
+        cfg32::tree_drawing(drawing_characters::code_page_437, entry, last, missing, prefix);
+    missing.copy_to(undefined);
+    return text;
 }
 
 std::string LDIF_File::treeView(bool oem) const {
-    std::set<LDIF_DN> undefined;
-    std::string text =
-        oem ? OEM_TreeView(root_, true, undefined, {}) : IA5_TreeView(root_, undefined, {});
-    if (!undefined.empty()) {
+    missing_entries missing;
+    const drawing_characters characters =
+        oem ? drawing_characters::code_page_437 : drawing_characters::ascii;
+    std::string text = cfg32::tree_drawing(characters, root_, true, missing, {});
+    if (!missing.empty()) {
         text += "\n* the following entries are undefined:\n";
     }
-    for (const LDIF_DN& dn : undefined) {
-        text.append(dn.str()).append("\n");
-    }
+    missing.for_each([&](const std::string& dn) { text.append(dn).append("\n"); });
     return text;
 }

@@ -7,7 +7,7 @@
 #include <algorithm>
 #include <array>
 #include <nlohmann/json.hpp>
-#include <set>
+#include <vector>
 
 #include "LDIF_File.h"
 #include "arguments.h"
@@ -16,6 +16,7 @@
 #include "hidden_passwords.h"
 #include "json_text.h"
 #include "terminal.h"
+#include "tree_drawing.h"
 
 namespace cfg32::tool {
 
@@ -78,34 +79,32 @@ LDIF_Entry tree_from(const LDIF_Entry& base) {
     return tree;
 }
 
-/// The DNs that are missing above an entry, the nearest to it first. Above a suffix none is.
-std::vector<LDIF_DN> missing_ancestors(const LDIF_Entry& node) {
-    std::vector<LDIF_DN> missing;
-    LDIF_DN dn = node.dn();
-    const size_t count = node.relative_size();
-    for (size_t i = 1; i < count && count < node.dn().rdns().size(); ++i) {
-        dn.remove_leaf();
-        missing.push_back(dn);
+/// What is missing above an entry. Above a suffix nothing is.
+missing_entries missing_above(const LDIF_Entry& entry) {
+    missing_entries missing;
+    if (entry.depth() > 0) {
+        missing.add_above(entry);
     }
     return missing;
 }
 
 /// The first line of a drawing that begins at an entry: it is no suffix, but ancestors of it may be
 /// missing.
-void mark_base(std::string& drawing, const LDIF_Entry& base, std::set<LDIF_DN>& missing) {
+void mark_base(std::string& drawing, const LDIF_Entry& base, missing_entries& missing) {
     constexpr std::string_view suffix = " (suffix)";
-    const std::vector<LDIF_DN> above = missing_ancestors(base);
-    missing.insert(above.begin(), above.end());
-    drawing.replace(drawing.find('\n') - suffix.size(), suffix.size(), above.empty() ? "" : " *");
+    missing.add_above(base);
+    drawing.replace(drawing.find('\n') - suffix.size(), suffix.size(),
+                    base.relative_size() > 1 ? " *" : "");
 }
 
 /// The drawing, and below it the DNs of the entries that are missing: what is marked with "*"
 /// hangs below them.
 std::string drawing_of(const LDIF_Entry& base, drawing_style style) {
     const LDIF_Entry tree = tree_from(base);
-    std::set<LDIF_DN> missing;
-    std::string text =
-        style == ascii ? IA5_TreeView(tree, missing, {}) : OEM_TreeView(tree, true, missing, {});
+    missing_entries missing;
+    const drawing_characters characters =
+        style == ascii ? drawing_characters::ascii : drawing_characters::code_page_437;
+    std::string text = tree_drawing(characters, tree, true, missing, {});
     text.erase(0, text.starts_with('\n') ? 1 : 0);
     if (!base.is_root() && base.depth() > 0) {
         mark_base(text, base, missing);
@@ -116,36 +115,27 @@ std::string drawing_of(const LDIF_Entry& base, drawing_style style) {
     if (!missing.empty()) {
         text += "\n* the following entries are undefined:\n";
     }
-    for (const LDIF_DN& dn : missing) {
-        text += dn.str() + "\n";
-    }
+    missing.for_each([&](const std::string& dn) { text.append(dn).append("\n"); });
     return text;
-}
-
-/// How many entries of the drawing stand above this one.
-size_t depth_below(const LDIF_Entry& base, const LDIF_Entry& node, const LDIF_Entry& root) {
-    size_t depth = 0;
-    LDIF_DN dn = node.dn();
-    while (dn != base.dn() && !dn.empty()) {
-        dn.remove_leaf();
-        depth += !dn.empty() && root.find(dn) ? 1U : 0U;
-    }
-    return depth;
 }
 
 void print_as_json(const configuration& file, const LDIF_Entry& base) {
     json list = json::array();
+    std::vector<size_t> above;  // how many RDNs lead to each entry that is drawn above this one
     for_each_in_preorder(base, [&](const LDIF_Entry& node) {
         if (node.is_root()) {
             return;
         }
-        json missing = json::array();
-        for (const LDIF_DN& dn : missing_ancestors(node)) {
-            missing.push_back(utf8(shown_text(dn.str())));
+        while (!above.empty() && above.back() > node.depth()) {
+            above.pop_back();
         }
+        json missing = json::array();
+        missing_above(node).for_each(
+            [&](const std::string& dn) { missing.push_back(utf8(shown_text(dn))); });
         list.push_back({{"dn", utf8(shown_text(node.dn().str()))},
-                        {"depth", depth_below(base, node, file.root())},
+                        {"depth", above.size()},
                         {"missingAncestors", std::move(missing)}});
+        above.push_back(node.named_dn().size());
     });
     print_objects(std::move(list), file);
 }
