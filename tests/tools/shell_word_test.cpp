@@ -15,6 +15,8 @@ struct word_row {
     char quote;
 };
 
+void PrintTo(const word_row& row, std::ostream* out) { *out << row.raw; }
+
 class TypedWord : public testing::TestWithParam<word_row> {};
 
 TEST_P(TypedWord, IsReadAsTheShellReadsIt) {
@@ -42,6 +44,8 @@ struct quoted_row {
     char quote;
     const char* quoted;
 };
+
+void PrintTo(const quoted_row& row, std::ostream* out) { *out << row.text; }
 
 class QuotedText : public testing::TestWithParam<quoted_row> {};
 
