@@ -12,6 +12,7 @@
 #include "check/problem.h"
 #include "command_line.h"
 #include "diff/difference.h"
+#include "environment.h"
 #include "failing_new.h"
 #include "large_file.h"
 #include "small_stack.h"
@@ -118,6 +119,9 @@ TEST_P(large_text, FourTimesAsLongAsksForNoMoreThanItsShareOfMemory) {
 }
 
 TEST_P(large_text, FourTimesAsLongIsPrintedForNoMoreThanItsShareOfMemory) {
+    if (is_sanitized()) {
+        GTEST_SKIP() << "the same is asked for, but it takes long";
+    }
     for (const std::vector<std::string>& reading : readings) {
         double share[2] = {};
         for (const size_t factor : {1, 4}) {

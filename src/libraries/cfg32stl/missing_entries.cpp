@@ -7,12 +7,16 @@
 namespace cfg32 {
 
 void missing_entries::add_above(const LDIF_Entry& entry) {
-    const auto dn = std::make_shared<const LDIF_DN>(entry.dn());
-    for (size_t size = dn->rdns().size(); size-- > entry.depth() + 1;) {
+    const size_t known = found_.size();
+    const LDIF_DN& dn = below_.emplace_back(entry.dn());
+    for (size_t size = dn.rdns().size(); size-- > entry.depth() + 1;) {
         // What is missing above one that is known was added with it.
-        if (!found_.insert({dn, size}).second) {
-            return;
+        if (!found_.insert({&dn, size}).second) {
+            break;
         }
+    }
+    if (found_.size() == known) {
+        below_.pop_back();
     }
 }
 

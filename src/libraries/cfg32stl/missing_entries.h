@@ -2,7 +2,7 @@
 
 #include <cstddef>
 #include <functional>
-#include <memory>
+#include <list>
 #include <set>
 #include <string>
 
@@ -16,6 +16,13 @@ namespace cfg32 {
 /// lack thousands above it: they share the entry's DN.
 class missing_entries {
   public:
+    missing_entries() = default;
+    missing_entries(const missing_entries&) = delete;
+    missing_entries(missing_entries&&) noexcept = default;
+    missing_entries& operator=(const missing_entries&) = delete;
+    missing_entries& operator=(missing_entries&&) noexcept = default;
+    ~missing_entries() = default;
+
     /// Adds what is missing between an entry and its parent in the tree.
     void add_above(const LDIF_Entry& entry);
 
@@ -29,12 +36,13 @@ class missing_entries {
   private:
     /// What so many RDNs of a DN name, counted from the root.
     struct ancestor {
-        std::shared_ptr<const LDIF_DN> of;
+        const LDIF_DN* of;
         size_t size;
 
         bool operator<(const ancestor& other) const;
     };
 
+    std::list<LDIF_DN> below_;  // what the others are ancestors of
     std::set<ancestor> found_;
 };
 
