@@ -33,14 +33,34 @@ std::string value_of(int writer, unsigned long update) {
     _exit(1);
 }
 
+/// On a machine with too much to do the others may keep the file for longer than a call waits,
+/// which then has done nothing.
+template <class Call>
+int result_of(Call call) {
+    int code = CFG_BUSY;
+    while (code == CFG_BUSY) {
+        code = call();
+    }
+    return code;
+}
+
+int bind(session& user) {
+    return result_of([&] { return user.bind(); });
+}
+
+int search(session& user, std::set<std::string>& values) {
+    return result_of([&] { return user.search(entry, attribute, values); });
+}
+
 /// Adds values of its own, one at a time.
 void write_values(const configuration_folder& folder, int writer, unsigned long updates) {
     session user(folder.config(), folder.backup());
-    if (user.bind() != CFG_SUCCESS) {
+    if (bind(user) != CFG_SUCCESS) {
         give_up("a writer could not bind", user);
     }
     for (unsigned long i = 0; i < updates; ++i) {
-        if (user.modify({LDAP_MOD_ADD, entry, attribute, {value_of(writer, i)}}) != CFG_SUCCESS) {
+        const attribute_change addition = {LDAP_MOD_ADD, entry, attribute, {value_of(writer, i)}};
+        if (result_of([&] { return user.modify(addition); }) != CFG_SUCCESS) {
             give_up("a writer could not write", user);
         }
     }
@@ -49,7 +69,7 @@ void write_values(const configuration_folder& folder, int writer, unsigned long 
 /// One search; the values may become more than those seen, and never less.
 void look(session& user, std::set<std::string>& seen) {
     std::set<std::string> values;
-    if (user.search(entry, attribute, values) != CFG_SUCCESS) {
+    if (search(user, values) != CFG_SUCCESS) {
         give_up("a reader could not search", user);
     }
     if (!std::includes(values.begin(), values.end(), seen.begin(), seen.end())) {
@@ -69,14 +89,14 @@ volatile sig_atomic_t is_done = 0;
 /// Binds and searches until it is told to end, with a new handle and with one that stays.
 void read_values(const configuration_folder& folder) {
     session lasting(folder.config());
-    if (lasting.bind() != CFG_SUCCESS) {
+    if (bind(lasting) != CFG_SUCCESS) {
         give_up("a reader could not bind", lasting);
     }
     std::set<std::string> seen;
     while (!is_done) {
         const watched_calls calls;
         session user(folder.config());
-        if (user.bind() != CFG_SUCCESS) {
+        if (bind(user) != CFG_SUCCESS) {
             give_up("a reader could not bind", user);
         }
         look(user, seen);
