@@ -60,6 +60,7 @@ const std::set<std::string> harmless = {
     "wcslen",
     "wcstombs",
     // the process: cfg_init() reads the C library's own files of the locale, nothing else
+    "getauxval",
     "pthread_mutex_lock",
     "pthread_mutex_unlock",
     "secure_getenv",

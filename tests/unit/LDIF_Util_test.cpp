@@ -391,6 +391,23 @@ TEST(LDIF_Util, NamesBeyondAsciiHaveHashesOfTheirOwn) {
     EXPECT_NE(cfg32::hash_without_case("ä"), cfg32::hash_without_case("ö"));
 }
 
+TEST(LDIF_Util, HashesOfAFileAreNotThoseOfWhoWroteIt) {
+    constexpr size_t start_of_fnv_1a = 0xcbf29ce484222325;
+    EXPECT_NE(cfg32::hash_seed, start_of_fnv_1a);
+    EXPECT_NE(cfg32::hash_seed, 0u);
+    EXPECT_EQ(cfg32::hash_of_text("cn=A"), cfg32::hash_of_text("cn=A"));
+    EXPECT_NE(cfg32::hash_of_text("cn=A"), cfg32::hash_of_text("cn=a"));
+}
+
+TEST(LDIF_Util, MixedHashesDifferInTheirLowestBits) {
+    std::set<size_t> lowest;
+    for (size_t i = 0; i < 1000; ++i) {
+        lowest.insert(cfg32::mixed_hash()(i << 32) & 0xffff);
+        lowest.insert(cfg32::mixed_hash()(i * 0x10001) & 0xffff);
+    }
+    EXPECT_GT(lowest.size(), 1500u);
+}
+
 TEST(LDIF_Util, HexDigitHasItsValue) {
     std::set<int> found;
     for (wchar_t c = 0; c < 256; ++c) {

@@ -19,7 +19,7 @@ using cfg32::kept_dn;
 namespace {
 
 size_t hash_of(const dn_path& path, size_t from, size_t to) {
-    size_t hash = 0;
+    size_t hash = cfg32::hash_seed;
     for (size_t i = from; i < to; ++i) {
         hash = path.hash(i, hash);
     }

@@ -24,7 +24,7 @@ dn_path path_of(const LDIF_Value& value) {
 
 size_t hash_of_dn(const LDIF_Value& value, hash_kind kind) {
     const dn_path path = path_of(value);
-    size_t hash = 0;
+    size_t hash = hash_seed;
     for (size_t i = 0; i < path.size(); ++i) {
         hash = path.hash(i, hash, kind);
     }

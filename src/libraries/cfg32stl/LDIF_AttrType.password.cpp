@@ -106,7 +106,7 @@ const match_support pw_match{
         // A list of several passwords holds only ones that can be decoded: what fails here is a new
         // one, which a comparison would have on its right.
         const decoded_password password(value, right_not_decoded);
-        return password.clear() ? std::hash<std::string_view>()(password.clear()) : 0;
+        return password.clear() ? hash_of_text(password.clear()) : 0;
     },
     nullptr};
 

@@ -81,8 +81,7 @@ void refuse_with_message(const failure& kind, const char* message, const LDIF_Va
 
 const match_support ces_match{
     [](std::string_view left, std::string_view right) { return left == right; },
-    [](const LDIF_Value& value, hash_kind) { return std::hash<std::string_view>()(value.shown()); },
-    nullptr};
+    [](const LDIF_Value& value, hash_kind) { return hash_of_text(value.shown()); }, nullptr};
 
 const match_support cis_match{[](std::string_view left, std::string_view right) {
                                   return left.empty() == right.empty() &&

@@ -311,7 +311,7 @@ void LDIF_DN::append_to(std::string& out) const {
 
 size_t LDIF_DN::hash() const {
     const hash_kind kind = present_hash_kind();
-    size_t hash = 0;
+    size_t hash = hash_seed;
     for (const LDIF_RDN& rdn : rdns_) {
         hash = rdn.hash(hash, kind);
     }

@@ -1,11 +1,13 @@
 #include "LDIF_Util.h"
 
 #include <strings.h>
+#include <sys/auxv.h>
 
 #include <algorithm>
 #include <array>
 #include <cctype>
 #include <cstdlib>
+#include <cstring>
 #include <cwchar>
 #include <cwctype>
 
@@ -217,6 +219,8 @@ constexpr auto classes_of = [](hash_kind kind) {
     return classes;
 };
 
+constexpr size_t hash_factor = 0x100000001b3;  // of FNV-1a
+
 constexpr byte_classes classes_by_kind[] = {classes_of(hash_kind::of_ascii_letters),
                                             classes_of(hash_kind::of_every_byte)};
 
@@ -226,13 +230,34 @@ hash_kind present_hash_kind() {
     return MB_CUR_MAX > 1 ? hash_kind::of_ascii_letters : hash_kind::of_every_byte;
 }
 
+namespace {
+
+/// The system gives each process some random bytes (getauxval(3), AT_RANDOM).
+size_t random_start() {
+    size_t start = 0;
+    memcpy(&start, reinterpret_cast<const void*>(getauxval(AT_RANDOM)), sizeof start);
+    return start * hash_factor + 1;
+}
+
+}  // namespace
+
+const size_t hash_seed = random_start();
+
+size_t hash_of_text(std::string_view text) {
+    size_t hash = hash_seed;
+    for (const char c : text) {
+        hash = (hash ^ static_cast<unsigned char>(c)) * hash_factor;
+    }
+    return hash;
+}
+
 size_t hash_without_case(std::string_view text, size_t seed, hash_kind kind) {
     const byte_classes& classes = classes_by_kind[static_cast<size_t>(kind)];
-    for (const char c : text) {  // FNV-1a
+    for (const char c : text) {
         if (c == '\0') {
             break;
         }
-        seed = (seed ^ classes[static_cast<unsigned char>(c)]) * 0x100000001b3;
+        seed = (seed ^ classes[static_cast<unsigned char>(c)]) * hash_factor;
     }
     return seed;
 }

@@ -141,12 +141,26 @@ inline bool equal_without_case(std::string_view left, std::string_view right) {
 enum class hash_kind { of_ascii_letters, of_every_byte };
 hash_kind present_hash_kind();
 
+/// Where hashes begin, in each process somewhere else: nobody shall write a file of names that have
+/// one hash.
+extern const size_t hash_seed;
+
 /// A hash that is the same for texts that are equal without regard to case in whichever locale of
 /// that kind; seed continues another hash. Hashes that are kept are all made of one kind: another
 /// thread may change the locale between two of them.
-inline constexpr size_t hash_seed = 0xcbf29ce484222325;
 size_t hash_without_case(std::string_view text, size_t seed = hash_seed,
                          hash_kind kind = present_hash_kind());
+
+/// A hash of a text as it stands.
+size_t hash_of_text(std::string_view text);
+
+/// Makes all of a hash count in its lowest bits, by which tables find a place.
+struct mixed_hash {
+    size_t operator()(size_t hash) const {
+        hash = (hash ^ hash_seed ^ (hash >> 32)) * 0x9e3779b97f4a7c15;
+        return hash ^ (hash >> 32);
+    }
+};
 
 /// The value of a hexadecimal digit, or -1.
 int hex_digit(wchar_t c);

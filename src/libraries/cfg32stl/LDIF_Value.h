@@ -153,7 +153,7 @@ class LDIF_Values {
     // By the values' hashes, where they stand in the list.
     struct hash_index {
         cfg32::hash_kind kind = cfg32::present_hash_kind();
-        std::unordered_multimap<size_t, size_t> positions;
+        std::unordered_multimap<size_t, size_t, cfg32::mixed_hash> positions;
     };
 
     // By where the text stands.

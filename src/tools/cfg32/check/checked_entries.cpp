@@ -188,7 +188,7 @@ void checked_entries::check_ancestors(const checked_entry& entry, const LDIF_DN&
     int count = 0;
     std::vector<size_t> hashes;  // of the ancestors from the root down, and of the DN
     for (const LDIF_RDN& rdn : dn.rdns()) {
-        hashes.push_back(rdn.hash(hashes.empty() ? 0 : hashes.back()));
+        hashes.push_back(rdn.hash(hashes.empty() ? hash_seed : hashes.back()));
     }
     LDIF_DN ancestor = dn;
     while (ancestor.rdns().size() > 1) {
