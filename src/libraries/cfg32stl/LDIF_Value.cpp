@@ -386,7 +386,8 @@ size_t LDIF_Values::indexed_position_of(const LDIF_Value& value) const {
     const hash_index& known = index();
     const auto [first, last] = known.positions.equal_range(hash_of(value, known.kind));
     const auto is_equal = [&](const auto& entry) {
-        return value_of(several_->texts[entry.second]).compare(value) == 0;
+        const kept_text& own = several_->texts[entry.second];
+        return own.has_value() && value_of(own).compare(value) == 0;
     };
     const auto entry = std::find_if(first, last, is_equal);
     return entry == last ? several_->texts.size() : entry->second;
@@ -417,7 +418,8 @@ void LDIF_Values::forget(size_t position) {
     const auto [first, last] = index->positions.equal_range(hash);
     const auto is_it = [&](const auto& entry) { return entry.second == position; };
     const auto entry = std::find_if(first, last, is_it);
-    if (entry != last) {  // another locale may hash its DN otherwise
+    // Another locale may hash its DN otherwise: then its row stays, and leads to a gap.
+    if (entry != last) {
         index->positions.erase(entry);
     }
 }

@@ -19,8 +19,8 @@ bool read_first(int file, size_t count, std::string& bytes);
 
 /// Takes the room that a text of `wanted` bytes needs in the place of the file's present content.
 /// After a failure the file is what it was. Where the file system can't reserve, room is taken by
-/// blank lines at the end; but what will be marked waits for that until it is written, and has only
-/// the place of the mark made: no power cut shall leave half of such lines without the mark.
+/// blank lines at the end; but what will be marked grows only to the mark's size, and the rest when
+/// it is written: no power cut shall leave half of such lines without the mark.
 bool reserve(int file, size_t present, size_t wanted, std::string_view mark = {});
 
 /// Marks are not longer than this.
