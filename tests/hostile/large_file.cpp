@@ -19,6 +19,7 @@ size_t two(size_t) { return 2; }
 size_t each(size_t count) { return count; }
 size_t two_each_but_one(size_t count) { return 2 * count - 1; }
 size_t head_and_each(size_t count) { return count + 1; }
+size_t head_and_two_each(size_t count) { return 2 * count + 1; }
 
 /// Writes a long text in pieces.
 void repeat(std::ostream& out, const std::string& piece, size_t size) {
@@ -117,6 +118,15 @@ void tree(std::ostream& out, size_t count) {
     }
 }
 
+/// Entries below a chain of ancestors that come after them, from the root down.
+void late_ancestors(std::ostream& out, size_t count) {
+    const std::string deepest = deepest_dn(count);
+    for (size_t i = 1; i <= count; ++i) {
+        out << "\ndn: cn=leaf" << i << ", " << deepest << "\ncn: leaf" << i << "\n";
+    }
+    tree(out, count);
+}
+
 std::string wide_dn(size_t count) {
     std::string dn = "a1=1";
     for (size_t i = 2; i <= count; ++i) {
@@ -146,6 +156,7 @@ const std::vector<large_file>& large_files() {
         {"EntriesOfOneName", 10'000, 100'000, same_entries, usual_subject, two, two_each_but_one,
          10},
         {"DeepTree", 300, 10'000, tree, deepest_dn, head_and_each, none, 5},
+        {"LateAncestors", 100, 1'000, late_ancestors, deepest_dn, head_and_two_each, none, 10},
         {"WideName", 10'000, 10'000, wide_rdn, wide_dn, two, one, 48},
     };
     return all;

@@ -172,6 +172,39 @@ TEST(child_index, ManyEntriesMoveUnderAParentThatComesLast) {
     EXPECT_EQ(parent.children().back().relative_dn().str(), "cn=19999");
 }
 
+TEST(child_index, EntriesMoveDownAChainOfParentsThatComesFromTheRoot) {
+    constexpr size_t depth = 60;
+    const auto chain = [](size_t length) {
+        std::string dn = "o=top";
+        for (size_t level = 1; level <= length; ++level) {
+            dn = "ou=" + std::to_string(level) + "," + dn;
+        }
+        return dn;
+    };
+    LDIF_Entry root;
+    // A few of them leave the others on the way, and one is written otherwise.
+    for (const size_t end : {depth, depth / 2, depth, depth - 1, size_t{3}, depth}) {
+        const std::string number = std::to_string(root.children().size());
+        root += LDIF_Entry(dn_of("cn=" + number + "," + chain(end)));
+    }
+    root += LDIF_Entry(dn_of("cn=\"other\"," + chain(depth)));
+    for (size_t level = 0; level <= depth; ++level) {
+        root += LDIF_Entry(dn_of(chain(level)));
+        EXPECT_TRUE(root.find(dn_of("CN=2," + chain(depth)))) << level;
+    }
+    const auto names_below = [&](size_t level) {
+        std::vector<std::string> names;
+        for (const LDIF_Entry& child : root.find(dn_of(chain(level)))->children()) {
+            names.push_back(child.relative_dn().str());
+        }
+        return names;
+    };
+    EXPECT_THAT(names_below(depth), ElementsAre("cn=0", "cn=2", "cn=5", "cn=\"other\""));
+    EXPECT_THAT(names_below(depth - 1), ElementsAre("cn=3", "ou=60"));
+    EXPECT_THAT(names_below(depth / 2), ElementsAre("cn=1", "ou=31"));
+    EXPECT_THAT(names_below(3), ElementsAre("cn=4", "ou=4"));
+}
+
 // A tree needs memory for the square of its depth, so the stack is small instead of the tree deep.
 TEST(child_index, DeepTreeIsBuiltPrintedAndDestroyedWithoutRecursion) {
     on_a_small_stack([] {

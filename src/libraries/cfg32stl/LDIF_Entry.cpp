@@ -157,7 +157,16 @@ void LDIF_Entry::take_descendants_from(LDIF_Entry& parent, const dn_path& dn) {
     if (!index) {
         return;
     }
-    for (const list::iterator descendant : index->descendants(*this, dn)) {
+    const std::vector<list::iterator> descendants = index->descendants(*this, dn);
+    if (children_.empty() && !descendants.empty()) {
+        index_ = index->split(*this, dn, descendants);
+        for (const list::iterator descendant : descendants) {
+            descendant->depth_ += relative_size();
+            children_.splice(children_.end(), parent.children_, descendant);
+        }
+        return;
+    }
+    for (const list::iterator descendant : descendants) {
         list node;
         index->erase(descendant);
         node.splice(node.end(), parent.children_, descendant);

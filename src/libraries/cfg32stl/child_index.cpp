@@ -7,28 +7,6 @@
 
 namespace cfg32 {
 
-namespace {
-
-/// Calls use(hash) with the hash of each root-side part of the child's relative DN but the whole;
-/// returns the hash of that.
-template <class Use>
-size_t for_each_ancestor(const LDIF_Entry& child, const dn_path& path, hash_kind kind, Use use) {
-    size_t hash = 0;
-    for (size_t i = child.depth(); i < path.size(); ++i) {
-        if (i > child.depth()) {
-            use(hash);
-        }
-        hash = path.hash(i, hash, kind);
-    }
-    return hash;
-}
-
-size_t hash_of(const LDIF_Entry& child, const dn_path& path, hash_kind kind) {
-    return for_each_ancestor(child, path, kind, [](size_t) {});
-}
-
-}  // namespace
-
 void hashed_children::insert(size_t hash, position child) {
     if (3 * slots_.size() <= 4 * count_) {
         grow();
@@ -73,35 +51,53 @@ void hashed_children::erase(size_t hash, const LDIF_Entry& child) {
     --count_;
 }
 
+/// Calls use(hash) with the hash of each root-side part of the child's relative DN but the whole;
+/// returns the hash of that.
+template <class Use>
+size_t child_index::for_each_ancestor(const LDIF_Entry& child, const dn_path& path, Use use) const {
+    size_t hash = seed_;
+    for (size_t i = child.depth(); i < path.size(); ++i) {
+        if (i > child.depth()) {
+            use(hash);
+        }
+        hash = path.hash(i, hash, kind_);
+    }
+    return hash;
+}
+
+size_t child_index::hash_of(const LDIF_Entry& child, const dn_path& path) const {
+    return for_each_ancestor(child, path, [](size_t) {});
+}
+
 void child_index::insert(position child, const dn_path& path) {
-    const size_t hash = for_each_ancestor(*child, path, kind_, [&](size_t ancestor) {
+    const size_t hash = for_each_ancestor(*child, path, [&](size_t ancestor) {
         by_ancestor_.emplace(ancestor_place(ancestor, next_ordinal_), child);
     });
     by_dn_.insert(hash, child);
     if (child->relative_size() > 1) {
-        ordinals_.emplace(&*child, next_ordinal_++);
+        late_.emplace(&*child, late_child{next_ordinal_++, hash});
     }
 }
 
 void child_index::erase(position child) {
     const dn_path path(child->named_dn());
-    const auto ordinal = ordinals_.find(&*child);
-    const size_t hash = for_each_ancestor(*child, path, kind_, [&](size_t ancestor) {
-        by_ancestor_.erase(ancestor_place(ancestor, ordinal->second));
+    const auto late = late_.find(&*child);
+    const size_t hash = for_each_ancestor(*child, path, [&](size_t ancestor) {
+        by_ancestor_.erase(ancestor_place(ancestor, late->second.ordinal));
     });
     by_dn_.erase(hash, *child);
-    if (ordinal != ordinals_.end()) {
-        ordinals_.erase(ordinal);
+    if (late != late_.end()) {
+        late_.erase(late);
     }
 }
 
 child_index::position child_index::position_of(const LDIF_Entry& child) const {
     const auto is_child = [&](const LDIF_Entry& own) { return &own == &child; };
-    return *by_dn_.find(hash_of(child, dn_path(child.named_dn()), kind_), is_child);
+    return *by_dn_.find(hash_of(child, dn_path(child.named_dn())), is_child);
 }
 
 LDIF_Entry* child_index::equal_or_ancestor(const dn_path& dn, size_t from) const {
-    size_t hash = 0;
+    size_t hash = seed_;
     for (size_t to = from + 1; to <= dn.size(); ++to) {
         hash = dn.hash(to - 1, hash, kind_);
         const auto is_wanted = [&](const LDIF_Entry& child) {
@@ -120,16 +116,66 @@ std::vector<child_index::position> child_index::descendants(const LDIF_Entry& si
     if (by_ancestor_.empty()) {
         return found;
     }
-    const size_t hash = hash_of(sibling, path, kind_);
+    const auto is_below = [&](const LDIF_Entry& child) {
+        // Mostly it is written alike, and need not be taken apart.
+        return (child.depth() == sibling.depth() &&
+                child.named_dn().ends_with(sibling.named_dn())) ||
+               dn_path(child.named_dn())
+                   .has_equal_part(child.depth(), path, sibling.depth(), sibling.relative_size());
+    };
+    const size_t hash = hash_of(sibling, path);
     for (auto entry = by_ancestor_.lower_bound({hash, 0});
          entry != by_ancestor_.end() && entry->first.first == hash; ++entry) {
-        const LDIF_Entry& child = *entry->second;
-        if (dn_path(child.named_dn())
-                .has_equal_part(child.depth(), path, sibling.depth(), sibling.relative_size())) {
+        if (is_below(*entry->second)) {
             found.push_back(entry->second);
         }
     }
     return found;
+}
+
+std::unique_ptr<child_index> child_index::split(const LDIF_Entry& sibling, const dn_path& path,
+                                                const std::vector<position>& descendants) {
+    const size_t passed = sibling.relative_size();
+    std::vector<size_t> no_longer_missing;
+    const auto pass = [&](size_t ancestor) { no_longer_missing.push_back(ancestor); };
+    const size_t hash = for_each_ancestor(sibling, path, pass);
+    pass(hash);
+
+    std::unique_ptr<child_index> below(new child_index(kind_, hash, next_ordinal_));
+    size_t moved = 0;
+    for (const position child : descendants) {
+        const auto late = late_.find(&*child);
+        for (const size_t ancestor : no_longer_missing) {
+            by_ancestor_.erase({ancestor, late->second.ordinal});
+        }
+        by_dn_.erase(late->second.hash, *child);
+        below->by_dn_.insert(late->second.hash, child);
+        moved += child->relative_size() - passed - 1;
+        if (child->relative_size() - passed > 1) {
+            below->late_.insert(*late);
+        }
+        late_.erase(late);
+    }
+    if (2 * moved > by_ancestor_.size()) {
+        by_ancestor_.swap(below->by_ancestor_);
+        move_ancestors(late_, 0, below->by_ancestor_, by_ancestor_);
+    } else {
+        move_ancestors(below->late_, passed, by_ancestor_, below->by_ancestor_);
+    }
+    return below;
+}
+
+/// Moves what is known of the children's ancestors, but of the first ones.
+void child_index::move_ancestors(const late_children& children, size_t passed,
+                                 places_by_ancestor& from, places_by_ancestor& to) const {
+    for (const auto& [child, late] : children) {
+        size_t size = 0;
+        for_each_ancestor(*child, dn_path(child->named_dn()), [&](size_t ancestor) {
+            if (++size > passed) {
+                to.insert(from.extract({ancestor, late.ordinal}));
+            }
+        });
+    }
 }
 
 }  // namespace cfg32

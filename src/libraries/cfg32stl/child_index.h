@@ -2,6 +2,7 @@
 
 #include <cstddef>
 #include <map>
+#include <memory>
 #include <unordered_map>
 #include <utility>
 #include <vector>
@@ -31,7 +32,7 @@ class hashed_children {
     };
 
     static size_t mark_of(size_t hash) { return hash | 1; }
-    size_t home_of(size_t mark) const { return (mark >> 1) & (slots_.size() - 1); }
+    size_t home_of(size_t mark) const { return mixed_hash()(mark) & (slots_.size() - 1); }
     size_t next(size_t place) const { return (place + 1) & (slots_.size() - 1); }
     void put(const slot& taken);
     void grow();
@@ -46,9 +47,15 @@ class hashed_children {
 /// given DN or an ancestor of it; it is found by looking up the DN's root-side parts. Children that
 /// have ancestors missing (relative DNs of more than one RDN) are also kept by their root-side
 /// parts, so that they are found when such an ancestor turns up.
+///
+/// The ancestor takes them over with what is known of them: its own hash is where the hashes of its
+/// children begin, so these stay what they are, and of the two indexes only the smaller one is made
+/// anew. Thousands of entries may be moved thousands of times.
 class child_index {
   public:
     using position = LDIF_Entry::list::iterator;
+
+    child_index() = default;
 
     /// False when the process has chosen a locale of another kind: then it must be made anew.
     bool is_good() const { return kind_ == present_hash_kind(); }
@@ -68,14 +75,37 @@ class child_index {
     /// its DN.
     std::vector<position> descendants(const LDIF_Entry& sibling, const dn_path& path) const;
 
+    /// Makes these the children of that entry: returns the index that they have there. They still
+    /// have the depth that they had here.
+    std::unique_ptr<child_index> split(const LDIF_Entry& sibling, const dn_path& path,
+                                       const std::vector<position>& descendants);
+
   private:
     // The hash of an ancestor, and the ordinal of the child.
     using ancestor_place = std::pair<size_t, size_t>;
+    using places_by_ancestor = std::map<ancestor_place, position>;
+
+    /// Of a child that has ancestors missing.
+    struct late_child {
+        size_t ordinal;  ///< they stand in that order
+        size_t hash;     ///< of its relative DN
+    };
+    using late_children = std::unordered_map<const LDIF_Entry*, late_child>;
+
+    child_index(hash_kind kind, size_t seed, size_t next_ordinal)
+        : kind_(kind), seed_(seed), next_ordinal_(next_ordinal) {}
+
+    template <class Use>
+    size_t for_each_ancestor(const LDIF_Entry& child, const dn_path& path, Use use) const;
+    size_t hash_of(const LDIF_Entry& child, const dn_path& path) const;
+    void move_ancestors(const late_children& children, size_t passed, places_by_ancestor& from,
+                        places_by_ancestor& to) const;
 
     hash_kind kind_ = present_hash_kind();
+    size_t seed_ = hash_seed;  // where the hash of each relative DN begins
     hashed_children by_dn_;
-    std::map<ancestor_place, position> by_ancestor_;
-    std::unordered_map<const LDIF_Entry*, size_t> ordinals_;  // of the children there, in order
+    places_by_ancestor by_ancestor_;
+    late_children late_;
     size_t next_ordinal_ = 0;
 };
 
