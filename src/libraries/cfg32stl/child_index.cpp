@@ -144,38 +144,56 @@ std::unique_ptr<child_index> child_index::split(const LDIF_Entry& sibling, const
     std::unique_ptr<child_index> below(new child_index(kind_, hash, next_ordinal_));
     size_t moved = 0;
     for (const position child : descendants) {
-        const auto late = late_.find(&*child);
-        for (const size_t ancestor : no_longer_missing) {
-            by_ancestor_.erase({ancestor, late->second.ordinal});
-        }
-        by_dn_.erase(late->second.hash, *child);
-        below->by_dn_.insert(late->second.hash, child);
+        const late_child& late = late_.at(&*child);
+        below->by_dn_.insert(late.hash, child);
+        below->late_.emplace(&*child, late);
         moved += child->relative_size() - passed - 1;
-        if (child->relative_size() - passed > 1) {
-            below->late_.insert(*late);
-        }
-        late_.erase(late);
     }
-    if (2 * moved > by_ancestor_.size()) {
+    const size_t all = by_ancestor_.size() - passed * descendants.size();
+    const bool is_most = 2 * moved > all;
+    const std::vector<ancestor_place> places =
+        is_most ? places_of(late_, 0, below->late_) : places_of(below->late_, passed, {});
+
+    // What needs memory is done: from here on nothing fails.
+    for (const position child : descendants) {
+        const late_child late = late_.at(&*child);
+        for (const size_t ancestor : no_longer_missing) {
+            by_ancestor_.erase({ancestor, late.ordinal});
+        }
+        by_dn_.erase(late.hash, *child);
+        late_.erase(&*child);
+        if (child->relative_size() - passed == 1) {
+            below->late_.erase(&*child);
+        }
+    }
+    if (is_most) {
         by_ancestor_.swap(below->by_ancestor_);
-        move_ancestors(late_, 0, below->by_ancestor_, by_ancestor_);
-    } else {
-        move_ancestors(below->late_, passed, by_ancestor_, below->by_ancestor_);
+    }
+    places_by_ancestor& from = is_most ? below->by_ancestor_ : by_ancestor_;
+    places_by_ancestor& to = is_most ? by_ancestor_ : below->by_ancestor_;
+    for (const ancestor_place& place : places) {
+        to.insert(from.extract(place));
     }
     return below;
 }
 
-/// Moves what is known of the children's ancestors, but of the first ones.
-void child_index::move_ancestors(const late_children& children, size_t passed,
-                                 places_by_ancestor& from, places_by_ancestor& to) const {
+/// Where the children, but some, stand by their missing ancestors, without the first ones.
+std::vector<child_index::ancestor_place> child_index::places_of(const late_children& children,
+                                                                size_t passed,
+                                                                const late_children& but) const {
+    std::vector<ancestor_place> places;
     for (const auto& [child, late] : children) {
+        if (but.count(child) != 0) {
+            continue;
+        }
         size_t size = 0;
         for_each_ancestor(*child, dn_path(child->named_dn()), [&](size_t ancestor) {
             if (++size > passed) {
-                to.insert(from.extract({ancestor, late.ordinal}));
+                places.emplace_back(ancestor, late.ordinal);
             }
         });
     }
+    return places;
 }
 
 }  // namespace cfg32

@@ -98,8 +98,8 @@ class child_index {
     template <class Use>
     size_t for_each_ancestor(const LDIF_Entry& child, const dn_path& path, Use use) const;
     size_t hash_of(const LDIF_Entry& child, const dn_path& path) const;
-    void move_ancestors(const late_children& children, size_t passed, places_by_ancestor& from,
-                        places_by_ancestor& to) const;
+    std::vector<ancestor_place> places_of(const late_children& children, size_t passed,
+                                          const late_children& but) const;
 
     hash_kind kind_ = present_hash_kind();
     size_t seed_ = hash_seed;  // where the hash of each relative DN begins
