@@ -100,15 +100,15 @@ std::string decoder_input(const std::string& stored) {
     return stored.front() == '>' ? std::string(iMASK_BRACED, sizeof iMASK_BRACED) + stored : stored;
 }
 
-const match_support pw_match{
-    nullptr,
-    [](const LDIF_Value& value, hash_kind) {
-        // A list of several passwords holds only ones that can be decoded: what fails here is a new
-        // one, which a comparison would have on its right.
-        const decoded_password password(value, right_not_decoded);
-        return password.clear() ? hash_of_text(password.clear()) : 0;
-    },
-    nullptr};
+const match_support pw_match{nullptr,
+                             [](const LDIF_Value& value, hash_kind) {
+                                 // A list of several passwords holds only ones that can be decoded:
+                                 // what fails here is a new one, which a comparison would have on
+                                 // its right.
+                                 const decoded_password password(value, right_not_decoded);
+                                 return password.clear() ? hash_of_text(password.clear()) : 0;
+                             },
+                             nullptr};
 
 }  // namespace cfg32
 
