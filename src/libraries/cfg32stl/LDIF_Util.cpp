@@ -234,8 +234,11 @@ namespace {
 
 /// The system gives each process some random bytes (getauxval(3), AT_RANDOM).
 size_t random_start() {
-    size_t start = 0;
-    memcpy(&start, reinterpret_cast<const void*>(getauxval(AT_RANDOM)), sizeof start);
+    size_t start = 0xcbf29ce484222325;
+    // NOLINTNEXTLINE(performance-no-int-to-ptr): getauxval() returns pointers, too, as numbers
+    if (const auto* bytes = reinterpret_cast<const void*>(getauxval(AT_RANDOM))) {
+        memcpy(&start, bytes, sizeof start);
+    }
     return start * hash_factor + 1;
 }
 

@@ -187,11 +187,12 @@ std::vector<child_index::ancestor_place> child_index::places_of(const late_child
             continue;
         }
         size_t size = 0;
-        for_each_ancestor(*child, dn_path(child->named_dn()), [&](size_t ancestor) {
+        const auto add = [&, ordinal = late.ordinal](size_t ancestor) {
             if (++size > passed) {
-                places.emplace_back(ancestor, late.ordinal);
+                places.emplace_back(ancestor, ordinal);
             }
-        });
+        };
+        for_each_ancestor(*child, dn_path(child->named_dn()), add);
     }
     return places;
 }
