@@ -79,6 +79,19 @@ TEST(SourceExcerpt, PutsTheMarkerBelowThePlace) {
     }
 }
 
+TEST(SourceExcerpt, ShowsPlacesOfOneLineInAnyOrder) {
+    const file_text file(sixty + "\t" + sixty + "\n" + "cn: x\n");
+    source_excerpts excerpts(file);
+    for (const int column : {1, 61, 62, 121, 62, 30, 130}) {
+        const source_excerpt shown = excerpts.of(problem_at(1, column, 2));
+        const source_excerpt alone = source_excerpts(file).of(problem_at(1, column, 2));
+        EXPECT_EQ(shown.line, alone.line) << column;
+        EXPECT_EQ(shown.indent, alone.indent) << column;
+        EXPECT_EQ(shown.marker, alone.marker) << column;
+    }
+    EXPECT_EQ(excerpts.of(problem_at(2, 1, 2)).line, "cn: x");
+}
+
 TEST(SourceExcerpt, HidesAPasswordThatGoesOnOnTheNextLine) {
     const file_text file("cn: a\n b\noru-slapdAdminPW: sec\n r\n et");
     source_excerpts excerpts(file);
