@@ -272,6 +272,7 @@ const row rows[] = {
     {"\xef\xbb\xbf# a comment\n" + begun + "oru-slapdPort: x\n", {"1:1 byte-order-mark", "7:16 invalid-value"}},
     {"\xef\xbb\xbfversion: x\n" + top, {"1:1 byte-order-mark", "1:2 attribute-outside-entry", "1:11 invalid-value"}},
     {"\xef\xbb\xbf\xef\xbb\xbf" + top, {"1:1 byte-order-mark", "1:2 byte-order-mark"}},
+    {"\xef\xbb\xbf\xef\xbb\xbf\xef\xbb\xbfversion: x\n" + top, {"1:1 byte-order-mark", "1:2 byte-order-mark", "1:3 byte-order-mark", "1:4 attribute-outside-entry", "1:13 invalid-value"}},
     {"\xef\xbb\xbf", {"1:1 byte-order-mark", "1:2 missing-configuration"}},
     // Nothing of a hidden password's length shows.
     {begun + "oru-slapdAdminPW: secret", {"6:19 missing-final-newline"}},

@@ -117,21 +117,24 @@ std::vector<problem> problems_of_lines(std::string_view text, aes_key_data* key)
 
 }  // namespace
 
-/// Behind a byte order mark everything is judged as if the mark were not there.
+/// Behind byte order marks everything is judged as if they were not there.
 std::vector<problem> find_problems(std::string_view text, aes_key_data* key) {
-    if (!text.starts_with(byte_order_mark)) {
-        return problems_of_lines(text, key);
-    }
-    std::vector<problem> problems = find_problems(text.substr(byte_order_mark.size()), key);
     const int width = count_characters(byte_order_mark);
-    for (problem& each : problems) {
-        each.column += each.line == 1 ? width : 0;
+    int begin = 1;  // the column behind the marks
+    findings marks;
+    for (; text.starts_with(byte_order_mark); begin += width) {
+        marks
+            .add(kind::byte_order_mark, {1, begin, width},
+                 "byte order mark, which becomes part of the first name: remove it")
+            .accepted = "UTF-8 without a byte order mark";
+        text.remove_prefix(byte_order_mark.size());
     }
-    findings mark;
-    mark.add(kind::byte_order_mark, {1, 1, width},
-             "byte order mark, which becomes part of the first name: remove it")
-        .accepted = "UTF-8 without a byte order mark";
-    problems.insert(problems.begin(), std::move(mark.all().front()));
+    std::vector<problem> problems = problems_of_lines(text, key);
+    for (problem& each : problems) {
+        each.column += each.line == 1 ? begin - 1 : 0;
+    }
+    problems.insert(problems.begin(), std::move_iterator(marks.all().begin()),
+                    std::move_iterator(marks.all().end()));
     return problems;
 }
 
