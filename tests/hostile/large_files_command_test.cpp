@@ -106,6 +106,20 @@ TEST(Check, ShowsAPartOfALongLineInAFewTimesItsMemory) {
     EXPECT_LT(share_of(text, [&] { EXPECT_LT(tool::text_report(files).size(), 500U); }), 16);
 }
 
+TEST(Check, HoldsALongNameOnceForAllProblemsOfItsEntry) {
+    double share[2] = {};
+    for (const size_t factor : {1, 4}) {
+        std::string text =
+            head + "\ndn: cn=" + std::string(20'000 * factor, 'n') + ", cn=Configuration\n";
+        for (size_t i = 0; i < 250 * factor; ++i) {
+            text += "name" + std::to_string(i) + ": n\nline" + std::string(1, '\0') + "\n";
+        }
+        share[factor / 4] = share_of(
+            text, [&] { EXPECT_GE(tool::find_problems(text, nullptr).size(), 500 * factor); });
+    }
+    EXPECT_LT(share[1], share[0] * 2);
+}
+
 TEST_P(large_text, IsCheckedOnASmallStack) {
     static const large_text* that;
     that = this;

@@ -402,7 +402,7 @@ TEST(FindProblems, TellsTheCodesOfAValue) {
     EXPECT_EQ(found.result, 21);
     EXPECT_EQ(found.extended, 1015);
     EXPECT_EQ(found.width, 5);
-    EXPECT_EQ(found.entry, "cn=Configuration");
+    EXPECT_EQ(found.entry.str(), "cn=Configuration");
     EXPECT_EQ(found.attribute, "oru-slapdPort");
 }
 
@@ -516,7 +516,8 @@ TEST(FindProblems, PutsNoPasswordIntoATextOfAProblem) {
     const std::vector<problem> problems = find_problems(text, nullptr);
     EXPECT_GE(problems.size(), 8U);
     for (const problem& each : problems) {
-        for (const std::string& part : {each.text, each.entry, each.attribute, each.accepted}) {
+        for (const std::string& part :
+             {each.text, each.entry.str(), each.attribute, each.accepted}) {
             EXPECT_THAT(part, testing::Not(HasSubstr("secret"))) << each.broken->id;
         }
     }

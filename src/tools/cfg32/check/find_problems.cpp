@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <iterator>
+#include <unordered_map>
 
 #include "LDIF_Line.h"
 #include "check/file_text.h"
@@ -108,9 +109,14 @@ std::vector<problem> problems_of_lines(std::string_view text, aes_key_data* key)
     const bool is_cut_off = !text.empty() && text.back() != '\n';
     std::vector<problem> problems =
         is_cut_off ? cut_off_text(text, key).problems() : problem_finder(text, key).run();
+    std::unordered_map<const std::string*, shared_text> entries;  // by where the written ones stand
     for (problem& each : problems) {
         each.text = shown_text(each.text);
-        each.entry = shown_text(each.entry);
+        const auto [shown, is_new] = entries.try_emplace(&each.entry.str());
+        if (is_new) {
+            shown->second = shared_text(shown_text(each.entry.str()));
+        }
+        each.entry = shown->second;
     }
     return problems;
 }
