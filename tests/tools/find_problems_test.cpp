@@ -258,6 +258,7 @@ const row rows[] = {
     {begun + "oru-slapdSuffix: dc=\xff, b\n", {"6:21 invalid-bytes", "6:25 invalid-value"}},
     {begun + "nuv-instanceDesc:: \xff\n", {"6:20 invalid-bytes", "6:20 literal-base64"}},
     {begun + "nuv-instanceDesc: \xff", {"6:19 invalid-bytes", "6:20 missing-final-newline"}},
+    {begun + "nuv-instanceDesc: x\n v\xff\n v\n v\xff\xff", {"7:3 invalid-bytes", "9:3 invalid-bytes", "9:5 missing-final-newline"}},
     {begun + "nuv-instanceDesc: J\xc3\xb6rg\noru-slapdPort: \xc3\xb6\n", {"7:16 invalid-value"}},
     {begun + "n\xc3\xb6: \xc3\xb6\nn\xc3\xb6:: \xc3\xb6\n", {"6:1 unknown-attribute", "7:1 unknown-attribute", "7:6 literal-base64", "7:6 duplicate-value"}},
     // The line before the last fails.
