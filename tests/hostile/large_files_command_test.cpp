@@ -9,6 +9,7 @@
 #include <sstream>
 
 #include "LDIF_File.h"
+#include "check/check_report.h"
 #include "check/problem.h"
 #include "command_line.h"
 #include "diff/difference.h"
@@ -78,9 +79,48 @@ int run_unseen(std::vector<std::string> words) {
 }
 
 const std::vector<std::vector<std::string>> readings = {
-    {"search"}, {"search", "--json"}, {"tree"}, {"tree", "--json"}, {"check", "--json"}};
+    {"search"}, {"search", "--json"}, {"tree"}, {"tree", "--json"}, {"check"}, {"check", "--json"}};
+
+const std::string head = "charset: UTF-8\nversion: 1\n\ndn: cn=Configuration\ncn: Configuration\n";
 
 }  // namespace
+
+TEST(Check, TellsEveryByteOrderMarkOnASmallStack) {
+    on_a_small_stack([] {
+        constexpr size_t count = 20'000;
+        std::string text;
+        for (size_t i = 0; i < count; ++i) {
+            text += tool::byte_order_mark;
+        }
+        const std::vector<tool::problem> problems = tool::find_problems(text + head, nullptr);
+        ASSERT_EQ(problems.size(), count);
+        EXPECT_EQ(problems.back().column, static_cast<int>(count));
+        EXPECT_EQ(tool::loadable_part(text + head, problems), head);
+    });
+}
+
+TEST(Check, ShowsAPartOfALongLineInAFewTimesItsMemory) {
+    for (const std::string front : {"", "note: "}) {
+        const std::string text = head + front + std::string(1'000'000, 'l') + "\n";
+        const std::vector<tool::checked_file> files = {
+            {"conf", text, tool::find_problems(text, nullptr)}};
+        EXPECT_LT(share_of(text, [&] { EXPECT_LT(tool::text_report(files).size(), 500U); }), 16);
+    }
+}
+
+TEST(Check, HoldsALongNameOnceForAllProblemsOfItsEntry) {
+    double share[2] = {};
+    for (const size_t factor : {1, 4}) {
+        std::string text =
+            head + "\ndn: cn=" + std::string(20'000 * factor, 'n') + ", cn=Configuration\n";
+        for (size_t i = 0; i < 250 * factor; ++i) {
+            text += "name" + std::to_string(i) + ": n\nline" + std::string(1, '\0') + "\n";
+        }
+        share[factor / 4] = share_of(
+            text, [&] { EXPECT_GE(tool::find_problems(text, nullptr).size(), 500 * factor); });
+    }
+    EXPECT_LT(share[1], share[0] * 2);
+}
 
 TEST_P(large_text, IsCheckedOnASmallStack) {
     static const large_text* that;

@@ -79,6 +79,19 @@ TEST(SourceExcerpt, PutsTheMarkerBelowThePlace) {
     }
 }
 
+TEST(SourceExcerpt, ShowsPlacesOfOneLineInAnyOrder) {
+    const file_text file(sixty + "\t" + sixty + "\n" + "cn: x\n");
+    source_excerpts excerpts(file);
+    for (const int column : {1, 61, 62, 121, 62, 30, 130}) {
+        const source_excerpt shown = excerpts.of(problem_at(1, column, 2));
+        const source_excerpt alone = source_excerpts(file).of(problem_at(1, column, 2));
+        EXPECT_EQ(shown.line, alone.line) << column;
+        EXPECT_EQ(shown.indent, alone.indent) << column;
+        EXPECT_EQ(shown.marker, alone.marker) << column;
+    }
+    EXPECT_EQ(excerpts.of(problem_at(2, 1, 2)).line, "cn: x");
+}
+
 TEST(SourceExcerpt, HidesAPasswordThatGoesOnOnTheNextLine) {
     const file_text file("cn: a\n b\noru-slapdAdminPW: sec\n r\n et");
     source_excerpts excerpts(file);
@@ -110,7 +123,7 @@ checked_file two_problems() {
         problem_at(1, 5, 1, kind::duplicate_value, "stands\ntwice: 100%, \x01"));
     file.problems.push_back(problem_at(2, 16, 5));
     file.problems.back().accepted = "an integer";
-    file.problems.back().entry = "cn=M\xfcnchen";
+    file.problems.back().entry = shared_text("cn=M\xfcnchen");
     file.problems.back().attribute = "oru-slapdPort";
     file.problems.back().result = 21;
     file.problems.back().extended = 1015;
@@ -156,8 +169,14 @@ TEST(TextReport, IsColouredWhenAsked) {
     EXPECT_THAT(report, HasSubstr("^~~~~\x1b[0m"));
 }
 
+std::string json_of(const std::vector<checked_file>& files) {
+    std::string all;
+    json_report(files, [&](std::string_view piece) { all += piece; });
+    return all;
+}
+
 TEST(JsonReport, HoldsWhatIsKnown) {
-    const auto report = nlohmann::json::parse(json_report({two_problems(), {"b", "", {}}}));
+    const auto report = nlohmann::json::parse(json_of({two_problems(), {"b", "", {}}}));
     ASSERT_EQ(report["files"].size(), 2U);
     EXPECT_EQ(report["files"][0]["file"], "a b/100%:ö,.conf");
     EXPECT_EQ(report["files"][1]["problems"], nlohmann::json::array());
@@ -166,7 +185,18 @@ TEST(JsonReport, HoldsWhatIsKnown) {
         "text": "Wrong", "line": 2, "column": 16, "width": 5,
         "entry": "cn=M\ufffdnchen", "attribute": "oru-slapdPort", "accepted": "an integer",
         "result": 21, "extended": 1015})"));
-    EXPECT_EQ(nlohmann::json::parse(json_report({})), nlohmann::json::parse(R"({"files": []})"));
+    EXPECT_EQ(nlohmann::json::parse(json_of({})), nlohmann::json::parse(R"({"files": []})"));
+}
+
+TEST(JsonReport, ComesInPiecesOfOneProblemAndIsLaidOutAsAWhole) {
+    checked_file file = two_problems();
+    file.problems[1].accepted = std::string(1000, 'a') + "\n\"";
+    for (const auto& files : std::vector<std::vector<checked_file>>{
+             {}, {{"b", "", {}}}, {file, file, {"b", "", {}}, file}}) {
+        const std::string whole = json_of(files);
+        EXPECT_EQ(whole, nlohmann::ordered_json::parse(whole).dump(2) + "\n");
+        json_report(files, [](std::string_view piece) { EXPECT_LT(piece.size(), 1500U); });
+    }
 }
 
 TEST(SarifReport, HasWhatTheFormatRequires) {

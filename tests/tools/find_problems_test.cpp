@@ -258,6 +258,7 @@ const row rows[] = {
     {begun + "oru-slapdSuffix: dc=\xff, b\n", {"6:21 invalid-bytes", "6:25 invalid-value"}},
     {begun + "nuv-instanceDesc:: \xff\n", {"6:20 invalid-bytes", "6:20 literal-base64"}},
     {begun + "nuv-instanceDesc: \xff", {"6:19 invalid-bytes", "6:20 missing-final-newline"}},
+    {begun + "nuv-instanceDesc: x\n v\xff\n v\n v\xff\xff", {"7:3 invalid-bytes", "9:3 invalid-bytes", "9:5 missing-final-newline"}},
     {begun + "nuv-instanceDesc: J\xc3\xb6rg\noru-slapdPort: \xc3\xb6\n", {"7:16 invalid-value"}},
     {begun + "n\xc3\xb6: \xc3\xb6\nn\xc3\xb6:: \xc3\xb6\n", {"6:1 unknown-attribute", "7:1 unknown-attribute", "7:6 literal-base64", "7:6 duplicate-value"}},
     // The line before the last fails.
@@ -272,6 +273,7 @@ const row rows[] = {
     {"\xef\xbb\xbf# a comment\n" + begun + "oru-slapdPort: x\n", {"1:1 byte-order-mark", "7:16 invalid-value"}},
     {"\xef\xbb\xbfversion: x\n" + top, {"1:1 byte-order-mark", "1:2 attribute-outside-entry", "1:11 invalid-value"}},
     {"\xef\xbb\xbf\xef\xbb\xbf" + top, {"1:1 byte-order-mark", "1:2 byte-order-mark"}},
+    {"\xef\xbb\xbf\xef\xbb\xbf\xef\xbb\xbfversion: x\n" + top, {"1:1 byte-order-mark", "1:2 byte-order-mark", "1:3 byte-order-mark", "1:4 attribute-outside-entry", "1:13 invalid-value"}},
     {"\xef\xbb\xbf", {"1:1 byte-order-mark", "1:2 missing-configuration"}},
     // Nothing of a hidden password's length shows.
     {begun + "oru-slapdAdminPW: secret", {"6:19 missing-final-newline"}},
@@ -401,7 +403,7 @@ TEST(FindProblems, TellsTheCodesOfAValue) {
     EXPECT_EQ(found.result, 21);
     EXPECT_EQ(found.extended, 1015);
     EXPECT_EQ(found.width, 5);
-    EXPECT_EQ(found.entry, "cn=Configuration");
+    EXPECT_EQ(found.entry.str(), "cn=Configuration");
     EXPECT_EQ(found.attribute, "oru-slapdPort");
 }
 
@@ -515,7 +517,8 @@ TEST(FindProblems, PutsNoPasswordIntoATextOfAProblem) {
     const std::vector<problem> problems = find_problems(text, nullptr);
     EXPECT_GE(problems.size(), 8U);
     for (const problem& each : problems) {
-        for (const std::string& part : {each.text, each.entry, each.attribute, each.accepted}) {
+        for (const std::string& part :
+             {each.text, each.entry.str(), each.attribute, each.accepted}) {
             EXPECT_THAT(part, testing::Not(HasSubstr("secret"))) << each.broken->id;
         }
     }

@@ -13,9 +13,10 @@ namespace cfg32::tool {
 
 namespace {
 
-/// What stays of a problem when lines above it come and go.
+/// What stays of a problem, which must outlive it, when lines above it come and go.
 auto identity_of(const problem& each) {
-    return std::tuple(each.broken, each.entry, each.attribute);
+    return std::tuple(each.broken, std::string_view(each.attribute),
+                      std::string_view(each.entry.str()));
 }
 
 using identities = std::multiset<decltype(identity_of(problem()))>;
@@ -81,7 +82,8 @@ std::string edited_text::with(const std::string& draft) const {
 
 edited_text::findings edited_text::check(const std::string& draft, aes_key_data* key) const {
     findings found{{}, {}, true};
-    identities old = identities_of(find_problems(before_, key));
+    const std::vector<problem> before = find_problems(before_, key);
+    identities old = identities_of(before);
     const std::vector<problem> all = find_problems(with(draft), key);
     found.is_loadable = can_be_loaded(all);
     const bool is_whole_file = end_ - begin_ == before_.size();

@@ -24,7 +24,10 @@ constexpr int clear_text = 1;  // answer of check_format
 const cisString kept_line_attribute = "oru-slapdInvalidLine";
 
 /// What people put between a name and a value.
-constexpr std::string_view separators = ":;,=< \t\v\f";
+constexpr bool is_separator(char c) {
+    return c == ':' || c == ';' || c == ',' || c == '=' || c == '<' || c == ' ' || c == '\t' ||
+           c == '\v' || c == '\f';
+}
 
 /// What hides a password says how it is stored: an encrypted or hashed text hides itself.
 std::string shown_password(const std::string& stored) {
@@ -43,7 +46,15 @@ struct meant_line {
 };
 
 size_t behind_separators(std::string_view text, size_t begin) {
-    return std::min(text.find_first_not_of(separators, begin), text.size());
+    const auto end =
+        std::find_if_not(text.begin() + static_cast<ptrdiff_t>(begin), text.end(), is_separator);
+    return static_cast<size_t>(end - text.begin());
+}
+
+/// What stands before the first separator.
+std::string_view first_word(std::string_view line) {
+    const auto end = std::find_if(line.begin(), line.end(), is_separator);
+    return line.substr(0, static_cast<size_t>(end - line.begin()));
 }
 
 /// Where a name may end, each told from the line's front.
@@ -51,7 +62,7 @@ struct line_parts {
     explicit line_parts(std::string_view text)
         : begin(behind_separators(text, leading_space(text))),
           line(text.substr(begin)),
-          word(line.substr(0, line.find_first_of(separators))),
+          word(first_word(line)),
           run(line.substr(0, line.find_first_not_of(keyChar))),
           has_colon(line.find(':') != std::string_view::npos),
           name(without_trailing_space(line.substr(0, line.find(':')))) {}
@@ -141,33 +152,40 @@ std::optional<size_t> hidden_from(std::string_view text, int kept_in) {
     return is_visible ? std::nullopt : std::optional(line.value);
 }
 
+bool is_letter_or_digit(char c) { return is_ascii(c) && isalnum(static_cast<unsigned char>(c)); }
+
+/// True when the last letters and digits of the text are those of the name, whatever else stands
+/// between them.
+bool ends_with_letters(std::string_view text, std::string_view small_name) {
+    for (; !text.empty() && !small_name.empty(); text.remove_suffix(1)) {
+        if (is_letter_or_digit(text.back())) {
+            if (lower(text.back()) != small_name.back()) {
+                return false;
+            }
+            small_name.remove_suffix(1);
+        }
+    }
+    return small_name.empty();
+}
+
 /// Where a password begins whose name stands anywhere in a line: the line before was not ended, a
 /// name was broken by what no name has. A colon or "=" follows the name.
 std::optional<size_t> behind_any_name(std::string_view text) {
-    if (text.find_first_of(":=") == std::string_view::npos) {
-        return {};
-    }
-    std::string letters;
-    std::vector<size_t> places;
-    for (size_t i = 0; i < text.size(); ++i) {
-        if (is_ascii(text[i]) && isalnum(static_cast<unsigned char>(text[i]))) {
-            letters += text[i];
-            places.push_back(i);
+    for (size_t end = 0; end < text.size(); ++end) {
+        if (text[end] != ':' && text[end] != '=') {
+            continue;
+        }
+        std::string_view before = text.substr(0, end);
+        before = before.substr(0, before.find_last_not_of(" \t\"'") + 1);
+        const auto is_before = [&](const std::string& name) {
+            return ends_with_letters(before, name);
+        };
+        if (!before.empty() && is_letter_or_digit(before.back()) &&
+            std::any_of(known_passwords().begin(), known_passwords().end(), is_before)) {
+            return behind_separators(text, end);
         }
     }
-    letters = lower(letters);
-    std::optional<size_t> first;
-    for (const std::string& name : known_passwords()) {
-        for (size_t at = letters.find(name); at != std::string::npos;
-             at = letters.find(name, at + 1)) {
-            const size_t end = places[at + name.size() - 1] + 1;
-            const size_t next = text.find_first_not_of(" \t\"'", end);
-            if (next != std::string_view::npos && (text[next] == ':' || text[next] == '=')) {
-                first = std::min(behind_separators(text, next), first.value_or(text.size()));
-            }
-        }
-    }
-    return first;
+    return {};
 }
 
 /// A line of a text, without what stands behind any password's name.

@@ -23,8 +23,7 @@ bool is_password_attribute(std::string_view name) {
 
 std::string lower(std::string_view text) {
     std::string small(text);
-    std::transform(small.begin(), small.end(), small.begin(),
-                   [](char c) { return c >= 'A' && c <= 'Z' ? static_cast<char>(c | 0x20) : c; });
+    std::transform(small.begin(), small.end(), small.begin(), [](char c) { return lower(c); });
     return small;
 }
 

@@ -12,7 +12,8 @@ namespace cfg32::tool {
 /// True for the attributes whose values are passwords.
 bool is_password_attribute(std::string_view name);
 
-/// The ASCII letters in lower case.
+/// ASCII letters in lower case.
+constexpr char lower(char c) { return c >= 'A' && c <= 'Z' ? static_cast<char>(c | 0x20) : c; }
 std::string lower(std::string_view text);
 
 /// Where the first word ends that names of passwords have in them; none without one. The text is in

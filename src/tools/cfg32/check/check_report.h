@@ -2,7 +2,9 @@
 
 // How problems are printed.
 
+#include <functional>
 #include <string>
+#include <string_view>
 #include <vector>
 
 #include "check/problem.h"
@@ -19,10 +21,13 @@ struct checked_file {
     std::vector<problem> problems;
 };
 
+using report_printer = std::function<void(std::string_view piece)>;
+
 /// For people, as compilers print: "file:line:column: error: text [rule]", the line with a caret
 /// under the place, and what would be accepted. Coloured if standard output is.
 std::string text_report(const std::vector<checked_file>& files);
-std::string json_report(const std::vector<checked_file>& files);
+/// In pieces: all of it may be much longer than the files, as each problem names its entry.
+void json_report(const std::vector<checked_file>& files, const report_printer& print);
 /// SARIF 2.1.0, for code-scanning services.
 std::string sarif_report(const std::vector<checked_file>& files);
 /// The workflow commands of GitHub Actions.

@@ -56,7 +56,7 @@ void checked_entries::add(entry_section& section, LDIF_Attribute&& attribute, in
 }
 
 void checked_entries::report_second_value(const LDIF_Attribute& attribute, int line,
-                                          const std::string& entry) {
+                                          const shared_text& entry) {
     if (!attribute.values().type()->isSingle || attribute.values().size() < 2) {
         return;
     }

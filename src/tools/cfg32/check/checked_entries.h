@@ -21,7 +21,7 @@ using checked_attributes = std::map<cisString, LDIF_Attribute>;
 /// A DN line and the attribute lines below it.
 struct entry_section {
     LDIF_DN dn;
-    std::string written;  ///< the DN as it is written
+    shared_text written;  ///< the DN as it is written
     place where{};        ///< of the DN
     int first = 0;        ///< the DN line
     int last = 0;         ///< line of the last attribute
@@ -52,9 +52,9 @@ class checked_entries {
     /// Taken apart, a DN takes many times the room of its text, so it is read again where it is
     /// asked for.
     struct checked_entry {
-        LDIF_DN dn() const { return LDIF_DN(cisString(written)); }
+        LDIF_DN dn() const { return LDIF_DN(cisString(written.str())); }
 
-        std::string written;
+        shared_text written;
         place where;
         checked_attributes attributes;
         struct lines {
@@ -69,7 +69,7 @@ class checked_entries {
     checked_entry* find(const LDIF_DN& dn, size_t hash);
     void merge(checked_entry& known, entry_section& section);
     void merge(LDIF_Attribute& known, const LDIF_Attribute& again, const entry_section& section);
-    void report_second_value(const LDIF_Attribute& attribute, int line, const std::string& entry);
+    void report_second_value(const LDIF_Attribute& attribute, int line, const shared_text& entry);
     void check_ancestors(const checked_entry& entry, const LDIF_DN& dn);
     void check_writing(const checked_entry& entry, const LDIF_DN& dn);
     std::string why_unwritable(const checked_entry& entry, const LDIF_DN& dn) const;

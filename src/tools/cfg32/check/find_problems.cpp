@@ -2,6 +2,8 @@
 
 #include <algorithm>
 #include <iterator>
+#include <map>
+#include <unordered_map>
 
 #include "LDIF_Line.h"
 #include "check/file_text.h"
@@ -32,7 +34,7 @@ class cut_off_text {
   private:
     bool is_at_end(const problem& each) const { return each.line >= line_; }
     LDIF_Line cut_off_line() const;
-    void take_what_is_loaded(problem& meant);
+    void take_what_is_loaded();
     problem missing_newline(const LDIF_Line& line) const;
 
     const file_text file_;
@@ -40,6 +42,7 @@ class cut_off_text {
     const int line_;  // where the last logical line begins
     std::vector<problem> loaded_;
     std::vector<problem> meant_;
+    std::multimap<const rule*, const problem*> rest_;  // of the loaded ones at the end
 };
 
 std::vector<problem> cut_off_text::problems() {
@@ -49,7 +52,7 @@ std::vector<problem> cut_off_text::problems() {
         return loaded_;
     }
     std::erase_if(meant_, [&](const problem& each) { return !is_at_end(each); });
-    std::for_each(meant_.begin(), meant_.end(), [&](problem& each) { take_what_is_loaded(each); });
+    take_what_is_loaded();
     meant_.push_back(missing_newline(line));
     std::erase_if(loaded_, [&](const problem& each) { return is_at_end(each); });
     std::move(meant_.begin(), meant_.end(), std::back_inserter(loaded_));
@@ -69,19 +72,24 @@ LDIF_Line cut_off_text::cut_off_line() const {
 }
 
 /// A load may see the same in what is left of the line. Each of its problems is taken once.
-void cut_off_text::take_what_is_loaded(problem& meant) {
-    const auto same = std::find_if(loaded_.begin(), loaded_.end(), [&](const problem& each) {
-        return is_at_end(each) && each.broken == meant.broken;
-    });
-    if (same == loaded_.end()) {
-        meant.own_outcome = consequence::none;
-        meant.result = meant.extended = 0;
-        meant.first_left_out = meant.last_left_out = 0;
-        return;
+void cut_off_text::take_what_is_loaded() {
+    for (const problem& each : loaded_) {
+        if (is_at_end(each)) {
+            rest_.emplace(each.broken, &each);
+        }
     }
-    meant.first_left_out = same->first_left_out;
-    meant.last_left_out = same->last_left_out;
-    loaded_.erase(same);
+    for (problem& each : meant_) {
+        const auto same = rest_.lower_bound(each.broken);
+        if (same == rest_.end() || same->first != each.broken) {
+            each.own_outcome = consequence::none;
+            each.result = each.extended = 0;
+            each.first_left_out = each.last_left_out = 0;
+            continue;
+        }
+        each.first_left_out = same->second->first_left_out;
+        each.last_left_out = same->second->last_left_out;
+        rest_.erase(same);
+    }
 }
 
 /// What a load finds wrong with the rest of the line is the missing newline's fault.
@@ -92,13 +100,11 @@ problem cut_off_text::missing_newline(const LDIF_Line& line) const {
         made.add(kind::missing_final_newline, {last, count_characters(file_.line(last)) + 1, 1},
                  "last line has no newline at its end: its value is not used");
     found.attribute = line.type == LDIF_Line::attr ? shown_line(line.attribute) : "";
-    for (const problem& each : loaded_) {
-        if (is_at_end(each)) {
-            found.own_outcome = std::max(found.outcome(), each.outcome());
-            found.result = std::max(found.result, each.result);
-            found.first_left_out = std::max(found.first_left_out, each.first_left_out);
-            found.last_left_out = std::max(found.last_left_out, each.last_left_out);
-        }
+    for (const auto& [broken, each] : rest_) {
+        found.own_outcome = std::max(found.outcome(), each->outcome());
+        found.result = std::max(found.result, each->result);
+        found.first_left_out = std::max(found.first_left_out, each->first_left_out);
+        found.last_left_out = std::max(found.last_left_out, each->last_left_out);
     }
     shown_lines(file_).hide_length(found);
     return found;
@@ -108,30 +114,38 @@ std::vector<problem> problems_of_lines(std::string_view text, aes_key_data* key)
     const bool is_cut_off = !text.empty() && text.back() != '\n';
     std::vector<problem> problems =
         is_cut_off ? cut_off_text(text, key).problems() : problem_finder(text, key).run();
+    std::unordered_map<const std::string*, shared_text> entries;  // by where the written ones stand
     for (problem& each : problems) {
         each.text = shown_text(each.text);
-        each.entry = shown_text(each.entry);
+        const auto [shown, is_new] = entries.try_emplace(&each.entry.str());
+        if (is_new) {
+            shown->second = shared_text(shown_text(each.entry.str()));
+        }
+        each.entry = shown->second;
     }
     return problems;
 }
 
 }  // namespace
 
-/// Behind a byte order mark everything is judged as if the mark were not there.
+/// Behind byte order marks everything is judged as if they were not there.
 std::vector<problem> find_problems(std::string_view text, aes_key_data* key) {
-    if (!text.starts_with(byte_order_mark)) {
-        return problems_of_lines(text, key);
-    }
-    std::vector<problem> problems = find_problems(text.substr(byte_order_mark.size()), key);
     const int width = count_characters(byte_order_mark);
-    for (problem& each : problems) {
-        each.column += each.line == 1 ? width : 0;
+    int begin = 1;  // the column behind the marks
+    findings marks;
+    for (; text.starts_with(byte_order_mark); begin += width) {
+        marks
+            .add(kind::byte_order_mark, {1, begin, width},
+                 "byte order mark, which becomes part of the first name: remove it")
+            .accepted = "UTF-8 without a byte order mark";
+        text.remove_prefix(byte_order_mark.size());
     }
-    findings mark;
-    mark.add(kind::byte_order_mark, {1, 1, width},
-             "byte order mark, which becomes part of the first name: remove it")
-        .accepted = "UTF-8 without a byte order mark";
-    problems.insert(problems.begin(), std::move(mark.all().front()));
+    std::vector<problem> problems = problems_of_lines(text, key);
+    for (problem& each : problems) {
+        each.column += each.line == 1 ? begin - 1 : 0;
+    }
+    problems.insert(problems.begin(), std::move_iterator(marks.all().begin()),
+                    std::move_iterator(marks.all().end()));
     return problems;
 }
 

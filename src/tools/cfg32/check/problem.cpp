@@ -50,10 +50,11 @@ std::string loadable_part(std::string_view text, const std::vector<problem>& pro
         text.remove_prefix(length);
     }
     // What stood above such a line may be what was left out.
-    while (part.starts_with(unfinished_mark)) {
-        part.erase(0, unfinished_mark.size());
+    size_t begin = 0;
+    while (std::string_view(part).substr(begin).starts_with(unfinished_mark)) {
+        begin += unfinished_mark.size();
     }
-    return part;
+    return part.erase(0, begin);
 }
 
 }  // namespace cfg32::tool

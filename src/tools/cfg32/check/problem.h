@@ -7,6 +7,8 @@
 #include <string_view>
 #include <vector>
 
+#include "check/shared_text.h"
+
 struct aes_key_data;
 
 namespace cfg32::tool {
@@ -38,7 +40,7 @@ struct problem {
     int line;               ///< counted from 1
     int column;             ///< of the first character concerned, counted from 1
     int width;              ///< how many characters are concerned, at least 1
-    std::string entry;      ///< DN as it is written, or empty
+    shared_text entry;      ///< DN as it is written, or empty
     std::string attribute;  ///< name, or empty
     std::string accepted;   ///< what would be accepted instead, in words, or empty
     int result = 0;         ///< LDAP result code that a load or a change would give, 0 for none

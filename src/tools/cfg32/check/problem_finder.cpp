@@ -91,7 +91,7 @@ bool problem_finder::is_unreadable() {
     for (auto line = first; line != last; ++line) {
         line->second->first_left_out = line_.lineNumber;
         line->second->last_left_out = last_;
-        line->second->entry = open_ ? open_->written : "";
+        line->second->entry = open_ ? open_->written : shared_text();
     }
     return first != last;
 }
@@ -116,7 +116,7 @@ void problem_finder::dn_line() {
     has_dn_line_ = true;
     const bool is_readable = !is_unreadable();
     open_.emplace();
-    open_->written = line_.value;
+    open_->written = shared_text(line_.value);
     open_->where = value_place();
     open_->first = line_.lineNumber;
     open_->last = last_;
@@ -187,7 +187,7 @@ void problem_finder::require_headers() {
 
 problem& problem_finder::add(const rule& broken, const place& where, std::string text) {
     problem& found = found_.add(broken, where, std::move(text));
-    found.entry = open_ ? open_->written : "";
+    found.entry = open_ ? open_->written : shared_text();
     const bool has_name = line_.type == LDIF_Line::attr && line_.hasSeparator;
     found.attribute = has_name ? shown_line(line_.attribute) : "";
     return found;

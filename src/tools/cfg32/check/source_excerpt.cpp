@@ -5,9 +5,6 @@
 #include <wchar.h>
 
 #include <algorithm>
-#include <iterator>
-#include <utility>
-#include <vector>
 
 #include "LDIF_Util.h"
 #include "hidden_passwords.h"
@@ -23,7 +20,7 @@ constexpr std::string_view cut = "...";
 
 /// A character on the screen.
 struct cell {
-    std::string text;
+    std::string_view text;
     size_t width;  // in columns
 };
 
@@ -35,92 +32,100 @@ bool misleads(wchar_t code) {
 }
 
 cell shown(const character& next, size_t column) {
+    constexpr std::string_view blanks = "        ";
+    static_assert(blanks.size() == tab_stop);
     if (next.is_valid && next.code == L'\t') {
         const size_t width = tab_stop - column % tab_stop;
-        return {std::string(width, ' '), width};
+        return {blanks.substr(0, width), width};
     }
     const int width = next.is_valid && !misleads(next.code) ? wcwidth(next.code) : -1;
     if (width < 0 || next.code == L'\0') {
         return {"?", 1};
     }
-    return {std::string(next.bytes), static_cast<size_t>(width)};
+    return {next.bytes, static_cast<size_t>(width)};
 }
 
-std::vector<cell> cells_of(std::string_view text) {
-    std::vector<cell> cells;
-    size_t column = 0;
-    while (!text.empty()) {
-        const character next = first_character(text);
-        cells.push_back(shown(next, column));
-        column += cells.back().width;
-        text.remove_prefix(next.bytes.size());
-    }
-    return cells;
+/// Goes over the next character of a line. Returns what is shown of it.
+std::string_view pass(std::string_view line, place_on_screen& at) {
+    const character next = first_character(line.substr(at.bytes));
+    const cell passed = shown(next, at.columns);
+    at.bytes += next.bytes.size();
+    at.characters += 1;
+    at.columns += passed.width;
+    return passed.text;
 }
 
-using position = std::vector<cell>::const_iterator;
-
-size_t width_of(position first, position last) {
-    size_t width = 0;
-    for (; first != last; ++first) {
-        width += first->width;
+bool fits(std::string_view line) {
+    place_on_screen end;
+    while (end.bytes < line.size() && end.columns <= longest_shown) {
+        pass(line, end);
     }
-    return width;
-}
-
-std::string text_of(position first, position last) {
-    std::string text;
-    for (; first != last; ++first) {
-        text += first->text;
-    }
-    return text;
-}
-
-/// All of a line, or what surrounds the place in a long one.
-std::pair<position, position> shown_part(const std::vector<cell>& cells, position place) {
-    if (width_of(cells.begin(), cells.end()) <= longest_shown) {
-        return {cells.begin(), cells.end()};
-    }
-    position first = place;
-    size_t width = 0;
-    while (first != cells.begin() && width + std::prev(first)->width <= shown_before) {
-        width += (--first)->width;
-    }
-    position last = place;
-    while (last != cells.end() && width + last->width <= longest_shown) {
-        width += (last++)->width;
-    }
-    return {first, last};
+    return end.columns <= longest_shown;
 }
 
 }  // namespace
 
 std::string harmless(std::string_view text) {
-    const std::vector<cell> cells = cells_of(text);
-    return text_of(cells.begin(), cells.end());
+    std::string shown;
+    for (place_on_screen at; at.bytes < text.size();) {
+        shown += pass(text, at);
+    }
+    return shown;
 }
 
-source_excerpt source_excerpts::of(const problem& shown_problem) {
-    std::string line = lines_.at(shown_problem.line);
-    const bool is_hidden = line != file_.line(shown_problem.line);
-    if (!is_hidden && line.ends_with('\r')) {
-        line.pop_back();
+void source_excerpts::look_at(int number) {
+    if (number == number_) {
+        return;
     }
-    const std::vector<cell> cells = cells_of(line);
+    number_ = number;
+    line_ = lines_.at(number);
+    const bool is_hidden = line_ != file_.line(number);
+    if (!is_hidden && line_.ends_with('\r')) {
+        line_.pop_back();
+    }
+    visible_ = static_cast<size_t>(count_characters(line_)) - (is_hidden ? hidden_text.size() : 0);
+    fits_ = fits(line_);
+    first_ = place_ = {};
+}
+
+void source_excerpts::go_to(size_t character) {
+    if (character < place_.characters) {
+        first_ = place_ = {};
+    }
+    while (place_.characters < character) {
+        pass(line_, place_);
+        while (!fits_ && place_.columns - first_.columns > shown_before) {
+            pass(line_, first_);
+        }
+    }
+}
+
+source_excerpt source_excerpts::of(const problem& shown) {
+    look_at(shown.line);
+    const size_t at = std::min(static_cast<size_t>(shown.column) - 1, visible_);
+    go_to(at);
     // What reaches into a hidden value is marked as all of it: not even its length shows.
-    const size_t hidden = is_hidden ? cells.size() - hidden_text.size() : cells.size();
-    const size_t at = std::min(static_cast<size_t>(shown_problem.column) - 1, hidden);
-    const size_t behind = at + static_cast<size_t>(shown_problem.width);
-    const position place = cells.begin() + static_cast<ptrdiff_t>(at);
-    const position end =
-        behind > hidden ? cells.end() : cells.begin() + static_cast<ptrdiff_t>(behind);
-    const auto [first, last] = shown_part(cells, place);
-    const std::string before(first == cells.begin() ? "" : cut);
-    const std::string after(last == cells.end() ? "" : cut);
-    const size_t marked = width_of(place, std::min(end, last));
+    const size_t behind = at + static_cast<size_t>(shown.width);
+    const size_t end = behind > visible_ ? line_.size() : behind;
+    std::string text;
+    size_t marked = 0;
+    place_on_screen last = first_;
+    while (last.bytes < line_.size()) {
+        place_on_screen next = last;
+        const std::string_view added = pass(line_, next);
+        if (next.columns - first_.columns > longest_shown) {
+            break;
+        }
+        text += added;
+        last = next;
+        const bool is_marked = last.characters > at && last.characters <= end;
+        marked = is_marked ? last.columns - place_.columns : marked;
+    }
+    const std::string_view before = first_.bytes == 0 ? "" : cut;
+    const std::string_view after = last.bytes == line_.size() ? "" : cut;
     source_excerpt result;
-    result.line = before + text_of(first, last) + after;
-    result.indent = std::string(before.size() + width_of(first, place), ' ');
+    result.line = std::string(before).append(text).append(after);
+    result.indent = std::string(before.size() + place_.columns - first_.columns, ' ');
     result.marker = "^" + std::string(marked > 1 ? marked - 1 : 0, '~');
     return result;
 }

@@ -20,11 +20,21 @@ namespace cfg32::tool {
 
 namespace {
 
-using report_format = std::string (*)(const std::vector<checked_file>&);
+void print(std::string_view text) { fwrite(text.data(), 1, text.size(), stdout); }
+
+template <std::string (*report)(const std::vector<checked_file>&)>
+void print_whole(const std::vector<checked_file>& files) {
+    print([&] {
+        const progress reporting("Putting the report together");
+        return report(files);
+    }());
+}
+
+void print_json(const std::vector<checked_file>& files) { json_report(files, print); }
 
 struct arguments {
     std::vector<std::string> files;
-    report_format report = text_report;
+    void (*print_report)(const std::vector<checked_file>&) = print_whole<text_report>;
 };
 
 /// ".cfg32-", 16 hexadecimal digits, ".tmp": what a backup is called until it is complete.
@@ -99,11 +109,7 @@ int check(const settings& options, const arguments& given) {
             files.push_back(std::move(*file));
         }
     }
-    const std::string report = [&] {
-        const progress reporting("Putting the report together");
-        return (options.is_json ? json_report : given.report)(files);
-    }();
-    fwrite(report.data(), 1, report.size(), stdout);
+    (options.is_json ? print_json : given.print_report)(files);
     if (files.size() < names.size()) {
         return failed;
     }
@@ -118,11 +124,11 @@ action define_check(CLI::App& parser, settings& options) {
     const auto given = std::make_shared<arguments>();
     add_argument(parser, "file", "FILE", "what to check; else the configuration file",
                  given->files);
-    add_format(parser, "how to print the problems; else text", given->report,
-               {{"text", text_report},
-                {"json", json_report},
-                {"sarif", sarif_report},
-                {"github", github_report}});
+    add_format(parser, "how to print the problems; else text", given->print_report,
+               {{"text", print_whole<text_report>},
+                {"json", print_json},
+                {"sarif", print_whole<sarif_report>},
+                {"github", print_whole<github_report>}});
     return [given, &options] { return check(options, *given); };
 }
 
