@@ -12,6 +12,7 @@
 #include "check/problem.h"
 #include "command_line.h"
 #include "diff/difference.h"
+#include "diff/unified_diff.h"
 #include "environment.h"
 #include "failing_new.h"
 #include "large_file.h"
@@ -77,8 +78,9 @@ int run_unseen(std::vector<std::string> words) {
     return tool::run_command_line(static_cast<int>(arguments.size()), arguments.data());
 }
 
-const std::vector<std::vector<std::string>> readings = {
-    {"search"}, {"search", "--json"}, {"tree"}, {"tree", "--json"}, {"check", "--json"}};
+const std::vector<std::vector<std::string>> readings = {{"search"},         {"search", "--json"},
+                                                        {"search", "cn=*"}, {"tree"},
+                                                        {"tree", "--json"}, {"check", "--json"}};
 
 }  // namespace
 
@@ -132,6 +134,22 @@ TEST_P(large_text, FourTimesAsLongIsPrintedForNoMoreThanItsShareOfMemory) {
         }
         EXPECT_LT(share[1], share[0] * 2) << testing::PrintToString(reading);
     }
+}
+
+TEST(LongContinuedLine, FourTimesAsLongIsDiffedForNoMoreThanItsShareOfMemory) {
+    const auto continued = [](size_t count, const char* line) {
+        std::string text = "note: " + std::string(count, 'n') + "\n";
+        for (size_t i = 0; i < count; ++i) {
+            text += line;
+        }
+        return text;
+    };
+    const auto share_of_diff = [&](size_t count) {
+        const std::string before = continued(count, " v\n");
+        const std::string after = continued(count, " w\n");
+        return share_of(before, [&] { tool::unified_diff(before, after, "conf"); });
+    };
+    EXPECT_LT(share_of_diff(4000), share_of_diff(1000) * 2);
 }
 
 INSTANTIATE_TEST_SUITE_P(of, large_text, testing::ValuesIn(large_files()),
