@@ -152,5 +152,25 @@ TEST(LongContinuedLine, FourTimesAsLongIsDiffedForNoMoreThanItsShareOfMemory) {
     EXPECT_LT(share_of_diff(4000), share_of_diff(1000) * 2);
 }
 
+TEST(RecordsThatFailInTheMiddle, FourTimesAsManyAreLeftOutForNoMoreThanTheirShareOfMemory) {
+    const temporary_folder folder;
+    const auto share_of_records = [&](size_t count) {
+        const std::string subject = "dn: cn=Configuration\nchangetype: modify\nadd: list\nlist: ";
+        std::string records;
+        for (size_t i = 0; i < count; ++i) {
+            const std::string number = std::to_string(i);
+            records.append(subject).append(number).append("\n-\n\n");
+            records.append(subject).append("no " + number).append("\n-\ndelete: none\n-\n\n");
+        }
+        const std::string conf =
+            folder.write("conf", "dn: cn=Configuration\ncn: Configuration\n\n");
+        const std::string ldif = folder.write("ldif", records);
+        return share_of(records, [&] {
+            EXPECT_EQ(run_unseen({"cfg32", "-f", conf, "modify", "-c", "-l", ldif}), 3);
+        });
+    };
+    EXPECT_LT(share_of_records(400), share_of_records(100) * 2);
+}
+
 INSTANTIATE_TEST_SUITE_P(of, large_text, testing::ValuesIn(large_files()),
                          [](const auto& info) { return std::string(info.param.name); });

@@ -8,6 +8,7 @@
 
 #include "LDIF_File.h"
 #include "cfg32.h"
+#include "change/former_attributes.h"
 #include "failure.h"
 #include "outcome.h"
 #include "password.h"
@@ -51,7 +52,7 @@ auto with_place(const record_source& source, const change_record& record, Body b
         }
         throw refused_record{
             report(placed, source.text.empty() ? source.configuration : source.text),
-            record.kind == change_record::modify && e.ldapErr != CFG_NO_SUCH_OBJECT};
+            e.sysErrno != 0};
     }
 }
 
@@ -178,19 +179,30 @@ bool is_needed(const LDIF_Entry& entry, const modification& change, bool may_be_
                     : !values.empty();
 }
 
-/// Carries out the modifications that are needed.
-bool modify(LDIF_File& file, const LDIF_DN& dn, const change_record& record, bool may_be_gone,
-            aes_key_data* key) {
+/// Carries out the modifications that are needed: all of them or, where the update goes on without
+/// the record, none.
+bool modify(LDIF_File& file, const LDIF_DN& dn, const change_record& record,
+            const update_options& how, aes_key_data* key) {
     const LDIF_Entry* entry = file.root().find(dn);
     if (!entry) {
         raise(no_entry);
     }
+    // The tree is not constant; it is only not given away.
+    former_attributes former(const_cast<LDIF_Entry&>(*entry).attributes());
     bool is_changed = false;
-    for (const modification& change : record.modifications) {
-        if (is_needed(*entry, change, may_be_gone, key)) {
-            file.modify(dn, library_changes({&change, 1}).records());
-            is_changed = true;
+    try {
+        for (const modification& change : record.modifications) {
+            if (is_needed(*entry, change, how.may_be_gone, key)) {
+                if (how.goes_on) {
+                    former.keep(change, &change == &record.modifications.back());
+                }
+                file.modify(dn, library_changes({&change, 1}).records());
+                is_changed = true;
+            }
         }
+    } catch (const LDIF_Exception&) {
+        former.put_back();
+        throw;
     }
     return is_changed;
 }
@@ -243,7 +255,7 @@ bool carry_out(LDIF_File& file, const change_record& record, const update_option
             case change_record::add:
                 return add(file, dn, record, how.merges, key);
             case change_record::modify:
-                return modify(file, dn, record, how.may_be_gone, key);
+                return modify(file, dn, record, how, key);
             case change_record::remove:
                 break;
         }
