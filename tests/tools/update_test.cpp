@@ -2,6 +2,8 @@
 
 #include <gmock/gmock.h>
 #include <sys/file.h>
+#include <sys/resource.h>
+#include <unistd.h>
 
 #include <filesystem>
 #include <fstream>
@@ -19,6 +21,7 @@
 #include "open_regular.h"
 #include "outcome.h"
 #include "temporary_folder.h"
+#include "unique_fd.h"
 
 namespace cfg32::tool {
 
@@ -607,6 +610,20 @@ TEST_F(update_test, AFileThatDoesNotLoadIsNamedWithAHint) {
     EXPECT_THAT(message,
                 testing::EndsWith("\n  hint: `cfg32 check` tells everything that is wrong"));
     EXPECT_EQ(file(), before);
+}
+
+TEST_F(update_test, AFailureOfTheSystemWhileLoadingIsToldAsThat) {
+    folder.write("conf", small);
+    rlimit before{};
+    ASSERT_EQ(getrlimit(RLIMIT_NOFILE, &before), 0);
+    // Room for the private copy, but not to open it.
+    const auto next = static_cast<rlim_t>(unique_fd(dup(STDIN_FILENO)).get());
+    const rlimit one_more{next + 1, before.rlim_max};
+    ASSERT_EQ(setrlimit(RLIMIT_NOFILE, &one_more), 0);
+    const std::string message =
+        failure_of("dn: cn=b, cn=a, cn=Configuration\nchangetype: delete\n");
+    ASSERT_EQ(setrlimit(RLIMIT_NOFILE, &before), 0);
+    EXPECT_EQ(message, options.file + ": Too many open files [Connection error (91)]");
 }
 
 TEST_F(update_test, AMissingFileIsAConnectionError) {
