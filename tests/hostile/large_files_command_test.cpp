@@ -172,5 +172,21 @@ TEST(RecordsThatFailInTheMiddle, FourTimesAsManyAreLeftOutForNoMoreThanTheirShar
     EXPECT_LT(share_of_records(400), share_of_records(100) * 2);
 }
 
+// Together their DNs are hundreds of times as long as the file.
+TEST(MissingAncestors, AreToldOneByOne) {
+    const temporary_folder folder;
+    std::string text = "dn: ";
+    for (int i = 0; i < 1000; ++i) {
+        text += "cn=" + std::to_string(i) + ", ";
+    }
+    text += "cn=Configuration\ncn: 0\n\ndn: cn=Configuration\ncn: Configuration\n\n";
+    const std::string conf = folder.write("conf", text);
+    for (const char* option : {"--style=unicode", "--style=ascii", "--json"}) {
+        failing_allocation::take_largest();
+        EXPECT_EQ(run_unseen({"cfg32", "-f", conf, "tree", option}), 0);
+        EXPECT_LT(failing_allocation::take_largest(), 20 * text.size()) << option;
+    }
+}
+
 INSTANTIATE_TEST_SUITE_P(of, large_text, testing::ValuesIn(large_files()),
                          [](const auto& info) { return std::string(info.param.name); });

@@ -2,7 +2,8 @@
 
 #include "json_text.h"
 
-#include <cstdio>
+#include <iomanip>
+#include <iostream>
 #include <nlohmann/json.hpp>
 #include <unordered_map>
 
@@ -43,10 +44,7 @@ json json_of(const std::vector<problem>& left_out) {
 
 }  // namespace
 
-void print_json(const json& value) {
-    const std::string text = value.dump(2) + "\n";
-    fwrite(text.data(), 1, text.size(), stdout);
-}
+void print_json(const json& value) { std::cout << std::setw(2) << value << "\n"; }
 
 void print_objects(json entries, const configuration& file) {
     print_json({{"file", utf8(file.name())},
