@@ -9,15 +9,17 @@
 
 namespace cfg32::tool {
 
-/// What modifications do to the attributes of an entry, so that it can be undone. Of an attribute
-/// to which values are added there is no copy: a list may be long, and its new values come last.
+/// What modifications do to the attributes of an entry, so that it can be undone for no more than
+/// they cost themselves. A list may be long: of one to which values are added there is no copy,
+/// because they come last, and one from which some are removed is not copied either.
 class former_attributes {
   public:
     explicit former_attributes(LDIF_Attributes& present) : present_(present) {}
 
     /// Comes before each modification. is_last: none follows that could fail.
     void keep(const modification& change, bool is_last);
-    void put_back();
+    /// Returns false when not all can be put back; then nothing is.
+    bool put_back();
 
   private:
     struct former {
@@ -28,6 +30,7 @@ class former_attributes {
     };
 
     LDIF_Attributes& present_;
+    bool is_complete_ = true;
     std::vector<former> former_;
     // What is kept already: for additions, for everything.
     std::set<cisString> counted_;

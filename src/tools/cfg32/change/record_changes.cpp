@@ -39,9 +39,10 @@ int line_of(const change_record& record, const LDIF_Exception& e) {
     return line;
 }
 
-/// Runs body; what the library refuses is told with its line.
+/// Runs body; what the library refuses is told with its line. is_half_done: what body says of it.
 template <class Body>
-auto with_place(const record_source& source, const change_record& record, Body body) {
+auto with_place(const record_source& source, const change_record& record, Body body,
+                const bool& is_half_done = false) {
     try {
         return body();
     } catch (const LDIF_Exception& e) {
@@ -52,7 +53,7 @@ auto with_place(const record_source& source, const change_record& record, Body b
         }
         throw refused_record{
             report(placed, source.text.empty() ? source.configuration : source.text),
-            e.sysErrno != 0};
+            is_half_done || e.sysErrno != 0};
     }
 }
 
@@ -179,10 +180,9 @@ bool is_needed(const LDIF_Entry& entry, const modification& change, bool may_be_
                     : !values.empty();
 }
 
-/// Carries out the modifications that are needed: all of them or, where the update goes on without
-/// the record, none.
+/// Carries out the modifications that are needed: all of them or, unless is_half_done is set, none.
 bool modify(LDIF_File& file, const LDIF_DN& dn, const change_record& record,
-            const update_options& how, aes_key_data* key) {
+            const update_options& how, aes_key_data* key, bool& is_half_done) {
     const LDIF_Entry* entry = file.root().find(dn);
     if (!entry) {
         raise(no_entry);
@@ -201,7 +201,7 @@ bool modify(LDIF_File& file, const LDIF_DN& dn, const change_record& record,
             }
         }
     } catch (const LDIF_Exception&) {
-        former.put_back();
+        is_half_done = !how.goes_on || !former.put_back();
         throw;
     }
     return is_changed;
@@ -249,18 +249,20 @@ void check_record(const change_record& record, const record_source& source, aes_
 
 bool carry_out(LDIF_File& file, const change_record& record, const update_options& how,
                const record_source& source, aes_key_data* key) {
-    return with_place(source, record, [&] {
+    bool is_half_done = false;
+    const auto body = [&] {
         const LDIF_DN dn = dn_of(record);
         switch (record.kind) {
             case change_record::add:
                 return add(file, dn, record, how.merges, key);
             case change_record::modify:
-                return modify(file, dn, record, how, key);
+                return modify(file, dn, record, how, key, is_half_done);
             case change_record::remove:
                 break;
         }
         return erase(file, dn, how.deletes_trees);
-    });
+    };
+    return with_place(source, record, body, is_half_done);
 }
 
 }  // namespace cfg32::tool
