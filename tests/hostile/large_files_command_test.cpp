@@ -13,6 +13,7 @@
 #include "check/problem.h"
 #include "command_line.h"
 #include "diff/difference.h"
+#include "diff/unified_diff.h"
 #include "environment.h"
 #include "failing_new.h"
 #include "large_file.h"
@@ -79,7 +80,8 @@ int run_unseen(std::vector<std::string> words) {
 }
 
 const std::vector<std::vector<std::string>> readings = {
-    {"search"}, {"search", "--json"}, {"tree"}, {"tree", "--json"}, {"check"}, {"check", "--json"}};
+    {"search"}, {"search", "--json"}, {"search", "cn=*"},  //
+    {"tree"},   {"tree", "--json"},   {"check"},          {"check", "--json"}};
 
 const std::string head = "charset: UTF-8\nversion: 1\n\ndn: cn=Configuration\ncn: Configuration\n";
 
@@ -171,6 +173,58 @@ TEST_P(large_text, FourTimesAsLongIsPrintedForNoMoreThanItsShareOfMemory) {
             share[factor / 4] = share_of(text, [&] { EXPECT_LE(run_unseen(words), 1); });
         }
         EXPECT_LT(share[1], share[0] * 2) << testing::PrintToString(reading);
+    }
+}
+
+TEST(LongContinuedLine, FourTimesAsLongIsDiffedForNoMoreThanItsShareOfMemory) {
+    const auto continued = [](size_t count, const char* line) {
+        std::string text = "note: " + std::string(count, 'n') + "\n";
+        for (size_t i = 0; i < count; ++i) {
+            text += line;
+        }
+        return text;
+    };
+    const auto share_of_diff = [&](size_t count) {
+        const std::string before = continued(count, " v\n");
+        const std::string after = continued(count, " w\n");
+        return share_of(before, [&] { tool::unified_diff(before, after, "conf"); });
+    };
+    EXPECT_LT(share_of_diff(4000), share_of_diff(1000) * 2);
+}
+
+TEST(RecordsThatFailInTheMiddle, FourTimesAsManyAreLeftOutForNoMoreThanTheirShareOfMemory) {
+    const temporary_folder folder;
+    const auto share_of_records = [&](size_t count) {
+        const std::string subject = "dn: cn=Configuration\nchangetype: modify\nadd: list\nlist: ";
+        std::string records;
+        for (size_t i = 0; i < count; ++i) {
+            const std::string number = std::to_string(i);
+            records.append(subject).append(number).append("\n-\n\n");
+            records.append(subject).append("no " + number).append("\n-\ndelete: none\n-\n\n");
+        }
+        const std::string conf =
+            folder.write("conf", "dn: cn=Configuration\ncn: Configuration\n\n");
+        const std::string ldif = folder.write("ldif", records);
+        return share_of(records, [&] {
+            EXPECT_EQ(run_unseen({"cfg32", "-f", conf, "modify", "-c", "-l", ldif}), 3);
+        });
+    };
+    EXPECT_LT(share_of_records(400), share_of_records(100) * 2);
+}
+
+// Together their DNs are hundreds of times as long as the file.
+TEST(MissingAncestors, AreToldOneByOne) {
+    const temporary_folder folder;
+    std::string text = "dn: ";
+    for (int i = 0; i < 1000; ++i) {
+        text += "cn=" + std::to_string(i) + ", ";
+    }
+    text += "cn=Configuration\ncn: 0\n\ndn: cn=Configuration\ncn: Configuration\n\n";
+    const std::string conf = folder.write("conf", text);
+    for (const char* option : {"--style=unicode", "--style=ascii", "--json"}) {
+        failing_allocation::take_largest();
+        EXPECT_EQ(run_unseen({"cfg32", "-f", conf, "tree", option}), 0);
+        EXPECT_LT(failing_allocation::take_largest(), 20 * text.size()) << option;
     }
 }
 

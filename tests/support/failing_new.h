@@ -3,6 +3,7 @@
 // Exhausted memory on demand: the operators new of the test program can be told to fail. They are
 // weak, so that every test file may include this header.
 
+#include <algorithm>
 #include <cstddef>
 #include <cstdlib>
 #include <new>
@@ -48,11 +49,14 @@ class failing_allocation {
     static long count() { return count_; }
     /// Bytes that this thread has asked for in all.
     static size_t bytes() { return bytes_; }
+    /// The most that this thread has asked for at once since this was asked before.
+    static size_t take_largest() { return std::exchange(largest_, 0); }
 
     /// For the operators new.
     static void* allocate(size_t size) {
         ++count_;
         bytes_ += size;
+        largest_ = std::max(largest_, size);
         if (left_ == 0) {
             is_over_ = true;
             left_ = is_lasting_ ? 0 : never;
@@ -67,6 +71,7 @@ class failing_allocation {
     static inline thread_local long left_ = never;
     static inline thread_local long count_ = 0;
     static inline thread_local size_t bytes_ = 0;
+    static inline thread_local size_t largest_ = 0;
     static inline thread_local bool is_lasting_ = false;
     static inline thread_local bool is_over_ = false;
 };

@@ -159,7 +159,7 @@ Text that the locale has no characters for is told as that:
 
 Two attributes whose names hide a password, and so look the same, both show their values:
 
-    $ printf 'dn: cn=Configuration\noru-slapdAdminPW one: 1\noru-slapdAdminPW two: 2\n' > meet.conf
+    $ printf 'dn: cn=Configuration\noru-slapdAdminPW one: 1\noru-slapdAdminPW two: 2\nz: 3\n' > meet.conf
     $ cfg32 -f meet.conf --json search
     {
       "file": "meet.conf",
@@ -170,6 +170,9 @@ Two attributes whose names hide a password, and so look the same, both show thei
             "oru-slapdAdminPW ********": [
               "********",
               "********"
+            ],
+            "z": [
+              "3"
             ]
           }
         }

@@ -81,12 +81,32 @@ TEST(UnifiedDiff, ShowsNoPassword) {
          "@@ -1 +0,0 @@\n-oru-slapdAdminPW: ********\n\\ No newline at end of file\n"},
         {"an encrypted one hides itself, folded as well", "oru-slapdAdminPW: {AES256}EKY\n CnJ\n",
          "x\n", "@@ -1,2 +1 @@\n-oru-slapdAdminPW: {AES256}EKY\n- CnJ\n+x\n"},
+        {"nor far from its name", "oru-slapdAdminPW: s\n e\n c\n r\n e\n t\n x\na\n",
+         "oru-slapdAdminPW: t\n e\n c\n r\n e\n t\n y\na\n",
+         "@@ -1,8 +1,8 @@\n-oru-slapdAdminPW: ********\n+oru-slapdAdminPW: ********\n"
+         "  ********\n  ********\n  ********\n  ********\n  ********\n"
+         "- ********\n+ ********\n a\n"},
+        {"nor where only a late change is shown", "oru-slapdAdminPW: s\n e\n c\n r\n e\n t\na\n",
+         "oru-slapdAdminPW: s\n e\n c\n r\n e\n x\na\n",
+         "@@ -3,5 +3,5 @@\n  ********\n  ********\n  ********\n- ********\n+ ********\n a\n"},
+        {"nor after another line that goes on", "cn: a\n b\noru-slapdAdminPW: s\n t\ncn: c\n d\n",
+         "cn: x\n y\noru-slapdAdminPW: s\n t\ncn: e\n f\n",
+         "@@ -1,6 +1,6 @@\n-cn: a\n- b\n+cn: x\n+ y\n oru-slapdAdminPW: ********\n  ********\n"
+         "-cn: c\n- d\n+cn: e\n+ f\n"},
         {"and other lines are shown", "cn: a\n  b\n", "x\n", "@@ -1,2 +1 @@\n-cn: a\n-  b\n+x\n"},
     };
     for (const auto& row : rows) {
         SCOPED_TRACE(row.promise);
         EXPECT_EQ(diff(row.before, row.after), head + row.expected);
     }
+}
+
+TEST(UnifiedDiff, HidesWhatContinuesALineThatIsTooLongToBeJudgedEachTime) {
+    const std::string shown = "note: " + std::string(1000, 'n') + "\n";
+    const std::string unseen = "note: " + std::string(2000, 'n') + "\n";
+    EXPECT_THAT(diff(shown + " v\n", shown + " w\n"), testing::EndsWith("\n- v\n+ w\n"));
+    EXPECT_THAT(diff(unseen + " v\n", unseen + " w\n"),
+                testing::EndsWith("\n- ********\n+ ********\n"));
 }
 
 TEST(UnifiedDiff, IsColouredForPeopleOnly) {

@@ -2,11 +2,14 @@
 
 #include <gmock/gmock.h>
 #include <sys/file.h>
+#include <sys/resource.h>
+#include <unistd.h>
 
 #include <filesystem>
 #include <fstream>
 #include <functional>
 #include <iterator>
+#include <random>
 
 #include "LDIF_Exception.h"
 #include "LDIF_File.h"
@@ -18,6 +21,7 @@
 #include "open_regular.h"
 #include "outcome.h"
 #include "temporary_folder.h"
+#include "unique_fd.h"
 
 namespace cfg32::tool {
 
@@ -479,6 +483,84 @@ TEST_F(update_test, GoesOnWithoutTheRecordsThatFail) {
     EXPECT_EQ(dry.skipped.size(), result.skipped.size());
 }
 
+namespace {
+
+/// Of another form than a write's, so that what is put back is not what was read.
+const std::string unsorted = [] {
+    std::string text =
+        "version: 1\n# above all\ncharset: x\n\n# first\ndn: CN=Configuration\n"
+        "# of the password\noru-slapdAdminPW: {AES256}EKYCnJ\nX-List: a\ncn: Configuration\n"
+        "# of a list\nx-list: b\n  c\noru-slapdsuffix: O=X , c=y\noru-slapdInvalidLine: no colon\n"
+        "oru-slapdPort: 0389\n\ndn: cn=a, cn=Configuration\ncn: a\n# a long one\n";
+    for (int i = 0; i < 120; ++i) {  // too many to be copied
+        text += "X-LIST: " + std::to_string(i) + "\n";
+    }
+    return text + "\n# the end\n";
+}();
+
+modification random_modification(std::mt19937& random) {
+    // What an attribute may get: values that it has, others, and what is refused.
+    const struct {
+        const char* name;
+        std::vector<std::string> values;
+    } rows[] = {
+        {"x-list", {"a", "b c", "0", "7", "19", "new", "newer", " unreadable"}},
+        {"X-New", {"a", "b", "c", " unreadable"}},
+        {"oru-slapdPort", {"389", "1", "2"}},
+        {"ORU-slapdSuffix", {"o=x, c=y", "o=z", "c=y"}},
+        {"oru-slapdAdminPW", {"{AES256}EKYCnJ", "{SHA}unknown"}},
+        {"charset", {"x", "y"}},
+    };
+    const auto& row = rows[random() % std::size(rows)];
+    modification change;
+    change.kind = static_cast<modification::operation>(random() % 3);
+    change.attribute = row.name;
+    const bool may_be_none = change.kind != modification::add;
+    for (size_t count = random() % 3 + (may_be_none ? 0 : 1); count > 0; --count) {
+        change.values.push_back(row.values[random() % row.values.size()]);
+    }
+    return change;
+}
+
+std::vector<change_record> random_records(std::mt19937& random) {
+    constexpr const char* dns[] = {"", "cn=Configuration", "cn=a, cn=Configuration", "cn=none"};
+    std::vector<change_record> records(12);
+    for (change_record& record : records) {
+        record.dn = dns[random() % std::size(dns)];
+        record.line = static_cast<int>(&record - records.data()) + 1;
+        for (size_t count = random() % 5 + 1; count > 0; --count) {
+            record.modifications.push_back(random_modification(random));
+        }
+    }
+    return records;
+}
+
+}  // namespace
+
+TEST_F(update_test, ARecordThatFailsInTheMiddleIsLeftOutAsIfItHadNotBeenThere) {
+    std::mt19937 random(17);
+    folder.write("conf", unsorted);
+    options.is_dry_run = true;
+    size_t skipped = 0;
+    size_t changed = 0;
+    for (int i = 0; i < 300 && !HasFailure(); ++i) {
+        std::vector<change_record> records = random_records(random);
+        how.goes_on = true;
+        const update_result all = update(options, records, how);
+        for (const skipped_record& each : all.skipped) {
+            std::erase_if(records, [&](const auto& record) { return record.line == each.line; });
+        }
+        how.goes_on = false;
+        const update_result good = update(options, records, how);
+        EXPECT_EQ(all.after, good.after);
+        EXPECT_EQ(all.is_changed, good.is_changed);
+        skipped += all.skipped.size();
+        changed += good.is_changed ? 1 : 0;
+    }
+    EXPECT_GT(skipped, 1000u);
+    EXPECT_GT(changed, 100u);
+}
+
 TEST_F(update_test, NothingIsWrittenWhenAllRecordsAreLeftOut) {
     folder.write("conf", small);
     const identity before = file();
@@ -528,6 +610,20 @@ TEST_F(update_test, AFileThatDoesNotLoadIsNamedWithAHint) {
     EXPECT_THAT(message,
                 testing::EndsWith("\n  hint: `cfg32 check` tells everything that is wrong"));
     EXPECT_EQ(file(), before);
+}
+
+TEST_F(update_test, AFailureOfTheSystemWhileLoadingIsToldAsThat) {
+    folder.write("conf", small);
+    rlimit before{};
+    ASSERT_EQ(getrlimit(RLIMIT_NOFILE, &before), 0);
+    // Room for the private copy, but not to open it.
+    const auto next = static_cast<rlim_t>(unique_fd(dup(STDIN_FILENO)).get());
+    const rlimit one_more{next + 1, before.rlim_max};
+    ASSERT_EQ(setrlimit(RLIMIT_NOFILE, &one_more), 0);
+    const std::string message =
+        failure_of("dn: cn=b, cn=a, cn=Configuration\nchangetype: delete\n");
+    ASSERT_EQ(setrlimit(RLIMIT_NOFILE, &before), 0);
+    EXPECT_EQ(message, options.file + ": Too many open files [Connection error (91)]");
 }
 
 TEST_F(update_test, AMissingFileIsAConnectionError) {

@@ -9,6 +9,7 @@
 #include "LDIF_File.h"
 #include "cfg32.h"
 #include "handle.h"
+#include "message.h"
 #include "outcome.h"
 #include "terminal.h"
 
@@ -17,20 +18,15 @@ namespace cfg32::tool {
 namespace {
 
 using result_nodes = std::unique_ptr<CfgMessage, int (*)(CfgMessage*)>;
-using text_of_library = std::unique_ptr<char, void (*)(void*)>;
+const char* text_of(const CfgMessage& node) { return node.text ? node.text : ""; }
 
-entry entry_of(CfgHandle* handle, CfgMessage* node) {
-    const text_of_library dn(cfg_get_dn(handle, node), cfg_memfree);
-    entry read{dn ? dn.get() : "", {}};
-    CfgCursor* cursor = nullptr;
-    text_of_library name(cfg_first_attribute(handle, node, &cursor), cfg_memfree);
-    const std::unique_ptr<CfgCursor, void (*)(CfgCursor*)> owner(cursor, cfg_ber_free);
-    for (; name; name.reset(cfg_next_attribute(handle, node, cursor))) {
-        const std::unique_ptr<char*, void (*)(char**)> values(
-            cfg_get_values(handle, node, name.get()), cfg_value_free);
-        attribute& added = read.attributes.emplace_back(attribute{name.get(), {}});
-        for (char** value = values.get(); value && *value; ++value) {
-            added.values.emplace_back(*value);
+/// An entry of a result. The interface looks for each attribute's values from the first one on.
+entry entry_of(const CfgMessage& node) {
+    entry read{text_of(node), {}};
+    for (const CfgMessage* name = node.child; name; name = name->next) {
+        attribute& added = read.attributes.emplace_back(attribute{text_of(*name), {}});
+        for (const CfgMessage* value = name->child; value; value = value->next) {
+            added.values.emplace_back(text_of(*value));
         }
     }
     return read;
@@ -162,8 +158,8 @@ std::vector<entry> configuration::search(const std::string& base, int scope,
         fail(handle_.get(), code, name_);
     }
     std::vector<entry> entries;
-    for (CfgMessage* node = found; node; node = cfg_next_entry(handle_.get(), node)) {
-        entries.push_back(entry_of(handle_.get(), node));
+    for (const CfgMessage* node = found; node; node = node->next) {
+        entries.push_back(entry_of(*node));
     }
     return entries;
 }

@@ -2,8 +2,10 @@
 
 #include "json_text.h"
 
-#include <cstdio>
+#include <iomanip>
+#include <iostream>
 #include <nlohmann/json.hpp>
+#include <unordered_map>
 
 #include "configuration.h"
 #include "hidden_passwords.h"
@@ -14,9 +16,17 @@ namespace {
 
 json json_of(const entry& printed) {
     json attributes = json::object();
+    // Members are appended to the list that they are: to insert one looks through all.
+    auto& members = attributes.get_ref<json::object_t&>();
+    std::unordered_map<std::string, size_t> places;
     for (const attribute& each : printed.attributes) {
         // Names of which a part is hidden may look the same.
-        json& values = attributes.emplace(utf8(shown_line(each.name)), json::array()).first.value();
+        const auto [place, is_new] =
+            places.try_emplace(utf8(shown_line(each.name)), members.size());
+        if (is_new) {
+            members.emplace_back(place->first, json::array());
+        }
+        json& values = members.data()[place->second].second;
         for (const std::string& value : shown_values(each.name, each.values)) {
             values.push_back(utf8(value));
         }
@@ -34,10 +44,7 @@ json json_of(const std::vector<problem>& left_out) {
 
 }  // namespace
 
-void print_json(const json& value) {
-    const std::string text = value.dump(2) + "\n";
-    fwrite(text.data(), 1, text.size(), stdout);
-}
+void print_json(const json& value) { std::cout << std::setw(2) << value << "\n"; }
 
 void print_objects(json entries, const configuration& file) {
     print_json({{"file", utf8(file.name())},

@@ -6,11 +6,13 @@
 
 #include <algorithm>
 #include <iterator>
+#include <map>
 #include <optional>
 #include <span>
 #include <utility>
 
 #include "change/ldif_lines.h"
+#include "cisString.h"
 #include "hidden_passwords.h"
 
 namespace cfg32::tool {
@@ -73,6 +75,7 @@ void require_no_dn(const named_value& line) {
 
 /// The content of an added entry, one modification for each attribute.
 void read_content(line_span lines, change_record& record) {
+    std::map<cisString, size_t> places;
     for (const ldif_text_line& each : lines) {
         const named_value line = parse_line(each);
         require_no_dn(line);
@@ -84,14 +87,12 @@ void read_content(line_span lines, change_record& record) {
                 line.line,
                 fmt::format("\"{}:\" needs \"changetype: modify\" below \"dn:\"", line.name)};
         }
-        auto found = std::find_if(
-            record.modifications.begin(), record.modifications.end(),
-            [&](const modification& known) { return is_same_name(known.attribute, line.name); });
-        if (found == record.modifications.end()) {
+        const auto [place, is_new] =
+            places.try_emplace(cisString(line.name), record.modifications.size());
+        if (is_new) {
             record.modifications.push_back({modification::add, line.name, {}, line.line});
-            found = std::prev(record.modifications.end());
         }
-        add_value(*found, line);
+        add_value(record.modifications[place->second], line);
     }
 }
 

@@ -8,6 +8,7 @@
 
 #include "LDIF_File.h"
 #include "cfg32.h"
+#include "change/former_attributes.h"
 #include "failure.h"
 #include "outcome.h"
 #include "password.h"
@@ -38,9 +39,10 @@ int line_of(const change_record& record, const LDIF_Exception& e) {
     return line;
 }
 
-/// Runs body; what the library refuses is told with its line.
+/// Runs body; what the library refuses is told with its line. is_half_done: what body says of it.
 template <class Body>
-auto with_place(const record_source& source, const change_record& record, Body body) {
+auto with_place(const record_source& source, const change_record& record, Body body,
+                const bool& is_half_done = false) {
     try {
         return body();
     } catch (const LDIF_Exception& e) {
@@ -51,7 +53,7 @@ auto with_place(const record_source& source, const change_record& record, Body b
         }
         throw refused_record{
             report(placed, source.text.empty() ? source.configuration : source.text),
-            record.kind == change_record::modify && e.ldapErr != CFG_NO_SUCH_OBJECT};
+            is_half_done || e.sysErrno != 0};
     }
 }
 
@@ -178,19 +180,29 @@ bool is_needed(const LDIF_Entry& entry, const modification& change, bool may_be_
                     : !values.empty();
 }
 
-/// Carries out the modifications that are needed.
-bool modify(LDIF_File& file, const LDIF_DN& dn, const change_record& record, bool may_be_gone,
-            aes_key_data* key) {
+/// Carries out the modifications that are needed: all of them or, unless is_half_done is set, none.
+bool modify(LDIF_File& file, const LDIF_DN& dn, const change_record& record,
+            const update_options& how, aes_key_data* key, bool& is_half_done) {
     const LDIF_Entry* entry = file.root().find(dn);
     if (!entry) {
         raise(no_entry);
     }
+    // The tree is not constant; it is only not given away.
+    former_attributes former(const_cast<LDIF_Entry&>(*entry).attributes());
     bool is_changed = false;
-    for (const modification& change : record.modifications) {
-        if (is_needed(*entry, change, may_be_gone, key)) {
-            file.modify(dn, library_changes({&change, 1}).records());
-            is_changed = true;
+    try {
+        for (const modification& change : record.modifications) {
+            if (is_needed(*entry, change, how.may_be_gone, key)) {
+                if (how.goes_on) {
+                    former.keep(change, &change == &record.modifications.back());
+                }
+                file.modify(dn, library_changes({&change, 1}).records());
+                is_changed = true;
+            }
         }
+    } catch (const LDIF_Exception&) {
+        is_half_done = !how.goes_on || !former.put_back();
+        throw;
     }
     return is_changed;
 }
@@ -237,18 +249,20 @@ void check_record(const change_record& record, const record_source& source, aes_
 
 bool carry_out(LDIF_File& file, const change_record& record, const update_options& how,
                const record_source& source, aes_key_data* key) {
-    return with_place(source, record, [&] {
+    bool is_half_done = false;
+    const auto body = [&] {
         const LDIF_DN dn = dn_of(record);
         switch (record.kind) {
             case change_record::add:
                 return add(file, dn, record, how.merges, key);
             case change_record::modify:
-                return modify(file, dn, record, how.may_be_gone, key);
+                return modify(file, dn, record, how, key, is_half_done);
             case change_record::remove:
                 break;
         }
         return erase(file, dn, how.deletes_trees);
-    });
+    };
+    return with_place(source, record, body, is_half_done);
 }
 
 }  // namespace cfg32::tool

@@ -26,7 +26,8 @@ struct record_source {
 void check_record(const change_record& record, const record_source& source, aes_key_data* key);
 
 /// Carries the record out, except the parts that would change nothing. Returns whether anything
-/// changed. Throws refused_record; what came before the refused part is done then.
+/// changed. Throws refused_record; where the update goes on without the record, what came before
+/// the refused part is mostly undone then.
 bool carry_out(LDIF_File& file, const change_record& record, const update_options& how,
                const record_source& source, aes_key_data* key);
 

@@ -2,6 +2,7 @@
 
 #include "change/update.h"
 
+#include <cstring>
 #include <optional>
 
 #include "LDIF_File.h"
@@ -107,6 +108,9 @@ void updater::load() {
     try {
         trial_.emplace(result_.before, key_.get());
     } catch (const LDIF_Exception& e) {
+        if (e.sysErrno != 0) {  // there is nothing to be found in the file
+            fail(e.ldapErr, name() + ": " + strerror(e.sysErrno));
+        }
         const char* hint = result_.before.starts_with(unfinished_mark)
                                ? "`cfg32 restore` puts the backup back"
                                : "`cfg32 check` tells everything that is wrong";

@@ -58,16 +58,6 @@ std::string in_unicode(std::string_view line) {
     return text.append(line);
 }
 
-std::string lines_in_unicode(std::string_view drawing) {
-    std::string text;
-    while (!drawing.empty()) {
-        const size_t end = std::min(drawing.find('\n'), drawing.size() - 1) + 1;
-        text += in_unicode(drawing.substr(0, end));
-        drawing.remove_prefix(end);
-    }
-    return text;
-}
-
 /// A tree with an entry and everything below it, without attributes.
 LDIF_Entry tree_from(const LDIF_Entry& base) {
     LDIF_Entry tree;
@@ -97,9 +87,12 @@ void mark_base(std::string& drawing, const LDIF_Entry& base, missing_entries& mi
                     base.relative_size() > 1 ? " *" : "");
 }
 
-/// The drawing, and below it the DNs of the entries that are missing: what is marked with "*"
-/// hangs below them.
-std::string drawing_of(const LDIF_Entry& base, drawing_style style) {
+void print_text(std::string_view text) { fmt::print("{}", printable(shown_text(text))); }
+
+/// Prints the drawing, and below it the DNs of the entries that are missing: what is marked with
+/// "*" hangs below them. Of one entry there may be thousands, each almost as long as its DN, so
+/// they are never held together.
+void print_drawing(const LDIF_Entry& base, drawing_style style) {
     const LDIF_Entry tree = tree_from(base);
     missing_entries missing;
     const drawing_characters characters =
@@ -109,14 +102,16 @@ std::string drawing_of(const LDIF_Entry& base, drawing_style style) {
     if (!base.is_root() && base.depth() > 0) {
         mark_base(text, base, missing);
     }
-    if (style == unicode) {
-        text = lines_in_unicode(text);
+    for (std::string_view rest = text; !rest.empty();) {
+        const size_t end = std::min(rest.find('\n'), rest.size() - 1) + 1;
+        const std::string_view line = rest.substr(0, end);
+        print_text(style == unicode ? in_unicode(line) : std::string(line));
+        rest.remove_prefix(end);
     }
     if (!missing.empty()) {
-        text += "\n* the following entries are undefined:\n";
+        print_text("\n* the following entries are undefined:\n");
     }
-    missing.for_each([&](const std::string& dn) { text.append(dn).append("\n"); });
-    return text;
+    missing.for_each([](const std::string& dn) { print_text(dn + "\n"); });
 }
 
 void print_as_json(const configuration& file, const LDIF_Entry& base) {
@@ -146,7 +141,7 @@ int tree(const settings& options, const arguments& given) {
     if (options.is_json) {
         print_as_json(file, base);
     } else {
-        fmt::print("{}", printable(shown_text(drawing_of(base, given.style))));
+        print_drawing(base, given.style);
     }
     return done;
 }

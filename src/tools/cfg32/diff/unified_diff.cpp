@@ -46,32 +46,64 @@ bool begins_with_space(std::string_view line) {
 /// Comment lines and blank ones are not continued.
 bool may_be_continued(std::string_view line) { return line != "\n" && !line.starts_with('#'); }
 
-/// The line that this one continues, or itself.
-size_t first_of(const std::vector<std::string_view>& lines, size_t number) {
-    while (number > 0 && begins_with_space(lines[number]) && may_be_continued(lines[number - 1])) {
-        --number;
-    }
-    return number;
-}
+/// A longer line is not judged again with each line that continues it. Nobody writes such lines by
+/// hand, and a write joins them.
+constexpr size_t longest_judged = 1024;
 
-/// A line, without its newline, as people may see it. first is the line that it continues.
+/// A line, without its newline, as people may see it: hidden where that is not known. first is the
+/// line that it continues.
 std::string shown_continuation(std::string_view first, std::string_view line) {
-    const std::string_view added = line.substr(1);
-    const std::string joined = std::string(first.substr(0, first.find('\n'))).append(added);
-    return shown_line(joined) == joined ? std::string(line) : " " + std::string(hidden_text);
+    if (first.size() <= longest_judged) {
+        const std::string joined =
+            std::string(first.substr(0, first.find('\n'))).append(line.substr(1));
+        if (shown_line(joined) == joined) {
+            return std::string(line);
+        }
+    }
+    return " " + std::string(hidden_text);
 }
 
-std::string shown(const std::vector<std::string_view>& lines, size_t number) {
-    std::string_view line = lines[number];
+/// The lines of a text as people may see them, asked for from the front to the back.
+class visible_lines {
+  public:
+    explicit visible_lines(std::string_view text) : lines_(lines_of(text)) {}
+
+    const std::vector<std::string_view>& as_they_are() const { return lines_; }
+    size_t size() const { return lines_.size(); }
+    std::string at(size_t number);
+
+  private:
+    size_t first_of(size_t number);
+
+    std::vector<std::string_view> lines_;
+    size_t last_asked_ = 0;
+    size_t first_ = 0;  // of the one that was asked for last
+};
+
+/// The line that this one continues, or itself. A long one is not gone back over for each of its
+/// lines.
+size_t visible_lines::first_of(size_t number) {
+    size_t first = number;
+    while (first > 0 && first != last_asked_ && begins_with_space(lines_[first]) &&
+           may_be_continued(lines_[first - 1])) {
+        --first;
+    }
+    first_ = first == last_asked_ ? first_ : first;
+    last_asked_ = number;
+    return first_;
+}
+
+std::string visible_lines::at(size_t number) {
+    std::string_view line = lines_[number];
     const bool is_whole = line.ends_with('\n');
     line.remove_suffix(is_whole ? 1 : 0);
-    if (number > 0 && is_password_below(lines[number - 1], line)) {
+    if (number > 0 && is_password_below(lines_[number - 1], line)) {
         line = hidden_text;
     }
-    const size_t first = first_of(lines, number);
+    const size_t first = first_of(number);
     const size_t indent = std::min(line.find_first_not_of(" \t"), line.size());
     const std::string text =
-        first < number ? shown_continuation(lines[first], line)
+        first < number ? shown_continuation(lines_[first], line)
                        : std::string(line.substr(0, indent)) + shown_line(line.substr(indent));
     return printable(text) + (is_whole ? "\n" : "\n\\ No newline at end of file\n");
 }
@@ -79,7 +111,7 @@ std::string shown(const std::vector<std::string_view>& lines, size_t number) {
 class printer {
   public:
     printer(const std::string& before, const std::string& after, bool is_for_people)
-        : before_(lines_of(before)), after_(lines_of(after)), is_for_people_(is_for_people) {}
+        : before_(before), after_(after), is_for_people_(is_for_people) {}
 
     std::string run(const std::string& name);
 
@@ -91,15 +123,16 @@ class printer {
     void append_context(size_t from, size_t to);
     void append_difference(const difference& each);
 
-    std::vector<std::string_view> before_;
-    std::vector<std::string_view> after_;
+    visible_lines before_;
+    visible_lines after_;
     bool is_for_people_;
     std::string text_;
 };
 
 std::string printer::run(const std::string& name) {
     const std::vector<difference> all =
-        differences(matching_lines(before_, after_), {before_.size(), after_.size()});
+        differences(matching_lines(before_.as_they_are(), after_.as_they_are()),
+                    {before_.size(), after_.size()});
     if (all.empty()) {
         return {};
     }
@@ -147,16 +180,16 @@ void printer::append_hunk(position first, position last) {
 
 void printer::append_context(size_t from, size_t to) {
     for (; from < to; ++from) {
-        text_ += " " + shown(before_, from);
+        text_ += " " + before_.at(from);
     }
 }
 
 void printer::append_difference(const difference& each) {
     for (size_t i = each.begin.before; i < each.end.before; ++i) {
-        text_ += in_style(style::removed, "-" + shown(before_, i));
+        text_ += in_style(style::removed, "-" + before_.at(i));
     }
     for (size_t i = each.begin.after; i < each.end.after; ++i) {
-        text_ += in_style(style::added, "+" + shown(after_, i));
+        text_ += in_style(style::added, "+" + after_.at(i));
     }
 }
 
