@@ -192,24 +192,49 @@ TEST(LongContinuedLine, FourTimesAsLongIsDiffedForNoMoreThanItsShareOfMemory) {
     EXPECT_LT(share_of_diff(4000), share_of_diff(1000) * 2);
 }
 
-TEST(RecordsThatFailInTheMiddle, FourTimesAsManyAreLeftOutForNoMoreThanTheirShareOfMemory) {
+namespace {
+
+const std::string modified = "dn: cn=Configuration\nchangetype: modify\n";
+
+/// What records ask for that are carried out as far as they can be, by the byte of them.
+double share_of_records(const std::string& text, const std::string& records, int status) {
     const temporary_folder folder;
-    const auto share_of_records = [&](size_t count) {
-        const std::string subject = "dn: cn=Configuration\nchangetype: modify\nadd: list\nlist: ";
-        std::string records;
-        for (size_t i = 0; i < count; ++i) {
-            const std::string number = std::to_string(i);
-            records.append(subject).append(number).append("\n-\n\n");
-            records.append(subject).append("no " + number).append("\n-\ndelete: none\n-\n\n");
-        }
-        const std::string conf =
-            folder.write("conf", "dn: cn=Configuration\ncn: Configuration\n\n");
-        const std::string ldif = folder.write("ldif", records);
-        return share_of(records, [&] {
-            EXPECT_EQ(run_unseen({"cfg32", "-f", conf, "modify", "-c", "-l", ldif}), 3);
-        });
-    };
-    EXPECT_LT(share_of_records(400), share_of_records(100) * 2);
+    const std::string conf = folder.write("conf", text);
+    const std::string ldif = folder.write("ldif", records);
+    return share_of(records, [&] {
+        EXPECT_EQ(run_unseen({"cfg32", "-f", conf, "modify", "-c", "-l", ldif}), status);
+    });
+}
+
+double share_of_failing_records(size_t count) {
+    std::string records;
+    for (size_t i = 0; i < count; ++i) {
+        const std::string number = std::to_string(i);
+        records += modified + "add: list\nlist: " + number + "\n-\n\n";
+        records += modified + "add: list\nlist: no " + number + "\n-\ndelete: none\n-\n\n";
+    }
+    return share_of_records("dn: cn=Configuration\ncn: Configuration\n\n", records, 3);
+}
+
+double share_of_replacing_records(size_t count) {
+    std::string text = "dn: cn=Configuration\ncn: Configuration\n";
+    std::string records;
+    for (size_t i = 0; i < count; ++i) {
+        const std::string value = "list: " + std::to_string(i);
+        text += value + "\n";
+        records += modified + "delete: list\n" + value + "\n-\nadd: list\n" + value + "0\n-\n\n";
+    }
+    return share_of_records(text + "\n", records, 0);
+}
+
+}  // namespace
+
+TEST(ManyRecords, ThatFailInTheMiddleAskForNoMoreThanTheirShareOfMemory) {
+    EXPECT_LT(share_of_failing_records(400), share_of_failing_records(100) * 2);
+}
+
+TEST(ManyRecords, ThatReplaceValuesOfALongListAskForNoMoreThanTheirShareOfMemory) {
+    EXPECT_LT(share_of_replacing_records(2000), share_of_replacing_records(500) * 2);
 }
 
 // Together their DNs are hundreds of times as long as the file.
