@@ -80,8 +80,8 @@ int run_unseen(std::vector<std::string> words) {
 }
 
 const std::vector<std::vector<std::string>> readings = {
-    {"search"}, {"search", "--json"}, {"search", "cn=*"},  //
-    {"tree"},   {"tree", "--json"},   {"check"},          {"check", "--json"}};
+    {"search"}, {"search", "--json"}, {"search", "cn=*"}, {"tree"}, {"tree", "--json"},
+    {"check"},  {"check", "--json"}};
 
 const std::string head = "charset: UTF-8\nversion: 1\n\ndn: cn=Configuration\ncn: Configuration\n";
 
