@@ -80,7 +80,8 @@ TEST(SourceExcerpt, PutsTheMarkerBelowThePlace) {
 }
 
 TEST(SourceExcerpt, ShowsPlacesOfOneLineInAnyOrder) {
-    const file_text file(sixty + "\t" + sixty + "\n" + "cn: x\n");
+    const std::string text = sixty + "\t" + sixty + "\n" + "cn: x\n";
+    const file_text file(text);
     source_excerpts excerpts(file);
     for (const int column : {1, 61, 62, 121, 62, 30, 130}) {
         const source_excerpt shown = excerpts.of(problem_at(1, column, 2));

@@ -45,6 +45,10 @@ struct meant_line {
     size_t value = 0;  // where it begins
 };
 
+bool is_password(const meant_line& line) {
+    return line.what == meant_line::password || line.what == meant_line::known_password;
+}
+
 size_t behind_separators(std::string_view text, size_t begin) {
     const auto end =
         std::find_if_not(text.begin() + static_cast<ptrdiff_t>(begin), text.end(), is_separator);
@@ -231,6 +235,12 @@ class judged_line {
     std::vector<size_t> places_;
 };
 
+std::string shown(std::string_view line, const judged_line& judged) {
+    const auto begin = hidden_from(judged.text());
+    return begin ? std::string(line.substr(0, judged.place(*begin))).append(hidden_text)
+                 : without_any_password(std::string(line));
+}
+
 }  // namespace
 
 std::string shown_value(std::string_view attribute, std::string_view value) {
@@ -262,16 +272,18 @@ std::vector<std::string> shown_values(std::string_view attribute,
 }
 
 bool is_password_line(std::string_view line) {
-    const auto what = meant_in_line(judged_line(line).text()).what;
-    return what == meant_line::password || what == meant_line::known_password;
+    return is_password(meant_in_line(judged_line(line).text()));
 }
 
-std::string shown_line(std::string_view line) {
+bool hides_something(std::string_view line) {
     const judged_line judged(line);
-    const auto begin = hidden_from(judged.text());
-    return begin ? std::string(line.substr(0, judged.place(*begin))).append(hidden_text)
-                 : without_any_password(std::string(line));
+    const meant_line meant = meant_in_line(judged.text());
+    const bool is_other = meant.what == meant_line::other;
+    return is_password(meant) ||
+           (is_other ? without_any_password(std::string(line)) : shown(line, judged)) != line;
 }
+
+std::string shown_line(std::string_view line) { return shown(line, judged_line(line)); }
 
 bool is_password_below(std::string_view above, std::string_view line) {
     const std::string_view ended = above.substr(0, above.find_last_not_of(" \t\r\n") + 1);

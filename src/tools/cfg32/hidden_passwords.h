@@ -38,4 +38,7 @@ bool is_password_below(std::string_view above, std::string_view line);
 /// True when all that follows this line's name is a password.
 bool is_password_line(std::string_view line);
 
+/// True for such a line, and for one of which shown_line hides something.
+bool hides_something(std::string_view line);
+
 }  // namespace cfg32::tool

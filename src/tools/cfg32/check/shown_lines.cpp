@@ -21,14 +21,14 @@ bool shown_lines::is_hidden(int number) {
     if (beginning != beginning_ || number < number_) {
         number_ = beginning_ = beginning;
         joined_ = file_.line(beginning);
-        is_hidden_ = is_password_line(joined_) || shown_line(joined_) != joined_;
+        is_hidden_ = hides_something(joined_);
     }
     while (number_ < number) {
         ++number_;
         const bool is_judged = !is_hidden_ && joined_.size() < longest_judged;
         if (is_judged) {
             joined_ += file_.continuation(number_);
-            is_hidden_ = is_password_line(joined_) || shown_line(joined_) != joined_;
+            is_hidden_ = hides_something(joined_);
         }
     }
     return is_hidden_;
