@@ -156,7 +156,7 @@ const std::vector<large_file>& large_files() {
         {"EntriesOfOneName", 10'000, 100'000, same_entries, usual_subject, two, two_each_but_one,
          10},
         {"DeepTree", 300, 10'000, tree, deepest_dn, head_and_each, none, 5},
-        {"LateAncestors", 100, 1'000, late_ancestors, deepest_dn, head_and_two_each, none, 10},
+        {"LateAncestors", 100, 1'000, late_ancestors, deepest_dn, head_and_two_each, none, 14},
         {"WideName", 10'000, 10'000, wide_rdn, wide_dn, two, one, 48},
     };
     return all;
