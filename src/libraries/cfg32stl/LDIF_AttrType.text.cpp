@@ -3,7 +3,6 @@
 #include <algorithm>
 #include <cstdlib>
 #include <cstring>
-#include <functional>
 
 #include "LDIF_AttrType.h"
 #include "LDIF_AttrType.syntax.h"

@@ -107,22 +107,27 @@ std::string cfg32::tree_drawing(drawing_characters characters, const LDIF_Entry&
     return drawing(is_ascii ? plain : code_page_437, missing, prefix).of(top, is_last);
 }
 
-std::string IA5_TreeView(const LDIF_Entry& entry, std::set<LDIF_DN>& undefined,
-                         const std::string& prefix) {
+namespace {
+
+/// The same, with what is missing in a set of the caller's.
+std::string drawn(drawing_characters characters, const LDIF_Entry& entry, bool is_last,
+                  std::set<LDIF_DN>& undefined, const std::string& prefix) {
     missing_entries missing;
-    std::string text =
-        cfg32::tree_drawing(drawing_characters::ascii, entry, false, missing, prefix);
+    std::string text = cfg32::tree_drawing(characters, entry, is_last, missing, prefix);
     missing.copy_to(undefined);
     return text;
 }
 
+}  // namespace
+
+std::string IA5_TreeView(const LDIF_Entry& entry, std::set<LDIF_DN>& undefined,
+                         const std::string& prefix) {
+    return drawn(drawing_characters::ascii, entry, false, undefined, prefix);
+}
+
 std::string OEM_TreeView(const LDIF_Entry& entry, bool last, std::set<LDIF_DN>& undefined,
                          const std::string& prefix) {
-    missing_entries missing;
-    std::string text =
-        cfg32::tree_drawing(drawing_characters::code_page_437, entry, last, missing, prefix);
-    missing.copy_to(undefined);
-    return text;
+    return drawn(drawing_characters::code_page_437, entry, last, undefined, prefix);
 }
 
 std::string LDIF_File::treeView(bool oem) const {
